@@ -1,0 +1,47 @@
+# SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+# SPDX-License-Identifier: LGPL-2.1-or-later
+
+# Options, language level and compiler flags that every target shares.
+
+string(COMPARE EQUAL "${CMAKE_SOURCE_DIR}" "${PROJECT_SOURCE_DIR}" VEYFM_TOP_LEVEL)
+
+option(VEYFM_BUILD_TESTS "Build the tests" ${VEYFM_TOP_LEVEL})
+option(VEYFM_BUILD_TOOLS "Build the command-line tool" ${VEYFM_TOP_LEVEL})
+option(VEYFM_BUILD_DAEMON "Build the file manager service" ${VEYFM_TOP_LEVEL})
+option(VEYFM_BUILD_BENCHMARKS "Build the benchmarks" ${VEYFM_TOP_LEVEL})
+option(VEYFM_SYSTEM_PLATFORM "Link the system's veycore and veysu instead of the stand-ins" OFF)
+option(VEYFM_WERROR "Treat compiler warnings as errors" OFF)
+set(VEYFM_SANITIZE "" CACHE STRING "Sanitizers: empty, 'address,undefined' or 'thread'")
+set_property(CACHE VEYFM_SANITIZE PROPERTY STRINGS "" "address,undefined" "thread")
+
+if(VEYFM_TOP_LEVEL AND NOT CMAKE_BUILD_TYPE AND NOT CMAKE_CONFIGURATION_TYPES)
+    set(CMAKE_BUILD_TYPE RelWithDebInfo CACHE STRING "Type of build" FORCE)
+endif()
+
+set(CMAKE_CXX_STANDARD 17)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_AUTOMOC ON)
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+
+add_compile_options(-Wall -Wextra -Wpedantic)
+add_compile_definitions(
+    QT_NO_CAST_FROM_ASCII
+    QT_NO_CAST_TO_ASCII
+    QT_NO_URL_CAST_FROM_STRING
+    QT_NO_FOREACH
+    QT_DEPRECATED_WARNINGS
+)
+if(VEYFM_WERROR)
+    add_compile_options(-Werror)
+endif()
+if(VEYFM_SANITIZE)
+    add_compile_options(-fsanitize=${VEYFM_SANITIZE} -fno-omit-frame-pointer)
+    add_link_options(-fsanitize=${VEYFM_SANITIZE})
+    if(VEYFM_SANITIZE MATCHES undefined)
+        add_compile_options(-fno-sanitize-recover=undefined)
+    endif()
+endif()

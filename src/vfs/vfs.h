@@ -1,0 +1,251 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_VFS_H
+#define VEYFM_VFS_H
+
+#include "core/entrylist.h"
+#include "veyfmvfs_export.h"
+
+#include <QObject>
+#include <QUrl>
+
+#include <memory>
+
+namespace VeyFM {
+
+class EntryWatcher;
+class VFSPlaceBase;
+class VFSPrivate;
+class VFSSettings;
+
+/**
+ * The virtual file system: one object per process, reached through ptr().
+ *
+ * It holds a tree of named places (Computer, Home, Trash, Desktop, File System, Favourites,
+ * Storage devices, Network) laid over the local disk, turns paths and URLs into Entry values,
+ * lists and walks, and tells of changes through entryWatcher().
+ *
+ * A host does three things, in this order:
+ * 1. create its QCoreApplication;
+ * 2. call initialize(), so that the translator is there when places get their names;
+ * 3. call ptr() from its main thread. The object, its signals and its watches belong to that
+ *    thread.
+ *
+ * The object goes away at process exit, after main() has returned.
+ *
+ * Nothing here throws. What means nothing yields a null Entry, false, or an empty text or list.
+ *
+ * Threads: resolution and navigation may run in any thread. From a thread other than that of the
+ * object a place that is filled on first need is filled later, and the caller sees it empty.
+ */
+class VEYFMVFS_EXPORT VFS : public QObject
+{
+    Q_OBJECT
+
+public:
+    /// What childs() leaves out or adds.
+    enum EntryChildFilter {
+        SkipSymLinks = 1,     ///< Leave out the symbolic links of the directory.
+        WithExtraChildren = 2 ///< Add the extra children of the entry. There never are any.
+    };
+    Q_DECLARE_FLAGS(EntryChildFilters, EntryChildFilter)
+
+    /**
+     * Installs the translator and registers the meta types. Any call but the first does nothing.
+     * To be called from one thread, behind the QCoreApplication and before ptr().
+     */
+    static void initialize();
+
+    /// The one object; the first call constructs it, and may block on the session bus.
+    static VFS* ptr();
+
+    ~VFS() override;
+
+    /// The settings, the watcher and the tree, owned by this object. @{
+    VFSSettings* settings();
+    const VFSSettings* settings() const;
+    EntryWatcher* entryWatcher();
+    VFSPlaceBase* placeBase();
+    const VFSPlaceBase* placeBase() const;
+    /// @}
+
+    /**
+     * The fixed entries, as they were made at start-up. Their paths are translated words, but
+     * for the root's, which is "_". The network ones are null where the network is switched
+     * off. The documents entry is an ordinary directory and no place. @{
+     */
+    Entry rootEntry() const;
+    Entry favouritesEntry() const;
+    Entry desktopEntry() const;
+    Entry computerEntry() const;
+    Entry trashEntry() const;
+    Entry homeEntry() const;
+    Entry fileSystemEntry() const;
+    Entry documentsEntry() const;
+    Entry placesEntry() const;
+    Entry networkEntry() const;
+    Entry sambaNetworkEntry() const;
+    Entry ftpNetworkEntry() const;
+    Entry sftpNetworkEntry() const;
+    Entry storageDevicesEntry() const;
+    /// @}
+
+    /**
+     * Any text to an entry: a path through places, a local path (absolute, or relative to the
+     * working directory), a "file" or "vey-fm" URL, or a URL that is only carried ("mailto",
+     * "http", "qthelp", "ftp", "sftp"). Null when the text means nothing.
+     *
+     * An entry that does not exist is not null; see isEntryExists(). A relative name with a
+     * colon behind a valid scheme word, such as "notes:old", is a URL and not a file, and a place
+     * wins over a file of its name in the working directory.
+     */
+    Entry entry(const QString& path) const;
+
+    /**
+     * Drops `.`, `..`, doubled slashes and place sections that only lead to the next place.
+     * Stepping up from a top-level directory leaves the notation of the file system:
+     * `/usr/../etc` becomes "File System/etc".
+     */
+    QString normalizePath(const QString& path) const;
+
+    /// entry(path).localPath().
+    QString localPath(const QString& path) const;
+
+    /// Computes the local path of an entry; empty for URLs and purely virtual places.
+    QString localPath(const Entry& entry) const;
+
+    /**
+     * The place children of an entry in the order of the tree, then the content of its directory
+     * in the order of the disk. Kinds come from the directory record: nothing but links is
+     * examined. A name that is not valid in the local encoding is left out unless it is a link.
+     *
+     * A place that is filled on first need is filled here, which may take long and block on the
+     * service. A listing that stopGettingChilds() cancelled is empty.
+     */
+    EntryList childs(const Entry& entry, EntryChildFilters filter = {}) const;
+
+    /**
+     * Cancels one listing: the running one that gets to a directory record first, or the next
+     * one. From any thread.
+     */
+    void stopGettingChilds();
+
+    /// Whether an entry has children, by the cheapest test: an empty directory that can be read
+    /// says yes, and so does a place that was never opened.
+    bool hasChilds(const Entry& entry) const;
+
+    /// Whether at least one child would be a place or a directory. Links do not count.
+    bool containsDirsOrPlaces(const Entry& entry) const;
+
+    /// Whether an entry exists: a place that is in the tree, something on the disk, or a
+    /// "mailto:" or "vey-fm:" text. Other URLs do not exist.
+    bool isEntryExists(const Entry& entry) const;
+
+    /// The child called @p name, whether it exists or not; null where there can't be one.
+    Entry child(const Entry& entry, const QString& name) const;
+
+    /**
+     * The parent of an entry as seen from @p root: a place may hang below several, and the first
+     * in level order counts. Null for a place that is not below @p root.
+     */
+    Entry parent(const Entry& entry, const Entry& root) const;
+    /// parent() as seen from rootEntry().
+    Entry parent(const Entry& entry) const;
+    /// Whether parent() is not null.
+    bool hasParent(const Entry& entry) const;
+
+    /// The chain of parents from the top down, the entry itself at its end.
+    EntryList pathEntryList(const Entry& entry, const Entry& root) const;
+    /// pathEntryList() from rootEntry().
+    EntryList pathEntryList(const Entry& entry) const;
+
+    /// The place paths that lead to File System: Computer from rootEntry(), none otherwise.
+    QStringList fileSystemEntryPathList(const Entry& root) const;
+
+    /// The chain of place paths that leads from @p root to @p path.
+    QStringList exploreParentPlacesHistory(const QString& path, const Entry& root) const;
+    /// exploreParentPlacesHistory() from rootEntry().
+    QStringList exploreParentPlacesHistory(const QString& path) const;
+
+    /// The entry of a link's target, below the same place as the link where it lies there.
+    Entry symLinkTargetEntry(const Entry& entry) const;
+
+    /// The same object as seen through the deepest place whose directory holds it.
+    Entry placeRelatedEntry(const Entry& entry) const;
+
+    /// Whether the entry is, or lies below, a place other than File System and Computer. The
+    /// root place counts.
+    bool isPlaceRelativeEntry(const Entry& entry) const;
+
+    /// Whether the entry is, or lies below, a storage place.
+    bool isStoragePlaceRelativeEntry(const Entry& entry) const;
+    /// Whether any of @p entries isStoragePlaceRelativeEntry().
+    bool hasStoragePlaceRelativeEntries(const EntryList& entries) const;
+
+    /**
+     * Whether the path begins with that of a network place, as plain text. With the network
+     * switched off those paths are empty, and every entry counts.
+     */
+    bool isEntryInNetwork(const Entry& entry) const;
+    /// Whether any of @p entries isEntryInNetwork().
+    bool hasNetworkRelativeEntries(const EntryList& entries) const;
+
+    /// False: archives can't be browsed.
+    bool isSupportedFileArchive(const Entry& entry) const;
+
+    /// The network URL of an entry below the network places, or empty.
+    QString getUrlForEntry(const Entry& entry) const;
+
+    /**
+     * URLs of entries: "file" where there is a local path, with the links in its directories
+     * resolved down to the desktop, "vey-fm" where there is none. An entry whose directory no
+     * longer exists is dropped.
+     */
+    QList<QUrl> urlsFromEntries(const EntryList& entries) const;
+
+    /// One entry for each URL, null where the URL means nothing.
+    EntryList entriesFromUrls(const QList<QUrl>& urls) const;
+
+    /**
+     * The share place of an "ftp" or "sftp" URL that is mounted on @p localPath, named after its
+     * user and host. It is not put into the tree. Null for any other scheme.
+     */
+    Entry createEntryForUrl(const QString& url, const QString& localPath) const;
+
+    /// The place of a Samba share, or null. Note the order of the arguments.
+    Entry smbShareEntry(const QString& share, const QString& host, const QString& workgroup) const;
+
+    /// The host section of an entry below Samba, or empty.
+    QString smbHost(const Entry& entry) const;
+    /// The workgroup section of an entry below Samba, or empty.
+    QString smbWorkgroup(const Entry& entry) const;
+
+    /// EntryWatcher::entryReset() for these entries, in this process. @{
+    void notifyWatchers(const Entry& entry);
+    void notifyWatchers(const EntryList& entries);
+    /// @}
+
+    /// notifyWatchers() that, without @p anyWay, passes over entries nobody watches.
+    void directNotifyWatchers(const EntryList& entries, bool anyWay);
+
+Q_SIGNALS:
+    /// Brackets the blocking fill of a place on first need. The end may fail to come when the
+    /// place went away meanwhile. @{
+    void longTimeOperationStarted();
+    void longTimeOperationFinished();
+    /// @}
+
+private:
+    VFS();
+
+    Q_DISABLE_COPY(VFS)
+    Q_DECLARE_PRIVATE(VFS)
+    std::unique_ptr<VFSPrivate> const d_ptr;
+};
+
+Q_DECLARE_OPERATORS_FOR_FLAGS(VFS::EntryChildFilters)
+
+} // namespace VeyFM
+
+#endif
