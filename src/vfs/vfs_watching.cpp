@@ -1,0 +1,53 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "vfs/vfs_p.h"
+
+namespace VeyFM {
+
+void VFS::notifyWatchers(const Entry& entry)
+{
+    directNotifyWatchers(EntryList(entry), true);
+}
+
+void VFS::notifyWatchers(const EntryList& entries)
+{
+    directNotifyWatchers(entries, true);
+}
+
+void VFS::directNotifyWatchers(const EntryList& entries, bool anyWay)
+{
+    Q_D(VFS);
+    for (const Entry& entry : entries) {
+        d->entryWatcher.entryChangedNotify(entry, anyWay);
+    }
+}
+
+bool VFSPrivate::addEntryToPlace(const Entry& entry, const Entry& place, bool notify)
+{
+    const bool linked = placeBase.addEntryToPlace(entry, place);
+    if (linked && notify) {
+        entryWatcher.notifyEntryCreated(entry);
+    }
+    return linked;
+}
+
+EntryList VFSPrivate::addEntriesToPlace(const EntryList& entries, const Entry& place, bool notify)
+{
+    const EntryList linked = placeBase.addEntriesToPlace(entries, place);
+    if (notify) {
+        for (const Entry& entry : linked) {
+            entryWatcher.notifyEntryCreated(entry);
+        }
+    }
+    return linked;
+}
+
+void VFSPrivate::destroyPlace(const Entry& place)
+{
+    if (placeBase.destroyPlace(place)) {
+        entryWatcher.notifyEntryDeleted(place);
+    }
+}
+
+} // namespace VeyFM
