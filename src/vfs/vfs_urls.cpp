@@ -52,7 +52,8 @@ QString VFS::getUrlForEntry(const Entry& entry) const
     // Tests of text, in this order.
     const QString path = entry.m_path;
     if (path.startsWith(d->networkEntry.m_path)) {
-        return d->bookmarkUrl(path.mid(d->networkEntry.m_path.size() + 1));
+        // A bookmark's URL stands in its record, and there is no source of records yet.
+        return QString();
     }
     if (path.startsWith(d->ftpNetworkEntry.m_path)) {
         return QLatin1String("ftp:/") + path.mid(d->ftpNetworkEntry.m_path.size());
