@@ -1,0 +1,150 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+// From paths to places: searches that walk the store.
+
+#include "vfs/vfsplacebase.h"
+#include "vfs/vfsplacebase_p.h"
+
+#include <QSet>
+
+namespace VeyFM {
+
+namespace {
+
+const QLatin1Char slash('/');
+
+using Node = VFSPlaceBasePrivate::Node;
+using PlaceLocker = std::lock_guard<std::recursive_mutex>;
+
+QStringView withoutTrailingSlashes(QStringView path)
+{
+    while (path.endsWith(slash)) {
+        path.chop(1);
+    }
+    return path;
+}
+
+} // namespace
+
+Entry VFSPlaceBase::checkAndGetParentPlace(const Entry& entry, const Entry& root) const
+{
+    const PlaceLocker locker(d->placeLock);
+    const Node top = d->node(root);
+    if (!top) {
+        return Entry();
+    }
+    // Level by level, earlier siblings first. A node hangs below several others, and is looked at
+    // once.
+    QList<VFSPlaceBasePrivate::PlaceTreeNode*> queue{top.data()};
+    QSet<const VFSPlaceBasePrivate::PlaceTreeNode*> queued{top.data()};
+    for (int i = 0; i < queue.size(); ++i) {
+        for (const Node& child : qAsConst(queue.at(i)->children)) {
+            if (child->entry == entry) {
+                return queue.at(i)->entry;
+            }
+            if (!child->children.isEmpty() && !queued.contains(child.data())) {
+                queued.insert(child.data());
+                queue.append(child.data());
+            }
+        }
+    }
+    return Entry();
+}
+
+Entry VFSPlaceBase::dirPlaceEntry(const QString& localPath) const
+{
+    const PlaceLocker locker(d->placeLock);
+    for (const auto& [path, node] : d->placeNodes) {
+        if (node->entry.m_localPath == localPath) {
+            return node->entry;
+        }
+    }
+    return Entry();
+}
+
+Entry VFSPlaceBase::checkAndGetDirPlace(const QString& localPath) const
+{
+    return dirPlaceEntry(localPath);
+}
+
+QString VFSPlaceBase::placeRelatedPath(const QString& localPath) const
+{
+    const PlaceLocker locker(d->placeLock);
+    const QStringView path = withoutTrailingSlashes(localPath);
+    const Entry* best = nullptr;
+    QStringView rest;
+    for (const auto& [placePath, node] : d->placeNodes) {
+        const QStringView local = withoutTrailingSlashes(node->entry.m_localPath);
+        // The length of the best is taken as stored. So a place without a directory never
+        // matches, nor does one whose directory is "/".
+        if ((best ? best->m_localPath.size() : 0) >= local.size()) {
+            continue;
+        }
+        if (path.startsWith(local) && (path.size() == local.size() || path[local.size()] == slash)) {
+            best = &node->entry;
+            rest = path.mid(std::min(local.size() + 1, path.size()));
+        }
+    }
+    if (!best || best->m_path.isEmpty()) {
+        return localPath;
+    }
+    QString result = best->m_path;
+    if (!result.endsWith(slash)) {
+        result += slash;
+    }
+    return result.append(rest.data(), int(rest.size()));
+}
+
+bool VFSPlaceBase::isPathContainsPlace(const QString& path) const
+{
+    if (path.startsWith(slash)) {
+        return false;
+    }
+    const PlaceLocker locker(d->placeLock);
+    const int end = path.indexOf(slash);
+    const QStringView first = end < 0 ? QStringView(path) : QStringView(path).left(end);
+    return d->placeNodes.find(first) != d->placeNodes.end();
+}
+
+QStringList
+VFSPlaceBase::exploreParentPlacesHistory(const QString& path, const QString& placePath) const
+{
+    const PlaceLocker locker(d->placeLock);
+    const Node node = d->node(placePath);
+    return node ? d->parentPlacesHistory(path, *node) : QStringList();
+}
+
+QStringList
+VFSPlaceBasePrivate::parentPlacesHistory(QString path, const PlaceTreeNode& node) const
+{
+    QStringList history;
+    for (const Node& child : node.children) {
+        const QString childPath = child->entry.path();
+        // Plain text, not sections: "Home" also leads to "Homework/x". That is meant.
+        if (path.startsWith(childPath)) {
+            history.append(node.entry.path());
+            path.remove(0, childPath.size());
+            int slashes = 0;
+            while (slashes < path.size() && path[slashes] == slash) {
+                ++slashes;
+            }
+            path.remove(0, slashes);
+            if (path.isEmpty()) {
+                return history;
+            }
+            const QStringList deeper = parentPlacesHistory(path, *child);
+            history += deeper.isEmpty() ? QStringList(childPath) : deeper;
+            return history;
+        }
+        const QStringList deeper = parentPlacesHistory(path, *child);
+        if (!deeper.isEmpty()) {
+            history.append(node.entry.path());
+            history += deeper;
+            return history;
+        }
+    }
+    return history;
+}
+
+} // namespace VeyFM
