@@ -9,15 +9,17 @@
 #include <QDBusPendingCallWatcher>
 #include <QDBusServer>
 #include <QDBusVirtualObject>
-#include <QTemporaryDir>
-#include <QtTest>
+#include <QSignalSpy>
+#include <QUuid>
 
 /// Two ends of a D-Bus connection without a bus: what is sent comes back as it was on the wire.
 class DBusWire : public QDBusVirtualObject
 {
 public:
     DBusWire()
-        : m_server(QLatin1String("unix:tmpdir=") + m_dir.path())
+        // No file: Qt closes the server in a thread of its own, at a time nobody can wait for.
+        : m_server(
+              QLatin1String("unix:abstract=veyfm-") + QUuid::createUuid().toString(QUuid::Id128))
         , m_client(QDBusConnection::connectToPeer(m_server.address(), QStringLiteral("wire")))
     {
         connect(&m_server, &QDBusServer::newConnection, this, [this](QDBusConnection connection) {
@@ -45,7 +47,8 @@ public:
             QStringLiteral("echo"));
         message.setArguments(arguments);
         QDBusPendingCallWatcher watcher(m_client.asyncCall(message));
-        if (!QTest::qWaitFor([&] { return watcher.isFinished(); }, 20000)) {
+        QSignalSpy finished(&watcher, &QDBusPendingCallWatcher::finished);
+        if (!watcher.isFinished() && !finished.wait(20000)) {
             return QDBusMessage::createError(QDBusError::NoReply, QStringLiteral("no reply"));
         }
         return watcher.reply();
@@ -75,7 +78,6 @@ public:
     }
 
 private:
-    QTemporaryDir m_dir;
     QDBusServer m_server;
     QDBusConnection m_client;
     QString m_serverName;
