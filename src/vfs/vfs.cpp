@@ -39,10 +39,15 @@ VFS::VFS()
     , d_ptr(new VFSPrivate(this))
 {
     Q_D(VFS);
+    d->initService();
     d->initialize();
 }
 
-VFS::~VFS() = default;
+VFS::~VFS()
+{
+    Q_D(VFS);
+    d->releaseService();
+}
 
 VFSSettings* VFS::settings()
 {
@@ -67,6 +72,26 @@ VFSPlaceBase* VFS::placeBase()
 const VFSPlaceBase* VFS::placeBase() const
 {
     return &d_func()->placeBase;
+}
+
+SmbBrowserProxy* VFS::smbBrowser()
+{
+    return d_func()->smbBrowser.get();
+}
+
+NetworkMountsManagerProxy* VFS::networkMountsManager()
+{
+    return d_func()->networkMountsManager.get();
+}
+
+NetworkPlacesManagerProxy* VFS::networkPlacesManager()
+{
+    return d_func()->networkPlacesManager.get();
+}
+
+FuseMountsManagerProxy* VFS::fuseMountsManager()
+{
+    return d_func()->fuseMountsManager.get();
 }
 
 Entry VFS::rootEntry() const
@@ -140,3 +165,5 @@ Entry VFS::storageDevicesEntry() const
 }
 
 } // namespace VeyFM
+
+#include "moc_vfs.cpp"

@@ -5,6 +5,11 @@
 #define VEYFM_VFS_H
 
 #include "core/entrylist.h"
+#include "core/favouriteplace.h"
+#include "core/networkplace.h"
+#include "core/storagedeviceinfo.h"
+#include "core/storageplace.h"
+#include "core/stringmap.h"
 #include "veyfmvfs_export.h"
 
 #include <QObject>
@@ -15,6 +20,11 @@
 namespace VeyFM {
 
 class EntryWatcher;
+class FuseMountsManagerProxy;
+class Job;
+class NetworkMountsManagerProxy;
+class NetworkPlacesManagerProxy;
+class SmbBrowserProxy;
 class VFSPlaceBase;
 class VFSPrivate;
 class VFSSettings;
@@ -33,6 +43,11 @@ class VFSSettings;
  *    thread.
  *
  * The object goes away at process exit, after main() has returned.
+ *
+ * What all processes of a user share (devices, bookmarks, the Samba network, mounts) comes from
+ * the file manager service on the session bus. It is looked for once, by the first ptr(), and
+ * started if it can be. Where there is none, two lines of the log say so and the tree shows its
+ * built-in places.
  *
  * Nothing here throws. What means nothing yields a null Entry, false, or an empty text or list.
  *
@@ -62,12 +77,20 @@ public:
 
     ~VFS() override;
 
-    /// The settings, the watcher and the tree, owned by this object. @{
+    /**
+     * The settings, the watcher, the tree and the clients of the service, owned by this object.
+     * The clients are there without a service too, and then have nothing to tell.
+     * @{
+     */
     VFSSettings* settings();
     const VFSSettings* settings() const;
     EntryWatcher* entryWatcher();
     VFSPlaceBase* placeBase();
     const VFSPlaceBase* placeBase() const;
+    SmbBrowserProxy* smbBrowser();
+    NetworkMountsManagerProxy* networkMountsManager();
+    NetworkPlacesManagerProxy* networkPlacesManager();
+    FuseMountsManagerProxy* fuseMountsManager();
     /// @}
 
     /**
@@ -229,7 +252,71 @@ public:
     /// notifyWatchers() that, without @p anyWay, passes over entries nobody watches.
     void directNotifyWatchers(const EntryList& entries, bool anyWay);
 
+    /**
+     * notifyWatchers() in every process of the session, this one included, by way of the
+     * service: it has no effect yet when this returns. Without the service it has none at all.
+     */
+    void notifyAllWatchers(const EntryList& entries);
+
+    /// The device of a storage place, or a record that is not valid.
+    StoragePlace storagePlace(const Entry& entry) const;
+    /// The current state of a record that was held for a while, or one that is not valid.
+    StoragePlace freshStoragePlace(const StoragePlace& place) const;
+    /// All devices of one type.
+    QList<StoragePlace> storagePlacesByType(StoragePlace::Type type) const;
+    /// The details of a device, asked of the service; a default record where there are none.
+    StorageDeviceInfo storageDeviceInfo(const StoragePlace& place) const;
+
+    /**
+     * A job that asks the service to do something with the device of a storage place. It is
+     * returned unstarted, deletes itself when it has finished, and is a child of this object.
+     * @{
+     */
+    Job* mount(const Entry& entry);
+    Job* unmount(const Entry& entry);
+    Job* eject(const Entry& entry);
+    /// @}
+
+    /// The network bookmark of an entry, or a null record.
+    NetworkPlace networkPlace(const Entry& entry) const;
+
+    /// The favourite that points at the directory of an entry, be it a place or not; a record
+    /// with no local path where there is none.
+    FavouritePlace favouritePlace(const Entry& entry) const;
+    /// Where a favourite hangs in the tree.
+    QString favouritePlacePath(const FavouritePlace& place) const;
+    /// Whether the directory of @p place has a favourite, under whatever name.
+    bool hasFavouritePlace(const FavouritePlace& place) const;
+
+    /// Asks the service for a change. The tree follows when the service's news arrive. @{
+    void addFavouritePlace(const FavouritePlace& place);
+    void removeFavouritePlace(const FavouritePlace& place);
+    /// @}
+
 Q_SIGNALS:
+    /**
+     * A device was mounted or unmounted, can now be mounted or no longer, or went away. These run
+     * before the tree follows: a receiver sees the place as it was.
+     * @{
+     */
+    void storagePlaceMountStateChanged(StoragePlace storagePlace);
+    void storagePlaceMountabilityChanged(StoragePlace storagePlace);
+    void storagePlaceRemoved(StoragePlace storagePlace);
+    /// @}
+
+    /// The local path of a share or a bookmark changed. The entry that comes along still has the
+    /// old one: read it again by its path. @{
+    void smbShareUpdated(Entry entry);
+    void networkPlaceUpdated(Entry entry);
+    /// @}
+
+    /// The service told of a bookmark. The entry is null where a place of that name was there
+    /// already.
+    void networkPlaceAdded(NetworkPlace networkPlace, Entry entry);
+
+    /// A process of the session has mounted a URL. The entry is null where that makes no place.
+    void fuseMountAdded(QString url, Entry entry);
+
     /// Brackets the blocking fill of a place on first need. The end may fail to come when the
     /// place went away meanwhile. @{
     void longTimeOperationStarted();
@@ -242,6 +329,29 @@ private:
     Q_DISABLE_COPY(VFS)
     Q_DECLARE_PRIVATE(VFS)
     std::unique_ptr<VFSPrivate> const d_ptr;
+
+    // Fill a place on first need.
+    Q_PRIVATE_SLOT(d_func(), void _q_createStoragePlaces(QString))
+    Q_PRIVATE_SLOT(d_func(), void _q_createSambaWorkgroups(QString))
+    Q_PRIVATE_SLOT(d_func(), void _q_createSambaHosts(QString))
+    Q_PRIVATE_SLOT(d_func(), void _q_createSambaShares(QString))
+
+    // News of the service.
+    Q_PRIVATE_SLOT(d_func(), void _q_serviceNotifyWatchers(VeyFM::EntryList))
+    Q_PRIVATE_SLOT(d_func(), void _q_serviceStoragePlaceAdded(VeyFM::StoragePlace))
+    Q_PRIVATE_SLOT(d_func(), void _q_serviceStoragePlaceRemoved(VeyFM::StoragePlace))
+    Q_PRIVATE_SLOT(
+        d_func(), void _q_serviceStoragePlaceUpdated(VeyFM::StoragePlace, VeyFM::StoragePlace))
+    Q_PRIVATE_SLOT(d_func(), void _q_favouritePlaceAdded(VeyFM::FavouritePlace))
+    Q_PRIVATE_SLOT(d_func(), void _q_favouritePlaceRemoved(VeyFM::FavouritePlace))
+    Q_PRIVATE_SLOT(d_func(), void _q_networkPlaceAdded(VeyFM::NetworkPlace))
+    Q_PRIVATE_SLOT(d_func(), void _q_networkPlaceRemoved(VeyFM::NetworkPlace))
+    Q_PRIVATE_SLOT(d_func(), void _q_networkPlaceUpdated(VeyFM::NetworkPlace))
+    Q_PRIVATE_SLOT(d_func(), void _q_fuseMountAdded(QString, VeyFM::Entry))
+    Q_PRIVATE_SLOT(d_func(), void _q_smbWorkgroupsChanged(QStringList, QStringList))
+    Q_PRIVATE_SLOT(d_func(), void _q_smbWorkgroupUpdated(QString, QStringList, QStringList))
+    Q_PRIVATE_SLOT(d_func(), void _q_smbHostUpdated(QString, QString, StringMap, StringMap))
+    Q_PRIVATE_SLOT(d_func(), void _q_smbShareUpdated(QString, QString, QString, QString))
 };
 
 Q_DECLARE_OPERATORS_FOR_FLAGS(VFS::EntryChildFilters)

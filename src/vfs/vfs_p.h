@@ -5,21 +5,33 @@
 #define VEYFM_VFS_P_H
 
 #include "core/entrylist.h"
+#include "service/favouriteplacesmanagerproxy.h"
+#include "service/fusemountsmanagerproxy.h"
+#include "service/networkmountsmanagerproxy.h"
+#include "service/networkplacesmanagerproxy.h"
+#include "service/smbbrowserproxy.h"
+#include "service/storageplacesmanagerproxy.h"
 #include "vfs/vfs.h"
 #include "vfs/vfsplacebase.h"
 #include "vfs/vfssettings.h"
 #include "watch/entrywatcher.h"
 
 #include <QAtomicInt>
+#include <QDBusInterface>
+#include <QList>
 #include <QMap>
+#include <QSharedPointer>
+#include <QWeakPointer>
+
+#include <memory>
 
 struct __dirstream;
 
 namespace VeyFM {
 
 /**
- * The inside of VFS. Its sources are cut by concern: vfs_startup, vfs_paths, vfs_listing,
- * vfs_navigation, vfs_urls, vfs_watching.
+ * The inside of VFS. Its sources are cut by concern: vfs_startup, vfs_service, vfs_paths,
+ * vfs_listing, vfs_navigation, vfs_urls, vfs_watching, vfs_records, vfs_placeupdates, vfs_samba.
  */
 class VFSPrivate
 {
@@ -29,8 +41,11 @@ public:
 
     // Start-up. Runs inside the construction of the one VFS object, so nothing that it calls may
     // come back to VFS::ptr(); Entry::localPath() on an empty stored path would.
+    void initService();
     void initialize();
     void initializeNetwork();
+    void releaseService();
+    QSharedPointer<QDBusInterface> createInterface(const QString& path, const QString& interface);
 
     // Paths.
     Entry entryFromSchemePath(const QString& path) const;
@@ -51,6 +66,43 @@ public:
         EntryList* children) const;
     static __dirstream* openListing(const QByteArray& directory);
 
+    /// The URL of a bookmark, or of something below it, by its path behind the Network place.
+    QString bookmarkUrl(const QString& relativePath) const;
+
+    // Places for the service's records.
+    void addStoragePlace(const StoragePlace& place, bool notify);
+    void addFavouritePlace(const FavouritePlace& place, bool notify);
+    void addNetworkPlace(const NetworkPlace& place, bool notify);
+    EntryList addNetworkMounts(const QMap<QString, Entry>& mounts, bool notify);
+    EntryList addMountsOfKind(const QList<Entry>& mounts, const Entry& kindPlace, bool notify);
+    QString networkPlacePath(const NetworkPlace& place) const;
+    QString workgroupPath(const QString& workgroup) const;
+
+    // Fills of pending places, and news of the service.
+    void _q_createStoragePlaces(const QString& path);
+    void _q_createSambaWorkgroups(const QString& path);
+    void _q_createSambaHosts(const QString& path);
+    void _q_createSambaShares(const QString& path);
+    void _q_serviceNotifyWatchers(const EntryList& entries);
+    void _q_serviceStoragePlaceAdded(const StoragePlace& place);
+    void _q_serviceStoragePlaceRemoved(const StoragePlace& place);
+    void _q_serviceStoragePlaceUpdated(const StoragePlace& place, const StoragePlace& previous);
+    void _q_favouritePlaceAdded(const FavouritePlace& place);
+    void _q_favouritePlaceRemoved(const FavouritePlace& place);
+    void _q_networkPlaceAdded(const NetworkPlace& place);
+    void _q_networkPlaceRemoved(const NetworkPlace& place);
+    void _q_networkPlaceUpdated(const NetworkPlace& place);
+    void _q_fuseMountAdded(const QString& url, const Entry& entry);
+    void _q_smbWorkgroupsChanged(const QStringList& added, const QStringList& removed);
+    void _q_smbWorkgroupUpdated(
+        const QString& workgroup, const QStringList& added, const QStringList& removed);
+    void _q_smbHostUpdated(
+        const QString& host, const QString& workgroup, const StringMap& added,
+        const StringMap& removed);
+    void _q_smbShareUpdated(
+        const QString& share, const QString& host, const QString& workgroup,
+        const QString& localPath);
+
     // Changes to the tree, announced to the watchers on request.
     bool addEntryToPlace(const Entry& entry, const Entry& place, bool notify);
     EntryList addEntriesToPlace(const EntryList& entries, const Entry& place, bool notify);
@@ -60,6 +112,13 @@ public:
     EntryWatcher entryWatcher;
     VFSPlaceBase placeBase;
     mutable QAtomicInt stopFlag;
+    QWeakPointer<QDBusInterface> fileSystemInterface;
+    std::unique_ptr<StoragePlacesManagerProxy> storagePlacesManager;
+    std::unique_ptr<FavouritePlacesManagerProxy> favouritePlacesManager;
+    std::unique_ptr<SmbBrowserProxy> smbBrowser;
+    std::unique_ptr<NetworkMountsManagerProxy> networkMountsManager;
+    std::unique_ptr<NetworkPlacesManagerProxy> networkPlacesManager;
+    std::unique_ptr<FuseMountsManagerProxy> fuseMountsManager;
     // Read by VFS::childs(); nothing fills it.
     QMap<Entry, EntryList> extraChildren;
 
@@ -80,6 +139,12 @@ public:
     Entry storageDevicesEntry;
 
     VFSSettings settings;
+
+    QString serviceName;
+    // The one strong holder of the interfaces: to empty it cuts all proxies off.
+    QList<QSharedPointer<QDBusInterface>> interfaces;
+    // Set only where the service could be activated, and then this process counts there.
+    std::unique_ptr<QDBusInterface> serviceInterface;
 };
 
 } // namespace VeyFM

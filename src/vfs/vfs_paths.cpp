@@ -319,8 +319,7 @@ QString VFS::localPath(const Entry& entry) const
         return d->resolveLocalPath(entry.m_path);
     }
     if (entry.isStoragePlace()) {
-        // Where a device is mounted only the service knows.
-        return QString();
+        return storagePlace(entry).mountPoint();
     }
     if (entry.isSambaSharePlace() || entry.isFavouriteNetworkPlace()) {
         // What the tree knows now, not what the entry was given once.

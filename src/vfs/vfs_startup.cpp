@@ -42,6 +42,23 @@ void VFSPrivate::initialize()
          {homeEntry, desktopEntry, trashEntry, storageDevicesEntry, fileSystemEntry}) {
         addEntryToPlace(entry, computerEntry, false);
     }
+    if (favouritePlacesManager) {
+        const QList<FavouritePlace> favourites = favouritePlacesManager->favouritePlaces();
+        for (const FavouritePlace& place : favourites) {
+            addFavouritePlace(place, false);
+        }
+        QObject::connect(
+            favouritePlacesManager.get(), SIGNAL(favouritePlaceAdded(VeyFM::FavouritePlace)), q,
+            SLOT(_q_favouritePlaceAdded(VeyFM::FavouritePlace)));
+        QObject::connect(
+            favouritePlacesManager.get(), SIGNAL(favouritePlaceRemoved(VeyFM::FavouritePlace)), q,
+            SLOT(_q_favouritePlaceRemoved(VeyFM::FavouritePlace)));
+    }
+    if (const auto fileSystem = fileSystemInterface.toStrongRef()) {
+        QObject::connect(
+            fileSystem.data(), SIGNAL(notifyWatchersSignal(VeyFM::EntryList)), q,
+            SLOT(_q_serviceNotifyWatchers(VeyFM::EntryList)));
+    }
     for (const Entry& entry :
          {favouritesEntry, homeEntry, desktopEntry, trashEntry, fileSystemEntry,
           storageDevicesEntry}) {
@@ -52,24 +69,6 @@ void VFSPrivate::initialize()
 
     // An ordinary directory, not a place: there is none while the user has no such directory.
     documentsEntry = q->entry(StandardPaths::documentsDirPath());
-}
-
-void VFSPrivate::initializeNetwork()
-{
-    if (!settings.isNetworkEnabled()) {
-        return;
-    }
-    const QString none;
-    networkEntry = placeBase.createPlace(VFS::tr("Network"), TypeNetworkPlace, none);
-    sambaNetworkEntry = placeBase.createPendingPlace(
-        VFS::tr("Samba"), TypeSambaNetworkPlace, q, "_q_createSambaWorkgroups");
-    // These two have no parent until something of their kind is mounted.
-    ftpNetworkEntry = placeBase.createPlace(VFS::tr("FTP"), TypeFtpNetworkPlace, none);
-    sftpNetworkEntry = placeBase.createPlace(VFS::tr("SFTP"), TypeSFtpNetworkPlace, none);
-
-    addEntryToPlace(networkEntry, rootEntry, false);
-    addEntryToPlace(sambaNetworkEntry, networkEntry, false);
-    addEntryToPlace(networkEntry, placesEntry, false);
 }
 
 } // namespace VeyFM

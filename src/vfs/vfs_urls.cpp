@@ -52,8 +52,7 @@ QString VFS::getUrlForEntry(const Entry& entry) const
     // Tests of text, in this order.
     const QString path = entry.m_path;
     if (path.startsWith(d->networkEntry.m_path)) {
-        // A bookmark's URL stands in its record, and there is no source of records yet.
-        return QString();
+        return d->bookmarkUrl(path.mid(d->networkEntry.m_path.size() + 1));
     }
     if (path.startsWith(d->ftpNetworkEntry.m_path)) {
         return QLatin1String("ftp:/") + path.mid(d->ftpNetworkEntry.m_path.size());
@@ -65,6 +64,19 @@ QString VFS::getUrlForEntry(const Entry& entry) const
         return sambaUrl(path.mid(d->sambaNetworkEntry.m_path.size() + 1));
     }
     return QString();
+}
+
+QString VFSPrivate::bookmarkUrl(const QString& relativePath) const
+{
+    const int end = relativePath.indexOf(slash);
+    const QString name = relativePath.left(end);
+    // The bookmark itself gets a URL that ends in two slashes, and keeps it so.
+    const QString rest = end < 0 ? QString(slash) : relativePath.mid(end + 1);
+    const Entry place = placeBase.placeEntry(networkEntry.m_path + slash + name);
+    if (place.isNull()) {
+        return QString();
+    }
+    return q->networkPlace(place).url() + slash + rest;
 }
 
 QList<QUrl> VFS::urlsFromEntries(const EntryList& entries) const

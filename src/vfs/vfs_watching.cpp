@@ -23,6 +23,21 @@ void VFS::directNotifyWatchers(const EntryList& entries, bool anyWay)
     }
 }
 
+void VFS::notifyAllWatchers(const EntryList& entries)
+{
+    Q_D(VFS);
+    // The views of this process are refreshed by the service's echo, never directly.
+    if (const auto fileSystem = d->fileSystemInterface.toStrongRef()) {
+        fileSystem->call(
+            QDBus::NoBlock, QStringLiteral("notifyWatchers"), QVariant::fromValue(entries));
+    }
+}
+
+void VFSPrivate::_q_serviceNotifyWatchers(const EntryList& entries)
+{
+    q->directNotifyWatchers(entries, true);
+}
+
 bool VFSPrivate::addEntryToPlace(const Entry& entry, const Entry& place, bool notify)
 {
     const bool linked = placeBase.addEntryToPlace(entry, place);

@@ -1,0 +1,74 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_AUTHENTICATOR_H
+#define VEYFM_AUTHENTICATOR_H
+
+#include "veyfmvfs_export.h"
+
+#include <QString>
+
+namespace VeyFM {
+
+/**
+ * Answers what a job has to ask a user. A job decides when a password or a yes or no is needed,
+ * and the host, which implements this, decides how to ask.
+ *
+ * A job sets the resource that its next question is about before it asks. Two jobs that run at
+ * the same time must therefore not share one authenticator. All calls come in the thread of the
+ * job, which waits for the answer.
+ *
+ * After a refused login the mount jobs call requestPassword() twice, and use the second answer.
+ * An implementation that remembers its last answer until credentialsRejected() asks once.
+ */
+class VEYFMVFS_EXPORT Authenticator
+{
+public:
+    Authenticator();
+    virtual ~Authenticator();
+
+    /**
+     * Returns the password of a user for the resource. An empty one is a password as well.
+     *
+     * @param isRetry whether an earlier answer, or an anonymous login, was refused
+     * @param title heading for the user, may be empty
+     * @param message text for the user, may be empty
+     * @param user in: the user name known so far; out: the one to use
+     * @param userChanged set to true when the user edited the name; never cleared here
+     * @param cancelled set to true when the user gave up; never cleared here
+     */
+    virtual QString requestPassword(
+        bool isRetry, const QString& title, const QString& message, QString& user,
+        bool* userChanged, bool* cancelled) = 0;
+
+    /// The server refused the credentials of @p user.
+    virtual void credentialsRejected(const QString& user) = 0;
+
+    /// The credentials last handed out worked.
+    virtual void credentialsAccepted() = 0;
+
+    /// Asks a question and returns true for yes.
+    virtual bool askQuestion(const QString& title, const QString& text) = 0;
+
+    /// What the next question is about; a job calls this before it asks.
+    void setResource(
+        const QString& protocol, const QString& domain, const QString& server,
+        const QString& object);
+
+    QString protocol() const; ///< "smb", "ftp" or "sftp".
+    QString domain() const;   ///< The workgroup, for Samba.
+    QString server() const;   ///< The host.
+    QString object() const;   ///< The share, for Samba.
+
+private:
+    Q_DISABLE_COPY(Authenticator)
+
+    QString m_protocol;
+    QString m_domain;
+    QString m_server;
+    QString m_object;
+};
+
+} // namespace VeyFM
+
+#endif

@@ -1,0 +1,82 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "jobs/vfsstoragejob.h"
+
+#include "core/storageplace.h"
+#include "service/storageplacesmanagerproxy.h"
+#include "vfs/vfs.h"
+
+namespace VeyFM {
+
+VFSStorageJob::VFSStorageJob(
+    const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent)
+    : Job(parent)
+    , m_entry(entry)
+    , m_storagePlacesManager(manager)
+{
+}
+
+VFSStorageJob::~VFSStorageJob() = default;
+
+void VFSStorageJob::run(Factory makeJob, const QString& refusal)
+{
+    if (!m_entry.isStoragePlace()) {
+        finishedWithError(1, refusal);
+        return;
+    }
+    if (!m_storagePlacesManager) {
+        finishedWithError(1, tr("Can't get service interface"));
+        return;
+    }
+    const StoragePlace place = VFS::ptr()->storagePlace(m_entry);
+    Job* const job = (m_storagePlacesManager->*makeJob)(place);
+    connect(job, &Job::finished, this, &VFSStorageJob::storageJobFinished);
+    job->start();
+}
+
+void VFSStorageJob::storageJobFinished(Job* job)
+{
+    if (job->error() == 0) {
+        finishedOk();
+    } else {
+        finishedWithError(job->error(), job->errorString());
+    }
+}
+
+VFSStorageMountJob::VFSStorageMountJob(
+    const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent)
+    : VFSStorageJob(entry, manager, parent)
+{
+}
+
+void VFSStorageMountJob::start()
+{
+    run(&StoragePlacesManagerProxy::mountStoragePlace, tr("This type of point cannot be mounted"));
+}
+
+VFSStorageUnmountJob::VFSStorageUnmountJob(
+    const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent)
+    : VFSStorageJob(entry, manager, parent)
+{
+}
+
+void VFSStorageUnmountJob::start()
+{
+    run(&StoragePlacesManagerProxy::unmountStoragePlace,
+        tr("This type of point cannot be unmounted"));
+}
+
+VFSStorageEjectJob::VFSStorageEjectJob(
+    const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent)
+    : VFSStorageJob(entry, manager, parent)
+{
+}
+
+void VFSStorageEjectJob::start()
+{
+    run(&StoragePlacesManagerProxy::ejectStoragePlaceDevice,
+        tr("This type of point cannot be ejected"));
+}
+
+} // namespace VeyFM

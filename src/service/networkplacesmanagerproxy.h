@@ -1,0 +1,69 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_NETWORKPLACESMANAGERPROXY_H
+#define VEYFM_NETWORKPLACESMANAGERPROXY_H
+
+#include "core/networkplace.h"
+#include "veyfmvfs_export.h"
+
+#include <QList>
+#include <QObject>
+#include <QWeakPointer>
+
+class QDBusInterface;
+
+namespace VeyFM {
+
+/**
+ * The network bookmarks as the service holds them: a list that is read once and patched by the
+ * service's signals, with the rules of FavouritePlacesManagerProxy.
+ *
+ * To be used in the thread that owns the object. Calls block for one exchange with the service.
+ */
+class VEYFMVFS_EXPORT NetworkPlacesManagerProxy : public QObject
+{
+    Q_OBJECT
+
+public:
+    /// The interface is not kept alive; once it has expired, lists are empty and calls do nothing.
+    explicit NetworkPlacesManagerProxy(
+        QWeakPointer<QDBusInterface> interface, QObject* parent = nullptr);
+    ~NetworkPlacesManagerProxy() override;
+
+    /// All bookmarks, in the service's order.
+    QList<NetworkPlace> networkPlaces();
+
+    /**
+     * Asks the service for a new bookmark and returns its answer, false where it gave none. The
+     * list still lacks the bookmark when this returns: it comes with the service's signal.
+     */
+    bool addNetworkPlace(const NetworkPlace& place);
+
+    /// Asks the service; a failure is not told. @{
+    void removeNetworkPlace(const NetworkPlace& place);
+    void updateNetworkPlace(const NetworkPlace& place);
+    /// @}
+
+Q_SIGNALS:
+    /// The service's news, after the list has been patched. An update comes with the new record
+    /// alone, and also for a bookmark that is not in the list. @{
+    void networkPlaceAdded(VeyFM::NetworkPlace place);
+    void networkPlaceRemoved(VeyFM::NetworkPlace place);
+    void networkPlaceUpdated(VeyFM::NetworkPlace place);
+    /// @}
+
+private Q_SLOTS:
+    void slotNetworkPlaceAdded(const VeyFM::NetworkPlace& place);
+    void slotNetworkPlaceRemoved(const VeyFM::NetworkPlace& place);
+    void slotNetworkPlaceUpdated(const VeyFM::NetworkPlace& place);
+
+private:
+    const QWeakPointer<QDBusInterface> m_interface;
+    QList<NetworkPlace> m_networkPlaces;
+    bool m_networkPlacesLoaded = false;
+};
+
+} // namespace VeyFM
+
+#endif

@@ -1,0 +1,199 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+// How the tree follows the service's devices, bookmarks and mounts.
+
+#include "vfs/vfs_p.h"
+
+namespace VeyFM {
+
+namespace {
+
+const QLatin1Char slash('/');
+
+// The type of a device's place; 0 for a device that is not shown.
+int entryType(StoragePlace::Type type)
+{
+    switch (type) {
+    case StoragePlace::StorageTypeFloppyDrive:
+        return TypeFloppyDriveStoragePlace;
+    case StoragePlace::StorageTypeCdromDrive:
+        return TypeCdromDriveStoragePlace;
+    case StoragePlace::StorageTypeUsbDisk:
+        return TypeUsbDiskStoragePlace;
+    case StoragePlace::StorageTypeHardDiskDrive:
+        return TypeHardDiskDriveStoragePlace;
+    case StoragePlace::StorageType5:
+        return TypeStoragePlace5;
+    case StoragePlace::StorageType6:
+        return TypeStoragePlace6;
+    case StoragePlace::StorageType7:
+        return TypeStoragePlace7;
+    case StoragePlace::StorageType8:
+        return TypeStoragePlace8;
+    default:
+        return TypeNone;
+    }
+}
+
+} // namespace
+
+void VFSPrivate::_q_createStoragePlaces(const QString& path)
+{
+    Q_UNUSED(path)
+    Q_EMIT q->longTimeOperationStarted();
+    if (storagePlacesManager) {
+        // Only here: a process that never looks at devices is not woken by their news.
+        QObject::connect(
+            storagePlacesManager.get(),
+            SIGNAL(storagePlaceUpdated(VeyFM::StoragePlace, VeyFM::StoragePlace)), q,
+            SLOT(_q_serviceStoragePlaceUpdated(VeyFM::StoragePlace, VeyFM::StoragePlace)));
+        QObject::connect(
+            storagePlacesManager.get(), SIGNAL(storagePlaceAdded(VeyFM::StoragePlace)), q,
+            SLOT(_q_serviceStoragePlaceAdded(VeyFM::StoragePlace)));
+        QObject::connect(
+            storagePlacesManager.get(), SIGNAL(storagePlaceRemoved(VeyFM::StoragePlace)), q,
+            SLOT(_q_serviceStoragePlaceRemoved(VeyFM::StoragePlace)));
+        const QList<StoragePlace> places = storagePlacesManager->availableStoragePlaces();
+        for (const StoragePlace& place : places) {
+            addStoragePlace(place, false);
+        }
+    }
+    Q_EMIT q->longTimeOperationFinished();
+}
+
+void VFSPrivate::addStoragePlace(const StoragePlace& place, bool notify)
+{
+    const int type = entryType(place.type());
+    if (type == TypeNone) {
+        return;
+    }
+    const QString path = storageDevicesEntry.m_path + slash + place.placeName();
+    const Entry entry = placeBase.createPlace(path, type, place.mountPoint());
+    addEntryToPlace(entry, storageDevicesEntry, notify);
+}
+
+void VFSPrivate::_q_serviceStoragePlaceAdded(const StoragePlace& place)
+{
+    addStoragePlace(place, true);
+}
+
+void VFSPrivate::_q_serviceStoragePlaceUpdated(
+    const StoragePlace& place, const StoragePlace& previous)
+{
+    // The signals run before the tree knows the new mount point, and the entry that goes to the
+    // watchers still has the old one. Receivers read the entry again.
+    if (previous.isMounted() != place.isMounted()) {
+        Q_EMIT q->storagePlaceMountStateChanged(place);
+    }
+    if (previous.isMountable() != place.isMountable()) {
+        Q_EMIT q->storagePlaceMountabilityChanged(place);
+    }
+    const Entry entry = q->entry(place.name());
+    placeBase.setPlaceLocalPath(entry, place.mountPoint());
+    q->notifyWatchers(entry);
+}
+
+void VFSPrivate::_q_serviceStoragePlaceRemoved(const StoragePlace& place)
+{
+    // While the signal runs the place is still in the tree.
+    Q_EMIT q->storagePlaceRemoved(place);
+    destroyPlace(q->entry(place.name()));
+}
+
+void VFSPrivate::addFavouritePlace(const FavouritePlace& place, bool notify)
+{
+    const Entry entry =
+        placeBase.createPlace(q->favouritePlacePath(place), TypeFavouritePlace, place.localPath);
+    addEntryToPlace(entry, favouritesEntry, notify);
+}
+
+void VFSPrivate::_q_favouritePlaceAdded(const FavouritePlace& place)
+{
+    addFavouritePlace(place, true);
+}
+
+void VFSPrivate::_q_favouritePlaceRemoved(const FavouritePlace& place)
+{
+    destroyPlace(q->entry(q->favouritePlacePath(place)));
+}
+
+QString VFSPrivate::networkPlacePath(const NetworkPlace& place) const
+{
+    return networkEntry.m_path + slash + place.name();
+}
+
+void VFSPrivate::addNetworkPlace(const NetworkPlace& place, bool notify)
+{
+    const Entry entry = placeBase.createPlace(
+        networkPlacePath(place), TypeFavouriteNetworkPlace, place.localPath());
+    const bool linked = addEntryToPlace(entry, networkEntry, notify);
+    // A null entry tells that nothing new was linked. The signal goes out in either case, and
+    // for the bookmarks read at start-up too.
+    Q_EMIT q->networkPlaceAdded(place, linked ? entry : Entry());
+}
+
+void VFSPrivate::_q_networkPlaceAdded(const NetworkPlace& place)
+{
+    addNetworkPlace(place, true);
+}
+
+void VFSPrivate::_q_networkPlaceRemoved(const NetworkPlace& place)
+{
+    destroyPlace(Entry(networkPlacePath(place), QString(), TypeFavouriteNetworkPlace));
+}
+
+void VFSPrivate::_q_networkPlaceUpdated(const NetworkPlace& place)
+{
+    // The entry that goes out still has the old local path. Receivers read it again.
+    const Entry entry = q->entry(networkPlacePath(place));
+    placeBase.setPlaceLocalPath(entry, place.localPath());
+    q->notifyWatchers(entry);
+    Q_EMIT q->networkPlaceUpdated(entry);
+}
+
+EntryList VFSPrivate::addNetworkMounts(const QMap<QString, Entry>& mounts, bool notify)
+{
+    QList<Entry> ftpMounts;
+    QList<Entry> sftpMounts;
+    for (auto it = mounts.cbegin(); it != mounts.cend(); ++it) {
+        const QString scheme = QUrl(it.key()).scheme();
+        if (scheme == QLatin1String("ftp")) {
+            ftpMounts.append(it.value());
+        } else if (scheme == QLatin1String("sftp")) {
+            sftpMounts.append(it.value());
+        }
+    }
+    EntryList result = addMountsOfKind(ftpMounts, ftpNetworkEntry, notify);
+    result += addMountsOfKind(sftpMounts, sftpNetworkEntry, notify);
+    return result;
+}
+
+EntryList
+VFSPrivate::addMountsOfKind(const QList<Entry>& mounts, const Entry& kindPlace, bool notify)
+{
+    EntryList entries;
+    for (const Entry& mount : mounts) {
+        entries.append(placeBase.createPlace(mount));
+    }
+    if (!entries.isEmpty()) {
+        // FTP and SFTP hang under Network from the first mount of their kind on.
+        if (!placeBase.placeHasChildEntry(networkEntry, kindPlace)) {
+            addEntryToPlace(kindPlace, networkEntry, notify);
+        }
+        addEntriesToPlace(entries, kindPlace, notify);
+    }
+    return entries;
+}
+
+void VFSPrivate::_q_fuseMountAdded(const QString& url, const Entry& entry)
+{
+    if (entry.isNull()) {
+        Q_EMIT q->fuseMountAdded(url, Entry());
+        return;
+    }
+    const EntryList mounted = addNetworkMounts({{url, entry}}, true);
+    Q_EMIT q->fuseMountAdded(url, mounted.value(0));
+}
+
+} // namespace VeyFM

@@ -1,0 +1,158 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "vfs/vfs_p.h"
+
+#include <QDBusConnection>
+#include <QDBusConnectionInterface>
+#include <QDBusReply>
+#include <QDebug>
+
+namespace VeyFM {
+
+namespace {
+
+// Where the service offers its interfaces, all on its one bus name.
+struct ServiceObject
+{
+    const char* path;
+    const char* interface;
+};
+
+constexpr ServiceObject processReference = {"/", "org.veylabs.FileManager.Service"};
+constexpr ServiceObject fileSystem = {"/", "org.veylabs.FileManager.FileSystem"};
+constexpr ServiceObject storagePlaces = {
+    "/StoragePlacesManager", "org.veylabs.FileManager.StoragePlacesManager"};
+constexpr ServiceObject favouritePlaces = {
+    "/FavouritePlacesManager", "org.veylabs.FileManager.FavouritePlacesManager"};
+constexpr ServiceObject smbBrowsing = {"/SmbBrowser", "org.veylabs.FileManager.SmbBrowser"};
+constexpr ServiceObject networkMounts = {
+    "/NetworkMountsManager", "org.veylabs.FileManager.NetworkMountsManager"};
+constexpr ServiceObject networkPlaces = {
+    "/NetworkPlacesManager", "org.veylabs.FileManager.NetworkPlacesManager"};
+constexpr ServiceObject fuseMounts = {
+    "/FuseMountsManager", "org.veylabs.FileManager.FuseMountsManager"};
+
+// The bus daemon, or null where the session has no bus. QDBusConnection::interface() alone does
+// not tell: it is there without a connection too.
+QDBusConnectionInterface* connectedDaemon()
+{
+    const QDBusConnection bus = QDBusConnection::sessionBus();
+    return bus.isConnected() ? bus.interface() : nullptr;
+}
+
+} // namespace
+
+void VFSPrivate::initService()
+{
+    serviceName = QStringLiteral("org.veylabs.vey-fm.vfs");
+
+    if (QDBusConnectionInterface* const daemon = connectedDaemon()) {
+        const QDBusReply<QStringList> activatable =
+            daemon->call(QDBus::Block, QStringLiteral("ListActivatableNames"));
+        // A running service that can't be activated counts as missing.
+        if (activatable.value().contains(serviceName)) {
+            daemon->startService(serviceName);
+            serviceInterface = std::make_unique<QDBusInterface>(
+                serviceName, QLatin1String(processReference.path),
+                QLatin1String(processReference.interface), QDBusConnection::sessionBus());
+            serviceInterface->call(QDBus::Block, QStringLiteral("incrementProcessRef"));
+        } else {
+            qCritical().noquote() << QObject::tr("service %1 is not installed").arg(serviceName);
+        }
+    } else {
+        qCritical().noquote() << QObject::tr(
+                                     "can't connect to DBus service %1, perhaps usage 'dbus-launch "
+                                     "<program>' can solve this problem")
+                                     .arg(serviceName);
+    }
+
+    // The proxies exist whatever has happened, and have nothing to tell without a service.
+    const auto make = [this](const ServiceObject& object) {
+        return createInterface(QLatin1String(object.path), QLatin1String(object.interface));
+    };
+    fileSystemInterface = make(fileSystem);
+    storagePlacesManager = std::make_unique<StoragePlacesManagerProxy>(make(storagePlaces), q);
+    favouritePlacesManager =
+        std::make_unique<FavouritePlacesManagerProxy>(make(favouritePlaces), q);
+    smbBrowser = std::make_unique<SmbBrowserProxy>(make(smbBrowsing), q);
+    networkMountsManager = std::make_unique<NetworkMountsManagerProxy>(make(networkMounts), q);
+    networkPlacesManager = std::make_unique<NetworkPlacesManagerProxy>(make(networkPlaces), q);
+    fuseMountsManager = std::make_unique<FuseMountsManagerProxy>(make(fuseMounts), q);
+}
+
+QSharedPointer<QDBusInterface>
+VFSPrivate::createInterface(const QString& path, const QString& interface)
+{
+    const auto made = QSharedPointer<QDBusInterface>::create(
+        serviceName, path, interface, QDBusConnection::sessionBus());
+    interfaces.append(made);
+    return made;
+}
+
+void VFSPrivate::initializeNetwork()
+{
+    if (!settings.isNetworkEnabled()) {
+        return;
+    }
+    const QString none;
+    networkEntry = placeBase.createPlace(VFS::tr("Network"), TypeNetworkPlace, none);
+    sambaNetworkEntry = placeBase.createPendingPlace(
+        VFS::tr("Samba"), TypeSambaNetworkPlace, q, "_q_createSambaWorkgroups");
+    // These two have no parent until something of their kind is mounted.
+    ftpNetworkEntry = placeBase.createPlace(VFS::tr("FTP"), TypeFtpNetworkPlace, none);
+    sftpNetworkEntry = placeBase.createPlace(VFS::tr("SFTP"), TypeSFtpNetworkPlace, none);
+
+    addEntryToPlace(networkEntry, rootEntry, false);
+    addEntryToPlace(sambaNetworkEntry, networkEntry, false);
+    addEntryToPlace(networkEntry, placesEntry, false);
+
+    if (networkMountsManager) {
+        addNetworkMounts(networkMountsManager->mounts(), true);
+        QObject::connect(
+            networkMountsManager.get(), SIGNAL(mountAdded(QString, VeyFM::Entry)), q,
+            SLOT(_q_fuseMountAdded(QString, VeyFM::Entry)));
+    }
+    if (smbBrowser) {
+        QObject::connect(
+            smbBrowser.get(), SIGNAL(workgroupsChanged(QStringList, QStringList)), q,
+            SLOT(_q_smbWorkgroupsChanged(QStringList, QStringList)));
+        QObject::connect(
+            smbBrowser.get(), SIGNAL(workgroupUpdated(QString, QStringList, QStringList)), q,
+            SLOT(_q_smbWorkgroupUpdated(QString, QStringList, QStringList)));
+        QObject::connect(
+            smbBrowser.get(), SIGNAL(hostUpdated(QString, QString, StringMap, StringMap)), q,
+            SLOT(_q_smbHostUpdated(QString, QString, StringMap, StringMap)));
+        QObject::connect(
+            smbBrowser.get(), SIGNAL(shareUpdated(QString, QString, QString, QString)), q,
+            SLOT(_q_smbShareUpdated(QString, QString, QString, QString)));
+    }
+    if (networkPlacesManager) {
+        const QList<NetworkPlace> bookmarks = networkPlacesManager->networkPlaces();
+        for (const NetworkPlace& place : bookmarks) {
+            addNetworkPlace(place, false);
+        }
+        QObject::connect(
+            networkPlacesManager.get(), SIGNAL(networkPlaceAdded(VeyFM::NetworkPlace)), q,
+            SLOT(_q_networkPlaceAdded(VeyFM::NetworkPlace)));
+        QObject::connect(
+            networkPlacesManager.get(), SIGNAL(networkPlaceRemoved(VeyFM::NetworkPlace)), q,
+            SLOT(_q_networkPlaceRemoved(VeyFM::NetworkPlace)));
+        QObject::connect(
+            networkPlacesManager.get(), SIGNAL(networkPlaceUpdated(VeyFM::NetworkPlace)), q,
+            SLOT(_q_networkPlaceUpdated(VeyFM::NetworkPlace)));
+    }
+}
+
+void VFSPrivate::releaseService()
+{
+    if (serviceInterface) {
+        if (serviceInterface->isValid()) {
+            serviceInterface->call(QDBus::Block, QStringLiteral("decrementProcessRef"));
+        }
+        serviceInterface.reset();
+    }
+    interfaces.clear();
+}
+
+} // namespace VeyFM
