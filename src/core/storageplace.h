@@ -87,6 +87,9 @@ public:
     const QDBusArgument& fromDBusArgument(const QDBusArgument& argument);
 
 private:
+    friend class VFS;
+    friend class VFSPrivate;
+
     QString m_mountPoint;
     QString m_reservedText; // Goes with copies and stays here otherwise: reading leaves it alone.
     bool m_ejectable = false;

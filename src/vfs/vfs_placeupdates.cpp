@@ -68,7 +68,7 @@ void VFSPrivate::addStoragePlace(const StoragePlace& place, bool notify)
     if (type == TypeNone) {
         return;
     }
-    const QString path = storageDevicesEntry.m_path + slash + place.placeName();
+    const QString path = storageDevicesEntry.m_path + slash + place.m_placeName;
     const Entry entry = placeBase.createPlace(path, type, place.mountPoint());
     addEntryToPlace(entry, storageDevicesEntry, notify);
 }

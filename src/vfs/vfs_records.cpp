@@ -38,7 +38,7 @@ StoragePlace VFS::storagePlace(const Entry& entry) const
     const QStringRef name = entry.m_path.midRef(parent.size());
     return firstOf(
         d->storagePlacesManager->availableStoragePlaces(),
-        [&name](const StoragePlace& place) { return place.placeName() == name; });
+        [&name](const StoragePlace& place) { return place.m_placeName == name; });
 }
 
 StoragePlace VFS::freshStoragePlace(const StoragePlace& place) const
