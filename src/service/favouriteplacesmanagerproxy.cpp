@@ -4,6 +4,7 @@
 #include "service/favouriteplacesmanagerproxy.h"
 
 #include "service/servicecall.h"
+#include "service/servicesignals.h"
 
 namespace VeyFM {
 
@@ -13,11 +14,11 @@ FavouritePlacesManagerProxy::FavouritePlacesManagerProxy(
     , m_interface(std::move(interface))
 {
     if (const auto alive = m_interface.toStrongRef()) {
-        connect(
-            alive.data(), SIGNAL(favouritePlaceAdded(VeyFM::FavouritePlace)), this,
+        followService(
+            *alive, SIGNAL(favouritePlaceAdded(VeyFM::FavouritePlace)), this,
             SLOT(slotFavouritePlaceAdded(VeyFM::FavouritePlace)));
-        connect(
-            alive.data(), SIGNAL(favouritePlaceRemoved(VeyFM::FavouritePlace)), this,
+        followService(
+            *alive, SIGNAL(favouritePlaceRemoved(VeyFM::FavouritePlace)), this,
             SLOT(slotFavouritePlaceRemoved(VeyFM::FavouritePlace)));
     }
 }

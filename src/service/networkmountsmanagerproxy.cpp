@@ -5,6 +5,7 @@
 
 #include "core/metatypes.h"
 #include "service/servicecall.h"
+#include "service/servicesignals.h"
 
 namespace VeyFM {
 
@@ -14,8 +15,8 @@ NetworkMountsManagerProxy::NetworkMountsManagerProxy(
     , m_interface(std::move(interface))
 {
     if (const auto alive = m_interface.toStrongRef()) {
-        connect(
-            alive.data(), SIGNAL(mountAdded(QString, VeyFM::Entry)), this,
+        followService(
+            *alive, SIGNAL(mountAdded(QString, VeyFM::Entry)), this,
             SIGNAL(mountAdded(QString, VeyFM::Entry)));
     }
 }

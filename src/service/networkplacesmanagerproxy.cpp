@@ -4,6 +4,7 @@
 #include "service/networkplacesmanagerproxy.h"
 
 #include "service/servicecall.h"
+#include "service/servicesignals.h"
 
 namespace VeyFM {
 
@@ -13,14 +14,14 @@ NetworkPlacesManagerProxy::NetworkPlacesManagerProxy(
     , m_interface(std::move(interface))
 {
     if (const auto alive = m_interface.toStrongRef()) {
-        connect(
-            alive.data(), SIGNAL(networkPlaceAdded(VeyFM::NetworkPlace)), this,
+        followService(
+            *alive, SIGNAL(networkPlaceAdded(VeyFM::NetworkPlace)), this,
             SLOT(slotNetworkPlaceAdded(VeyFM::NetworkPlace)));
-        connect(
-            alive.data(), SIGNAL(networkPlaceRemoved(VeyFM::NetworkPlace)), this,
+        followService(
+            *alive, SIGNAL(networkPlaceRemoved(VeyFM::NetworkPlace)), this,
             SLOT(slotNetworkPlaceRemoved(VeyFM::NetworkPlace)));
-        connect(
-            alive.data(), SIGNAL(networkPlaceUpdated(VeyFM::NetworkPlace)), this,
+        followService(
+            *alive, SIGNAL(networkPlaceUpdated(VeyFM::NetworkPlace)), this,
             SLOT(slotNetworkPlaceUpdated(VeyFM::NetworkPlace)));
     }
 }

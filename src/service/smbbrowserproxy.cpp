@@ -4,6 +4,7 @@
 #include "service/smbbrowserproxy.h"
 
 #include "service/servicecall.h"
+#include "service/servicesignals.h"
 #include "service/smbleveldelta.h"
 
 namespace VeyFM {
@@ -28,15 +29,15 @@ SmbBrowserProxy::SmbBrowserProxy(QWeakPointer<QDBusInterface> interface, QObject
     , m_interface(std::move(interface))
 {
     if (const auto alive = m_interface.toStrongRef()) {
-        connect(alive.data(), SIGNAL(rescanFinished(bool)), this, SLOT(slotRescanFinished(bool)));
-        connect(
-            alive.data(), SIGNAL(rescanWorkgroupFinished(QString, bool)), this,
+        followService(*alive, SIGNAL(rescanFinished(bool)), this, SLOT(slotRescanFinished(bool)));
+        followService(
+            *alive, SIGNAL(rescanWorkgroupFinished(QString, bool)), this,
             SLOT(slotRescanWorkgroupFinished(QString, bool)));
-        connect(
-            alive.data(), SIGNAL(rescanHostFinished(QString, QString, bool)), this,
+        followService(
+            *alive, SIGNAL(rescanHostFinished(QString, QString, bool)), this,
             SLOT(slotRescanHostFinished(QString, QString, bool)));
-        connect(
-            alive.data(), SIGNAL(shareUpdated(QString, QString, QString, QString)), this,
+        followService(
+            *alive, SIGNAL(shareUpdated(QString, QString, QString, QString)), this,
             SLOT(slotSharedUpdated(QString, QString, QString, QString)));
     }
 }

@@ -5,6 +5,7 @@
 
 #include "jobs/storageplacejob.h"
 #include "service/servicecall.h"
+#include "service/servicesignals.h"
 
 namespace VeyFM {
 
@@ -14,14 +15,14 @@ StoragePlacesManagerProxy::StoragePlacesManagerProxy(
     , m_interface(std::move(interface))
 {
     if (const auto alive = m_interface.toStrongRef()) {
-        connect(
-            alive.data(), SIGNAL(storagePlaceUpdated(VeyFM::StoragePlace)), this,
+        followService(
+            *alive, SIGNAL(storagePlaceUpdated(VeyFM::StoragePlace)), this,
             SLOT(slotStoragePlaceUpdated(VeyFM::StoragePlace)));
-        connect(
-            alive.data(), SIGNAL(storagePlaceAdded(VeyFM::StoragePlace)), this,
+        followService(
+            *alive, SIGNAL(storagePlaceAdded(VeyFM::StoragePlace)), this,
             SLOT(slotStoragePlaceAdded(VeyFM::StoragePlace)));
-        connect(
-            alive.data(), SIGNAL(storagePlaceRemoved(VeyFM::StoragePlace)), this,
+        followService(
+            *alive, SIGNAL(storagePlaceRemoved(VeyFM::StoragePlace)), this,
             SLOT(slotStoragePlaceRemoved(VeyFM::StoragePlace)));
     }
 }

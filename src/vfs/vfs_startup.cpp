@@ -1,6 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
+#include "service/servicesignals.h"
 #include "vfs/standardpaths.h"
 #include "vfs/vfs_p.h"
 
@@ -55,8 +56,8 @@ void VFSPrivate::initialize()
             SLOT(_q_favouritePlaceRemoved(VeyFM::FavouritePlace)));
     }
     if (const auto fileSystem = fileSystemInterface.toStrongRef()) {
-        QObject::connect(
-            fileSystem.data(), SIGNAL(notifyWatchersSignal(VeyFM::EntryList)), q,
+        followService(
+            *fileSystem, SIGNAL(notifyWatchersSignal(VeyFM::EntryList)), q,
             SLOT(_q_serviceNotifyWatchers(VeyFM::EntryList)));
     }
     for (const Entry& entry :
