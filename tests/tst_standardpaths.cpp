@@ -30,8 +30,9 @@ Resolver resolver;
 
 } // namespace
 
-// Stands before the C library's in this process, so that no name server decides about the tests.
-extern "C" int
+// Stands before the C library's in this process (hence exported), so that no name server decides
+// about the tests.
+extern "C" Q_DECL_EXPORT int
 getaddrinfo(const char* node, const char* service, const addrinfo* hints, addrinfo** result)
 {
     resolver.node = node;
@@ -42,7 +43,7 @@ getaddrinfo(const char* node, const char* service, const addrinfo* hints, addrin
     return resolver.error;
 }
 
-extern "C" void freeaddrinfo(addrinfo* result) noexcept
+extern "C" Q_DECL_EXPORT void freeaddrinfo(addrinfo* result) noexcept
 {
     resolver.freed += result == resolver.answer;
 }

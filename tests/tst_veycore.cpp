@@ -20,6 +20,7 @@ private Q_SLOTS:
     void init();
     void organization();
     void withoutSettings();
+    void withoutHome();
     void xdgDirectories();
     void userDirs_data();
     void userDirs();
@@ -68,6 +69,13 @@ void TestVeyCore::withoutSettings()
     QVERIFY2(QDir(m_home->path()).isEmpty(), "looking up creates nothing");
 }
 
+void TestVeyCore::withoutHome()
+{
+    qunsetenv("HOME");
+    QCOMPARE(GetVeyDir(VeyDirDesktop), "/Desktop");
+    QCOMPARE(GetVeyDir(VeyDirTrash), "/.local/share/Trash/files");
+}
+
 void TestVeyCore::xdgDirectories()
 {
     qputenv("XDG_CONFIG_HOME", path("/etc"));
@@ -92,6 +100,8 @@ void TestVeyCore::userDirs_data()
                                 << QByteArray("/Pult");
     QTest::newRow("absolute") << QByteArray("XDG_DESKTOP_DIR=\"/srv/a b\"")
                               << QByteArray("=/srv/a b");
+    QTest::newRow("untidy") << QByteArray("XDG_DESKTOP_DIR=\"/srv//a/../b/\"")
+                            << QByteArray("=/srv/b");
     QTest::newRow("none of its own") << QByteArray("XDG_DESKTOP_DIR=\"$HOME/\"") << QByteArray();
     QTest::newRow("relative") << QByteArray("XDG_DESKTOP_DIR=\"Pult\"") << QByteArray("/Desktop");
     QTest::newRow("empty") << QByteArray("XDG_DESKTOP_DIR=\"\"") << QByteArray("/Desktop");

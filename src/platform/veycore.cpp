@@ -19,8 +19,8 @@ QString userDirectory(QStandardPaths::StandardLocation location, QLatin1String f
     return QDir::isAbsolutePath(path) ? path : QDir::homePath() + fallback;
 }
 
-// A user without a desktop directory has "$HOME/" as its setting, with a slash that would keep the
-// path from being recognised as a prefix of others.
+// Cleaned, since a doubled slash would keep the path from being recognised as a prefix of others. A
+// setting may hold one, and a home directory of "/" makes one.
 const char* keepForEver(const QString& path)
 {
     static std::mutex mutex;
