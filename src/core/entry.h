@@ -249,10 +249,15 @@ private:
 /// qHash() of Entry::path(), so that equal entries hash alike.
 VEYFMVFS_EXPORT uint qHash(const Entry& entry, uint seed = 0);
 
+/// D-Bus form `(ssi)`: path, local path as stored, type. @{
 VEYFMVFS_EXPORT QDBusArgument& operator<<(QDBusArgument& argument, const Entry& entry);
 VEYFMVFS_EXPORT const QDBusArgument& operator>>(const QDBusArgument& argument, Entry& entry);
+/// @}
+
+/// The same three in a data stream. Reading too little shows in the status of the stream. @{
 VEYFMVFS_EXPORT QDataStream& operator<<(QDataStream& stream, const Entry& entry);
 VEYFMVFS_EXPORT QDataStream& operator>>(QDataStream& stream, Entry& entry);
+/// @}
 
 /// Prints `VeyFM::Entry("path", "localPath")`. It computes localPath(), so it may reach VFS.
 VEYFMVFS_EXPORT QDebug operator<<(QDebug debug, const Entry& entry);

@@ -22,14 +22,17 @@ class VEYFMVFS_EXPORT EntryList : public QList<Entry>
 {
 public:
     EntryList();
+    /// The same elements, shared until one of both changes.
     EntryList(const QList<Entry>& entries);
+    /// A list of one element, a null entry too.
     EntryList(const Entry& entry);
+    /// Copies share their elements until one of them changes; what was moved from is empty. @{
     EntryList(const EntryList& other);
     EntryList(EntryList&& other) noexcept;
-    virtual ~EntryList();
-
     EntryList& operator=(const EntryList& other);
     EntryList& operator=(EntryList&& other) noexcept;
+    /// @}
+    virtual ~EntryList();
 
     bool hasPlace() const;     ///< Any element with Entry::isPlace().
     bool hasPurePlace() const; ///< Any element with Entry::isPurePlace().

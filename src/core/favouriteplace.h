@@ -27,6 +27,7 @@ class VEYFMVFS_EXPORT FavouritePlace
 public:
     /// Both texts null.
     FavouritePlace() = default;
+    /// A bookmark of the directory @p localPath, shown as @p name. Both are taken as they are.
     FavouritePlace(const QString& name, const QString& localPath);
 
     /// By localPath alone, as QString compares: by UTF-16 code units, case sensitive. @{
@@ -52,6 +53,7 @@ public:
     QString localPath;
 };
 
+/// In the order of the service.
 using FavouritePlaceList = QList<FavouritePlace>;
 
 /// FavouritePlace::toDBusArgument() and FavouritePlace::fromDBusArgument(). @{

@@ -27,6 +27,7 @@ class VEYFMVFS_EXPORT NetworkPlace
 public:
     /// All three texts null.
     NetworkPlace() = default;
+    /// The three texts, taken as they are.
     NetworkPlace(const QString& name, const QString& url, const QString& localPath);
 
     /// By name() alone, case sensitive.
@@ -59,6 +60,7 @@ private:
     QString m_localPath;
 };
 
+/// In the order of the service.
 using NetworkPlaceList = QList<NetworkPlace>;
 
 /// NetworkPlace::toDBusArgument() and NetworkPlace::fromDBusArgument(). @{

@@ -33,9 +33,9 @@ public:
     bool isValid() const;
 
     QString workgroup() const; ///< Empty when the URL names none.
-    QString host() const;
-    QString share() const;
-    QString tailPath() const; ///< What stands behind the share and its slash.
+    QString host() const;      ///< Empty when the URL names none.
+    QString share() const;     ///< Empty when the URL names none.
+    QString tailPath() const;  ///< What stands behind the share and its slash.
 
     /// Makes the URL valid, even with an empty text. @{
     void setWorkgroup(const QString& workgroup);

@@ -19,6 +19,7 @@ namespace VeyFM {
  */
 struct StorageDeviceInfo
 {
+    /// What the service sent at this position. @{
     QString text1;
     QString text2;
     QString text3;
@@ -35,8 +36,9 @@ struct StorageDeviceInfo
     bool flag2 = false;
     quint64 number3 = 0;
     quint64 number4 = 0;
+    /// @}
     bool localFlag = false; ///< Goes with copies and does not cross the bus.
-    quint64 number5 = 0;
+    quint64 number5 = 0;    ///< What the service sent at the last position.
 };
 
 /**

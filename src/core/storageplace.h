@@ -44,12 +44,14 @@ public:
 
     /// All texts null, type 0, nothing set but isMountable().
     StoragePlace();
-    StoragePlace(const StoragePlace& other);
-    StoragePlace(StoragePlace&& other) noexcept;
     virtual ~StoragePlace();
 
+    /// Copies are independent records of one device. @{
+    StoragePlace(const StoragePlace& other);
+    StoragePlace(StoragePlace&& other) noexcept;
     StoragePlace& operator=(const StoragePlace& other);
     StoragePlace& operator=(StoragePlace&& other) noexcept;
+    /// @}
 
     /// By udi() alone, as QString compares: by UTF-16 code units, case sensitive. @{
     bool operator==(const StoragePlace& other) const;
@@ -102,6 +104,7 @@ private:
     Type m_type = StorageTypeNone;
 };
 
+/// In the order of the service.
 using StoragePlaceList = QList<StoragePlace>;
 
 /// StoragePlace::toDBusArgument() and StoragePlace::fromDBusArgument(). @{

@@ -35,6 +35,7 @@ class VEYFMVFS_EXPORT Job : public QObject
     Q_OBJECT
 
 public:
+    /// A job with nothing done yet.
     explicit Job(QObject* parent = nullptr);
     ~Job() override;
 
@@ -85,6 +86,7 @@ protected:
     /// For a subclass with a longer private part, which the job takes over.
     Job(JobPrivate& dd, QObject* parent);
 
+    /// What the job keeps.
     std::unique_ptr<JobPrivate> const d_ptr;
 
 private:

@@ -30,6 +30,7 @@ public:
     ~StoragePlaceJob() override;
 
 protected:
+    /// For @p place, through @p interface, which may be null or gone.
     StoragePlaceJob(
         const StoragePlace& place, const QSharedPointer<QDBusInterface>& interface,
         QObject* parent);
@@ -38,6 +39,7 @@ protected:
     void request(const QString& method);
 
 protected Q_SLOTS:
+    /// Ends the job by the service's reply.
     void callFinishedSlot(QDBusPendingCallWatcher* call);
 
 private:
@@ -52,6 +54,7 @@ class VEYFMVFS_EXPORT StoragePlaceMountJob : public StoragePlaceJob
     Q_OBJECT
 
 public:
+    /// Sends nothing before start().
     StoragePlaceMountJob(
         const StoragePlace& place, const QSharedPointer<QDBusInterface>& interface,
         QObject* parent = nullptr);
@@ -64,6 +67,7 @@ class VEYFMVFS_EXPORT StoragePlaceUnmountJob : public StoragePlaceJob
     Q_OBJECT
 
 public:
+    /// Sends nothing before start().
     StoragePlaceUnmountJob(
         const StoragePlace& place, const QSharedPointer<QDBusInterface>& interface,
         QObject* parent = nullptr);
@@ -76,6 +80,7 @@ class VEYFMVFS_EXPORT StoragePlaceEjectJob : public StoragePlaceJob
     Q_OBJECT
 
 public:
+    /// Sends nothing before start().
     StoragePlaceEjectJob(
         const StoragePlace& place, const QSharedPointer<QDBusInterface>& interface,
         QObject* parent = nullptr);

@@ -27,13 +27,16 @@ public:
     ~VFSStorageJob() override;
 
 protected:
+    /// For the device of @p entry. The manager is not owned.
     VFSStorageJob(const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent);
 
+    /// What makes the job for the record.
     using Factory = Job* (StoragePlacesManagerProxy::*)(const StoragePlace&);
     /// Ends with code 1 and @p refusal when the entry is no storage place.
     void run(Factory makeJob, const QString& refusal);
 
 protected Q_SLOTS:
+    /// Passes the result of the inner job on.
     void storageJobFinished(Job* job);
 
 private:
@@ -47,6 +50,7 @@ class VEYFMVFS_EXPORT VFSStorageMountJob : public VFSStorageJob
     Q_OBJECT
 
 public:
+    /// Looks at nothing before start(). The manager is not owned.
     VFSStorageMountJob(
         const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent = nullptr);
     void start() override;
@@ -58,6 +62,7 @@ class VEYFMVFS_EXPORT VFSStorageUnmountJob : public VFSStorageJob
     Q_OBJECT
 
 public:
+    /// Looks at nothing before start(). The manager is not owned.
     VFSStorageUnmountJob(
         const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent = nullptr);
     void start() override;
@@ -69,6 +74,7 @@ class VEYFMVFS_EXPORT VFSStorageEjectJob : public VFSStorageJob
     Q_OBJECT
 
 public:
+    /// Looks at nothing before start(). The manager is not owned.
     VFSStorageEjectJob(
         const Entry& entry, StoragePlacesManagerProxy* manager, QObject* parent = nullptr);
     void start() override;

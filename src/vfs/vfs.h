@@ -64,6 +64,7 @@ public:
         SkipSymLinks = 1,     ///< Leave out the symbolic links of the directory.
         WithExtraChildren = 2 ///< Add the extra children of the entry. There never are any.
     };
+    /// Any of EntryChildFilter together.
     Q_DECLARE_FLAGS(EntryChildFilters, EntryChildFilter)
 
     /**
@@ -126,9 +127,9 @@ public:
     Entry entry(const QString& path) const;
 
     /**
-     * Drops `.`, `..`, doubled slashes and place sections that only lead to the next place.
+     * Drops ".", "..", doubled slashes and place sections that only lead to the next place.
      * Stepping up from a top-level directory leaves the notation of the file system:
-     * `/usr/../etc` becomes "File System/etc".
+     * "/usr/../etc" becomes "File System/etc".
      */
     QString normalizePath(const QString& path) const;
 

@@ -34,6 +34,7 @@ class VEYFMVFS_EXPORT EntryWatcher : public QObject
     Q_OBJECT
 
 public:
+    /// Watches nothing yet. VFS has one; a host needs no other.
     explicit EntryWatcher(QObject* parent = nullptr);
     ~EntryWatcher() override;
 
@@ -76,12 +77,16 @@ Q_SIGNALS:
     void entryReset(Entry entry);             ///< @p entry is to be read again from scratch.
 
 protected Q_SLOTS:
+    /// Emits entryReset(), when enabled; without @p anyWay only for what somebody watches.
     void entryChangedNotify(Entry entry, bool anyWay = false);
+    /// Forgets a local path whose watch the kernel ended.
     void unregisterPath(QString path);
+    /// News of the kernel about @p fileName in a watched @p path, or about the path itself. @{
     void slotPathCreated(QString path, QString fileName);
     void slotPathDeleted(QString path, QString fileName);
     void slotPathChanged(QString path, QString fileName);
     void slotPathAttributesChanged(QString path, QString fileName);
+    /// @}
 
 private:
     friend class VFS;

@@ -39,6 +39,7 @@ class VEYFMVFS_EXPORT InotifyWatcher : public QObject
     Q_OBJECT
 
 public:
+    /// Watches nothing yet.
     explicit InotifyWatcher(QObject* parent = nullptr);
 
     /// Ends all watches. pathUnregistered() is not emitted.
