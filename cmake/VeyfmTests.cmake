@@ -1,13 +1,37 @@
 # SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 # SPDX-License-Identifier: LGPL-2.1-or-later
 
+# What the sanitizers are told in every test. Each ends a test at its first finding.
+set(VEYFM_TEST_ENVIRONMENT)
+set(support ${PROJECT_SOURCE_DIR}/tests/support)
+if(VEYFM_SANITIZE MATCHES address)
+    # The slow unwinder, because the fast one ends at the first frame of libc or Qt, and who
+    # opened a leaked directory would not be seen.
+    list(APPEND VEYFM_TEST_ENVIRONMENT
+        "ASAN_OPTIONS=fast_unwind_on_malloc=0:detect_stack_use_after_return=1:strict_string_checks=1"
+        "LSAN_OPTIONS=suppressions=${support}/lsan.supp:print_suppressions=0"
+    )
+endif()
+if(VEYFM_SANITIZE MATCHES undefined)
+    list(APPEND VEYFM_TEST_ENVIRONMENT "UBSAN_OPTIONS=print_stacktrace=1")
+endif()
+if(VEYFM_SANITIZE MATCHES thread)
+    list(APPEND VEYFM_TEST_ENVIRONMENT
+        "TSAN_OPTIONS=suppressions=${support}/tsan.supp:halt_on_error=1:second_deadlock_stack=1"
+    )
+endif()
+
 # veyfm_add_test(<topic> [LABELS <label>...] [LIBRARIES <target>...] [SOURCES <file>...])
 #
 # Builds tst_<topic> from tst_<topic>.cpp and registers it with ctest. Each test gets a home,
 # XDG folders and a session bus address of its own, so that tests may run side by side and a
-# user's settings never reach them.
+# user's settings never reach them. A test that uses threads has the label "threads": the thread
+# sanitizer builds and runs only those.
 function(veyfm_add_test topic)
     cmake_parse_arguments(ARG "" "" "LABELS;LIBRARIES;SOURCES" ${ARGN})
+    if(VEYFM_SANITIZE MATCHES thread AND NOT "threads" IN_LIST ARG_LABELS)
+        return()
+    endif()
     set(name tst_${topic})
     set(home ${CMAKE_CURRENT_BINARY_DIR}/home/${topic})
     add_executable(${name} ${name}.cpp ${ARG_SOURCES})
@@ -16,8 +40,18 @@ function(veyfm_add_test topic)
     file(MAKE_DIRECTORY ${home}/run)
     file(CHMOD ${home}/run PERMISSIONS OWNER_READ OWNER_WRITE OWNER_EXECUTE)
     add_test(NAME ${topic} COMMAND ${name})
+    set(environment
+        ${VEYFM_TEST_ENVIRONMENT}
+        HOME=${home}
+        XDG_CONFIG_HOME=${home}/.config
+        XDG_DATA_HOME=${home}/.local/share
+        XDG_CACHE_HOME=${home}/.cache
+        XDG_RUNTIME_DIR=${home}/run
+        DBUS_SESSION_BUS_ADDRESS=unix:path=/nonexistent/bus
+        LC_ALL=C.UTF-8
+    )
     set_tests_properties(${topic} PROPERTIES
-        ENVIRONMENT "${VEYFM_TEST_ENVIRONMENT};HOME=${home};XDG_CONFIG_HOME=${home}/.config;XDG_DATA_HOME=${home}/.local/share;XDG_CACHE_HOME=${home}/.cache;XDG_RUNTIME_DIR=${home}/run;DBUS_SESSION_BUS_ADDRESS=unix:path=/nonexistent/bus;LC_ALL=C.UTF-8"
+        ENVIRONMENT "${environment}"
         TIMEOUT 120
         LABELS "${ARG_LABELS}"
     )
