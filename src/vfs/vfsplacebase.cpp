@@ -8,6 +8,7 @@
 #include <QObject>
 
 #include <algorithm>
+#include <iterator>
 
 namespace VeyFM {
 
@@ -26,10 +27,21 @@ QStringView parentPath(const QString& path)
 
 auto holds(const Entry& entry)
 {
-    return [&entry](const Node& node) { return node->entry == entry; };
+    return [&entry](const auto& child) {
+        return child.second->entry == entry;
+    };
 }
 
 } // namespace
+
+VFSPlaceBasePrivate::~VFSPlaceBasePrivate()
+{
+    // While the map still holds every place, so that no chain of places goes down in one
+    // recursion, and no circle stays.
+    for (const auto& [path, node] : placeNodes) {
+        node->children.clear();
+    }
+}
 
 Node VFSPlaceBasePrivate::node(const QString& path) const
 {
@@ -56,6 +68,9 @@ bool VFSPlaceBasePrivate::isPending(const QString& path) const
 
 void VFSPlaceBasePrivate::createIfPendingPlace(QStringView path) const
 {
+    if (pendingCount.load(std::memory_order_acquire) == 0) {
+        return;
+    }
     PendingPlace place;
     {
         const ContainerLocker locker(containerLock);
@@ -66,6 +81,7 @@ void VFSPlaceBasePrivate::createIfPendingPlace(QStringView path) const
         // Taken out first: the slot, and whoever it calls, finds the place fired already.
         place = std::move(found->second);
         pendingPlaces.erase(found);
+        pendingCount.store(pendingPlaces.size(), std::memory_order_release);
     }
     if (QObject* const receiver = place.receiver.data()) {
         QMetaObject::invokeMethod(
@@ -80,11 +96,22 @@ bool VFSPlaceBasePrivate::link(const Entry& entry, const Node& place)
         // No place: it belongs to this parent alone, and may do so several times.
         child = Node::create();
         child->entry = entry;
-    } else if (child->parents.contains(place)) {
+    }
+    auto& parents = child->parents;
+    // Parents that are gone count for nothing, and would only gather.
+    const auto isGone = [](const ParentLink& link) {
+        return link.parent.isNull();
+    };
+    parents.erase(std::remove_if(parents.begin(), parents.end(), isGone), parents.end());
+    const auto isHere = [&place](const ParentLink& link) {
+        return link.parent == place;
+    };
+    if (std::any_of(parents.cbegin(), parents.cend(), isHere)) {
         return false;
     }
-    place->children.append(child);
-    child->parents.append(place);
+    const quint64 number = place->nextNumber++;
+    place->children.emplace_hint(place->children.end(), number, child);
+    parents.push_back({place, number});
     return true;
 }
 
@@ -121,6 +148,7 @@ Entry VFSPlaceBase::createPendingPlace(
         const ContainerLocker locker(d->containerLock);
         d->pendingPlaces.insert_or_assign(
             path, VFSPlaceBasePrivate::PendingPlace{path, type, receiver, slot});
+        d->pendingCount.store(d->pendingPlaces.size(), std::memory_order_release);
     }
     return createPlace(path, type, QString());
 }
@@ -158,9 +186,15 @@ bool VFSPlaceBase::removeEntryFromPlace(const Entry& entry, const Entry& place)
     if (found == children.end()) {
         return false;
     }
-    const Node child = *found;
+    const Node child = found->second;
     children.erase(found);
-    child->parents.removeOne(parent);
+    auto& parents = child->parents;
+    const auto link = std::find_if(parents.begin(), parents.end(), [&parent](const auto& other) {
+        return other.parent == parent;
+    });
+    if (link != parents.end()) {
+        parents.erase(link);
+    }
     return true;
 }
 
@@ -184,15 +218,16 @@ bool VFSPlaceBase::destroyPlace(const Entry& place)
             const ContainerLocker containerLocker(d->containerLock);
             d->placeNodes.erase(path);
         }
-        for (const auto& link : qAsConst(node->parents)) {
-            if (const Node parent = link.toStrongRef()) {
-                parent->children.removeOne(node);
+        for (const auto& link : node->parents) {
+            if (const Node parent = link.parent.toStrongRef()) {
+                parent->children.erase(link.number);
                 hadParent = true; // Of any living parent, even one that has been cleared.
             }
         }
     }
     const ContainerLocker containerLocker(d->containerLock);
     d->pendingPlaces.erase(path);
+    d->pendingCount.store(d->pendingPlaces.size(), std::memory_order_release);
     return hadParent;
 }
 
@@ -244,8 +279,8 @@ EntryList VFSPlaceBase::childEntries(const Entry& place) const
     const QString path = place.path();
     d->createIfPendingPlace(path);
     if (const Node node = d->node(path)) {
-        entries.reserve(node->children.size());
-        for (const Node& child : qAsConst(node->children)) {
+        entries.reserve(int(node->children.size()));
+        for (const auto& [number, child] : node->children) {
             entries.append(child->entry);
         }
     }
@@ -256,7 +291,7 @@ bool VFSPlaceBase::hasChilds(const Entry& place) const
 {
     const PlaceLocker locker(d->placeLock);
     const Node node = d->node(place);
-    return node && (!node->children.isEmpty() || d->isPending(place.path()));
+    return node && (!node->children.empty() || d->isPending(place.path()));
 }
 
 bool VFSPlaceBase::placeHasChildEntry(const Entry& place, const Entry& child) const
@@ -284,7 +319,7 @@ int VFSPlaceBase::placeOrderIndex(const Entry& child, const Entry& parent)
     const auto& children = node->children;
     const auto found = std::find_if(children.cbegin(), children.cend(), holds(child));
     // A stranger and the first child are not told apart.
-    return found == children.cend() ? 0 : int(found - children.cbegin());
+    return found == children.cend() ? 0 : int(std::distance(children.cbegin(), found));
 }
 
 } // namespace VeyFM

@@ -7,14 +7,15 @@
 #include "core/entrylist.h"
 
 #include <QByteArray>
-#include <QList>
 #include <QPointer>
 #include <QSharedPointer>
 #include <QStringView>
 #include <QWeakPointer>
 
+#include <atomic>
 #include <map>
 #include <mutex>
+#include <vector>
 
 namespace VeyFM {
 
@@ -30,14 +31,27 @@ namespace VeyFM {
 class VFSPlaceBasePrivate
 {
 public:
+    struct PlaceTreeNode;
+    using Node = QSharedPointer<PlaceTreeNode>;
+    /// Children by ascending number, which is the order in which they were added. A link is found
+    /// by its number, so that a place with many siblings goes as quickly as one with few.
+    using Children = std::map<quint64, Node>;
+
+    struct ParentLink
+    {
+        // Weak, so that a child keeps no parent alive.
+        QWeakPointer<PlaceTreeNode> parent;
+        quint64 number;
+    };
+
     struct PlaceTreeNode
     {
         Entry entry;
-        // Weak, so that a child keeps no parent alive.
-        QList<QWeakPointer<PlaceTreeNode>> parents;
-        QList<QSharedPointer<PlaceTreeNode>> children;
+        std::vector<ParentLink> parents;
+        Children children;
+        // Never used again, so that the link of a child that was dropped finds no other child.
+        quint64 nextNumber = 0;
     };
-    using Node = QSharedPointer<PlaceTreeNode>;
 
     struct PendingPlace
     {
@@ -47,9 +61,26 @@ public:
         QByteArray slot;
     };
 
-    // Looked up by views as well, so that the path one level above need not be copied.
-    template<typename Value>
-    using ByPath = std::map<QString, Value, std::less<>>;
+    /// QString's order, by code units. Transparent, so that the path one level above need not be
+    /// copied, and in line as far as the first unit, which tells an absolute path from a place.
+    struct PathLess
+    {
+        using is_transparent = void;
+        bool operator()(QStringView left, QStringView right) const
+        {
+            if (left.isEmpty() || right.isEmpty()) {
+                return left.size() < right.size();
+            }
+            const ushort first = left.front().unicode();
+            const ushort other = right.front().unicode();
+            return first != other ? first < other : left.compare(right) < 0;
+        }
+    };
+
+    template <typename Value>
+    using ByPath = std::map<QString, Value, PathLess>;
+
+    ~VFSPlaceBasePrivate();
 
     /// The node of a place, or null. With placeLock held.
     Node node(const QString& path) const;
@@ -61,13 +92,15 @@ public:
     bool isPending(const QString& path) const;
     void createIfPendingPlace(QStringView path) const;
     bool link(const Entry& entry, const Node& place);
-    QStringList parentPlacesHistory(QString path, const PlaceTreeNode& node) const;
+    QStringList parentPlacesHistory(QStringView path, const PlaceTreeNode& top) const;
 
     mutable std::recursive_mutex placeLock;
     mutable std::mutex containerLock;
     ByPath<Node> placeNodes;
     // Look-ups that are const take from it.
     mutable ByPath<PendingPlace> pendingPlaces;
+    // Its size, for a look without a lock.
+    mutable std::atomic<std::size_t> pendingCount{0};
 };
 
 } // namespace VeyFM

@@ -7,6 +7,10 @@
 #include "vfs/vfsplacebase_p.h"
 
 #include <QSet>
+#include <QVector>
+
+#include <algorithm>
+#include <vector>
 
 namespace VeyFM {
 
@@ -25,6 +29,14 @@ QStringView withoutTrailingSlashes(QStringView path)
     return path;
 }
 
+QStringView withoutLeadingSlashes(QStringView path)
+{
+    while (path.startsWith(slash)) {
+        path = path.mid(1);
+    }
+    return path;
+}
+
 } // namespace
 
 Entry VFSPlaceBase::checkAndGetParentPlace(const Entry& entry, const Entry& root) const
@@ -36,14 +48,14 @@ Entry VFSPlaceBase::checkAndGetParentPlace(const Entry& entry, const Entry& root
     }
     // Level by level, earlier siblings first. A node hangs below several others, and is looked at
     // once.
-    QList<VFSPlaceBasePrivate::PlaceTreeNode*> queue{top.data()};
+    QVector<const VFSPlaceBasePrivate::PlaceTreeNode*> queue{top.data()};
     QSet<const VFSPlaceBasePrivate::PlaceTreeNode*> queued{top.data()};
     for (int i = 0; i < queue.size(); ++i) {
-        for (const Node& child : qAsConst(queue.at(i)->children)) {
+        for (const auto& [number, child] : queue.at(i)->children) {
             if (child->entry == entry) {
                 return queue.at(i)->entry;
             }
-            if (!child->children.isEmpty() && !queued.contains(child.data())) {
+            if (!child->children.empty() && !queued.contains(child.data())) {
                 queued.insert(child.data());
                 queue.append(child.data());
             }
@@ -81,7 +93,8 @@ QString VFSPlaceBase::placeRelatedPath(const QString& localPath) const
         if ((best ? best->m_localPath.size() : 0) >= local.size()) {
             continue;
         }
-        if (path.startsWith(local) && (path.size() == local.size() || path[local.size()] == slash)) {
+        if (path.startsWith(local) &&
+            (path.size() == local.size() || path[local.size()] == slash)) {
             best = &node->entry;
             rest = path.mid(std::min(local.size() + 1, path.size()));
         }
@@ -116,33 +129,59 @@ VFSPlaceBase::exploreParentPlacesHistory(const QString& path, const QString& pla
 }
 
 QStringList
-VFSPlaceBasePrivate::parentPlacesHistory(QString path, const PlaceTreeNode& node) const
+VFSPlaceBasePrivate::parentPlacesHistory(QStringView path, const PlaceTreeNode& top) const
 {
+    struct Step
+    {
+        const PlaceTreeNode* node;
+        Children::const_iterator next;
+    };
+    std::vector<Step> way;
+    // What has been gone into with the path as it is now: a second time would find no more.
+    QSet<const PlaceTreeNode*> seen;
+    const auto enter = [&](const PlaceTreeNode& node) {
+        if (!seen.contains(&node)) {
+            seen.insert(&node);
+            way.push_back({&node, node.children.cbegin()});
+        }
+    };
+
     QStringList history;
-    for (const Node& child : node.children) {
+    Node lastMatch;
+    enter(top);
+    while (!way.empty()) {
+        Step& step = way.back();
+        if (step.next == step.node->children.cend()) {
+            way.pop_back();
+            continue;
+        }
+        const Node child = (step.next++)->second;
         const QString childPath = child->entry.path();
         // Plain text, not sections: "Home" also leads to "Homework/x". That is meant.
-        if (path.startsWith(childPath)) {
-            history.append(node.entry.path());
-            path.remove(0, childPath.size());
-            int slashes = 0;
-            while (slashes < path.size() && path[slashes] == slash) {
-                ++slashes;
+        if (!path.startsWith(childPath)) {
+            if (!child->children.empty()) {
+                enter(*child);
             }
-            path.remove(0, slashes);
-            if (path.isEmpty()) {
-                return history;
-            }
-            const QStringList deeper = parentPlacesHistory(path, *child);
-            history += deeper.isEmpty() ? QStringList(childPath) : deeper;
+            continue;
+        }
+        for (const Step& above : way) {
+            history.append(above.node->entry.path());
+        }
+        const auto sizeBefore = path.size();
+        path = withoutLeadingSlashes(path.mid(childPath.size()));
+        if (path.isEmpty()) {
             return history;
         }
-        const QStringList deeper = parentPlacesHistory(path, *child);
-        if (!deeper.isEmpty()) {
-            history.append(node.entry.path());
-            history += deeper;
-            return history;
+        // The first match counts, wherever it leads: there is no way back from it.
+        way.clear();
+        if (path.size() != sizeBefore) {
+            seen.clear();
         }
+        lastMatch = child;
+        enter(*child);
+    }
+    if (lastMatch) {
+        history.append(lastMatch->entry.path());
     }
     return history;
 }
