@@ -159,7 +159,13 @@ bool VFSPrivate::appendDirectory(
                 continue;
             }
             path = pathPrefix + decoded;
-            local = samePrefix ? path : localPrefix + decoded;
+            if (isValidName) {
+                local = samePrefix ? path : localPrefix + decoded;
+            } else {
+                // Decoded as a whole: a byte order mark, which the decoder drops from the head
+                // of a name, is a character within a path, and a link of that name is found.
+                local = QString::fromLocal8Bit(directory + name);
+            }
         }
 
         int type = TypeFile;
