@@ -19,9 +19,11 @@ void VFS::initialize()
         return;
     }
     auto* translator = new QTranslator(QCoreApplication::instance());
+    // The last argument is empty and not null: catalogues are called "libveyfmvfs_de", with no
+    // ".qm" behind.
     if (translator->load(
             QLocale::system(), QStringLiteral("libveyfmvfs"), QStringLiteral("_"),
-            QStringLiteral("/usr/share/veyfm/translations"), QString())) {
+            QStringLiteral("/usr/share/veyfm/translations"), QLatin1String(""))) {
         QCoreApplication::installTranslator(translator);
     }
     registerMetaTypes();
