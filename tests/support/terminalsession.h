@@ -1,0 +1,48 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TESTS_TERMINALSESSION_H
+#define VEYFM_TESTS_TERMINALSESSION_H
+
+#include <QByteArray>
+#include <QProcessEnvironment>
+#include <QString>
+#include <QStringList>
+
+#include <sys/types.h>
+
+/// A program on a pseudo-terminal that is its controlling terminal, as a person runs it.
+class TerminalSession
+{
+public:
+    /// @p directory is the working directory; lines come as they were written, without "\r".
+    TerminalSession(
+        const QString& program, const QStringList& arguments, const QString& directory,
+        const QProcessEnvironment& environment, int columns = 80);
+    /// Kills what still runs.
+    ~TerminalSession();
+
+    /// Types something.
+    void type(const QByteArray& keys);
+
+    /// Reads on until @p text has come; false when the program ends or takes too long.
+    bool waitFor(const QByteArray& text);
+
+    /// Reads to the end. The exit code, or -1 for a program that was killed or takes too long.
+    int waitForEnd();
+
+    /// All that has been read.
+    QByteArray output() const;
+
+private:
+    Q_DISABLE_COPY(TerminalSession)
+
+    enum class Read { Some, Nothing, End };
+    Read readOnce();
+
+    int m_master = -1;
+    pid_t m_pid = -1;
+    QByteArray m_output;
+};
+
+#endif

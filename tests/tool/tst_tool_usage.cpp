@@ -1,0 +1,221 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "support/toolrunner.h"
+
+#include <QFile>
+#include <QStandardPaths>
+#include <QTemporaryDir>
+#include <QTest>
+
+namespace {
+
+/// The verbs that the help shows.
+QStringList shownVerbs()
+{
+    QStringList verbs;
+    const QList<QByteArray> lines = runTool({QStringLiteral("--help")}).lines();
+    const int start = lines.indexOf("Commands:");
+    for (int i = start + 1; start >= 0 && i < lines.size() && lines.at(i).startsWith("  "); ++i)
+        verbs.append(QString::fromLatin1(lines.at(i).mid(2).split(' ').constFirst()));
+    return verbs;
+}
+
+} // namespace
+
+class ToolUsageTest : public QObject
+{
+    Q_OBJECT
+
+private Q_SLOTS:
+    void helpShowsAllVerbs();
+    void verbHelp_data();
+    void verbHelp();
+    void version();
+    void wrongUsage_data();
+    void wrongUsage();
+    void helpOfUnknownVerbFails();
+    void dashesEndOptions();
+    void outputErrorsAreTold();
+    void libraryMessagesAreShownOnRequest();
+    void manualPageIsClean();
+    void manualPageNamesEveryOption();
+};
+
+void ToolUsageTest::helpShowsAllVerbs()
+{
+    const ToolResult result = runTool({QStringLiteral("--help")});
+    QCOMPARE(result.exitCode, 0);
+    QVERIFY(result.err.isEmpty());
+    QCOMPARE(
+        shownVerbs(), QStringList(
+                          {QStringLiteral("list"), QStringLiteral("tree"), QStringLiteral("info"),
+                           QStringLiteral("monitor"), QStringLiteral("parent"),
+                           QStringLiteral("resolve"), QStringLiteral("help")}));
+    QCOMPARE(runTool({QStringLiteral("-h")}).out, result.out);
+    QCOMPARE(runTool({QStringLiteral("help")}).out, result.out);
+}
+
+void ToolUsageTest::verbHelp_data()
+{
+    QTest::addColumn<QString>("verb");
+    QStringList verbs = shownVerbs();
+    QVERIFY(!verbs.isEmpty());
+    verbs.append(QStringLiteral("complete"));
+    for (const QString& verb : qAsConst(verbs))
+        QTest::newRow(qPrintable(verb)) << verb;
+}
+
+void ToolUsageTest::verbHelp()
+{
+    QFETCH(const QString, verb);
+    const ToolResult result = runTool({verb, QStringLiteral("--help")});
+    QCOMPARE(result.exitCode, 0);
+    QVERIFY(result.err.isEmpty());
+    QVERIFY(result.out.startsWith("Usage:\n  veyfm-vfs " + verb.toLatin1() + " [OPTION...]"));
+    QVERIFY(result.out.contains("--version"));
+    QCOMPARE(runTool({verb, QStringLiteral("-h")}).out, result.out);
+    QCOMPARE(runTool({QStringLiteral("help"), verb}).out, result.out);
+    const QList<QByteArray> lines = result.lines();
+    for (const QByteArray& line : lines)
+        QVERIFY2(line.size() <= 100, line.constData());
+}
+
+void ToolUsageTest::version()
+{
+    const ToolResult result = runTool({QStringLiteral("--version")});
+    QCOMPARE(result.exitCode, 0);
+    QVERIFY(result.out.startsWith("veyfm-vfs "));
+    QCOMPARE(result.lines().size(), 1);
+    QStringList verbs = shownVerbs();
+    for (const QString& verb : qAsConst(verbs)) {
+        const ToolResult same = runTool({verb, QStringLiteral("--version")});
+        QCOMPARE(same.exitCode, 0);
+        QCOMPARE(same.out, result.out);
+    }
+}
+
+void ToolUsageTest::wrongUsage_data()
+{
+    QTest::addColumn<QStringList>("arguments");
+    QTest::addColumn<QByteArray>("message");
+
+    const auto row = [](const char* line, const char* message) {
+        QTest::newRow(line) << QString::fromLatin1(line).split(QLatin1Char(' '), Qt::SkipEmptyParts)
+                            << QByteArray(message);
+    };
+    row("", "veyfm-vfs: usage: a command is missing\n");
+    row("frobnicate", "veyfm-vfs: usage: frobnicate: no such command\n");
+    row("--json", "veyfm-vfs: usage: --json: an option needs a command before it\n");
+    row("list --frobnicate", "veyfm-vfs: list: unknown option 'frobnicate'\n");
+    row("list -z", "veyfm-vfs: list: unknown option 'z'\n");
+    row("list --sort", "veyfm-vfs: list: missing value after '--sort'\n");
+    row("list --sort=colour",
+        "veyfm-vfs: list: 'colour' is no value of --sort, which takes name, size, time, none\n");
+    row("list --color=pink",
+        "veyfm-vfs: list: 'pink' is no value of --color, which takes auto, always, never\n");
+    row("list --json=yes", "veyfm-vfs: list: unexpected value after '--json'\n");
+    row("list --json -0", "veyfm-vfs: list: --json and --null exclude each other\n");
+    row("tree --depth", "veyfm-vfs: tree: missing value after '--depth'\n");
+    row("tree --depth=deep", "veyfm-vfs: tree: 'deep' is no value of --depth: not a number\n");
+    row("tree --depth=-1", "veyfm-vfs: tree: '-1' is no value of --depth: not a number\n");
+    row("tree -0", "veyfm-vfs: tree: unknown option '0'\n");
+    row("info", "veyfm-vfs: info: an operand is missing\n");
+    row("info -l /", "veyfm-vfs: info: unknown option 'l'\n");
+    row("monitor", "veyfm-vfs: monitor: an operand is missing\n");
+    row("monitor -x /", "veyfm-vfs: monitor: unknown option 'x'\n");
+    row("parent", "veyfm-vfs: parent: an operand is missing\n");
+    row("parent --root", "veyfm-vfs: parent: missing value after '--root'\n");
+    row("resolve", "veyfm-vfs: resolve: an operand is missing\n");
+    row("resolve -0 /", "veyfm-vfs: resolve: unknown option '0'\n");
+    row("help --json", "veyfm-vfs: help: unknown option 'json'\n");
+}
+
+void ToolUsageTest::wrongUsage()
+{
+    QFETCH(const QStringList, arguments);
+    QFETCH(const QByteArray, message);
+    const ToolResult result = runTool(arguments);
+    QCOMPARE(result.exitCode, 2);
+    QVERIFY(result.out.isEmpty());
+    const QList<QByteArray> lines = result.err.split('\n');
+    QCOMPARE(lines.constFirst() + '\n', message);
+    QVERIFY(lines.value(1).startsWith("Try 'veyfm-vfs "));
+}
+
+void ToolUsageTest::helpOfUnknownVerbFails()
+{
+    const ToolResult result =
+        runTool({QStringLiteral("help"), QStringLiteral("frobnicate"), QStringLiteral("list")});
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(result.err, QByteArray("veyfm-vfs: frobnicate: no such command\n"));
+    QVERIFY(result.out.contains("veyfm-vfs list"));
+}
+
+void ToolUsageTest::dashesEndOptions()
+{
+    QTemporaryDir directory;
+    QVERIFY(createFile(directory.path(), "--json"));
+    const ToolResult result = runTool(
+        {QStringLiteral("resolve"), QStringLiteral("--"), QStringLiteral("--json")},
+        directory.path());
+    QCOMPARE(result.exitCode, 0);
+    QVERIFY(result.out.contains("\nexists: yes\n"));
+}
+
+void ToolUsageTest::outputErrorsAreTold()
+{
+    const ToolResult result = runProgram(
+        QStringLiteral("/bin/sh"),
+        {QStringLiteral("-c"), QStringLiteral("exec \"$0\" tree >/dev/full"), toolPath()});
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(result.err, QByteArray("veyfm-vfs: standard output: No space left on device\n"));
+}
+
+void ToolUsageTest::libraryMessagesAreShownOnRequest()
+{
+    // There is no session bus in the tests; that is no concern of who looks at the tree.
+    const ToolResult result = runTool({QStringLiteral("tree")});
+    QCOMPARE(result.exitCode, 0);
+    QCOMPARE(result.err, QByteArray());
+    const ToolResult verbose = runTool({QStringLiteral("tree"), QStringLiteral("--verbose")});
+    QCOMPARE(verbose.exitCode, 0);
+    QCOMPARE(verbose.out, result.out);
+    QVERIFY(verbose.err.startsWith("veyfm-vfs: libveyfmvfs: "));
+}
+
+void ToolUsageTest::manualPageIsClean()
+{
+    if (QStandardPaths::findExecutable(QStringLiteral("groff")).isEmpty())
+        QSKIP("groff is not installed");
+    const ToolResult result = runProgram(
+        QStringLiteral("groff"),
+        {QStringLiteral("-man"), QStringLiteral("-Tutf8"), QStringLiteral("-ww"),
+         QStringLiteral("-Kutf8"), toolSource(QStringLiteral("veyfm-vfs.1"))});
+    QCOMPARE(result.exitCode, 0);
+    QCOMPARE(result.err, QByteArray());
+    QVERIFY(result.out.contains("VEYFM-VFS(1)"));
+}
+
+void ToolUsageTest::manualPageNamesEveryOption()
+{
+    QFile file(toolSource(QStringLiteral("veyfm-vfs.1")));
+    QVERIFY(file.open(QIODevice::ReadOnly));
+    const QByteArray page = file.readAll().replace("\\-", "-");
+    const QStringList verbs = shownVerbs();
+    for (const QString& verb : verbs) {
+        QVERIFY2(page.contains("\n.SS \"" + verb.toLatin1() + ' '), qPrintable(verb));
+        const ToolResult candidates =
+            runTool({QStringLiteral("complete"), QStringLiteral("--"), verb, QStringLiteral("--")});
+        const QList<QByteArray> options = candidates.out.split('\0');
+        QVERIFY(options.size() > 2);
+        for (QByteArray option : options) {
+            if (option.endsWith('='))
+                option.chop(1);
+            QVERIFY2(page.contains(option), option.constData());
+        }
+    }
+}
+
+QTEST_GUILESS_MAIN(ToolUsageTest)
+#include "tst_tool_usage.moc"

@@ -1,0 +1,136 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "output.h"
+
+#include "report.h"
+#include "terminal.h"
+
+#include <QJsonDocument>
+
+#include <cerrno>
+#include <unistd.h>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+constexpr int bufferSize = 64 * 1024;
+
+} // namespace
+
+Output::Output()
+    : m_terminal(::isatty(STDOUT_FILENO) == 1)
+{
+    setColour(QString());
+}
+
+Output::~Output()
+{
+    flush();
+}
+
+bool Output::isTerminal() const
+{
+    return m_terminal;
+}
+
+void Output::setNull(bool null)
+{
+    m_null = null;
+}
+
+void Output::setColour(const QString& when)
+{
+    if (when == QLatin1String("always"))
+        m_colour = true;
+    else if (when == QLatin1String("never"))
+        m_colour = false;
+    else
+        m_colour = m_terminal && environmentWantsColour();
+}
+
+bool Output::hasColour() const
+{
+    return m_colour;
+}
+
+void Output::write(const QByteArray& bytes)
+{
+    m_buffer += bytes;
+    if (m_buffer.size() >= bufferSize)
+        flush();
+}
+
+void Output::write(const QString& text)
+{
+    write(text.toLocal8Bit());
+}
+
+void Output::flush()
+{
+    const char* data = m_buffer.constData();
+    size_t left = size_t(m_buffer.size());
+    while (left > 0 && m_error == 0) {
+        const ssize_t written = ::write(STDOUT_FILENO, data, left);
+        if (written >= 0) {
+            data += written;
+            left -= size_t(written);
+        } else if (errno != EINTR) {
+            m_error = errno;
+        }
+    }
+    m_buffer.clear();
+}
+
+void Output::writeRecord(const QByteArray& bytes)
+{
+    write(bytes);
+    write(QByteArray(1, m_null ? '\0' : '\n'));
+}
+
+QByteArray Output::name(const QString& name) const
+{
+    return (m_terminal && !m_null ? escaped(name) : name).toLocal8Bit();
+}
+
+QByteArray Output::name(const QString& text, const Entry& entry) const
+{
+    return m_colour ? coloured(name(text), colourOf(entry)) : name(text);
+}
+
+QByteArray Output::label(const QString& text, const Entry& entry) const
+{
+    const QByteArray bytes = escaped(text).toLocal8Bit();
+    return m_colour ? coloured(bytes, colourOf(entry)) : bytes;
+}
+
+int Output::finish(int exitCode)
+{
+    flush();
+    if (m_error == 0)
+        return exitCode;
+    report(QStringLiteral("standard output"), systemReason(m_error));
+    return exitCode == 0 ? 1 : exitCode;
+}
+
+JsonArray::JsonArray(Output& output)
+    : m_output(output)
+{
+}
+
+void JsonArray::append(const QJsonObject& object)
+{
+    m_output.write(m_empty ? QByteArrayLiteral("[\n") : QByteArrayLiteral(",\n"));
+    m_output.write(QJsonDocument(object).toJson(QJsonDocument::Compact));
+    m_empty = false;
+}
+
+void JsonArray::end()
+{
+    m_output.write(m_empty ? QByteArrayLiteral("[]\n") : QByteArrayLiteral("\n]\n"));
+}
+
+} // namespace Tool
+} // namespace VeyFM

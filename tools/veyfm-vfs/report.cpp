@@ -1,0 +1,72 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "report.h"
+
+#include "terminal.h"
+
+#include <atomic>
+
+#include <cstring>
+#include <unistd.h>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+std::atomic<bool> verbose{false};
+
+void handleMessage(QtMsgType type, const QMessageLogContext& context, const QString& message)
+{
+    Q_UNUSED(context)
+    if (verbose || type == QtFatalMsg)
+        report(QStringLiteral("libveyfmvfs"), message);
+}
+
+void writeError(const QByteArray& bytes)
+{
+    // One call, so that lines of several processes do not mix; nobody to tell of a failure.
+    if (::write(STDERR_FILENO, bytes.constData(), size_t(bytes.size())) < 0)
+        return;
+}
+
+} // namespace
+
+QByteArray reportLine(const QString& what, const QString& why)
+{
+    return QStringLiteral("veyfm-vfs: %1: %2\n").arg(escaped(what), escaped(why)).toLocal8Bit();
+}
+
+void report(const QString& what, const QString& why)
+{
+    writeError(reportLine(what, why));
+}
+
+void say(const QString& line)
+{
+    writeError((line + QLatin1Char('\n')).toLocal8Bit());
+}
+
+QString systemReason(int error)
+{
+    return QString::fromLocal8Bit(std::strerror(error));
+}
+
+void setVerbose(bool on)
+{
+    verbose = on;
+}
+
+void installLogging()
+{
+    qInstallMessageHandler(handleMessage);
+}
+
+QString versionText()
+{
+    return QStringLiteral("veyfm-vfs " VEYFM_VERSION "\n");
+}
+
+} // namespace Tool
+} // namespace VeyFM

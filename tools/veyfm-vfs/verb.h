@@ -1,0 +1,60 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TOOL_VERB_H
+#define VEYFM_TOOL_VERB_H
+
+#include <QString>
+#include <QStringList>
+#include <QVector>
+
+namespace VeyFM {
+namespace Tool {
+
+class Invocation;
+
+/// How the program ends.
+enum ExitCode {
+    Done = 0,      ///< All that was asked for.
+    Failed = 1,    ///< Some of it failed; standard error says what and why.
+    WrongUsage = 2 ///< The command line makes no sense; nothing was done.
+};
+
+/// An option of a verb. One without a value name takes no value.
+struct Option
+{
+    QStringList names; ///< Without dashes, the short name first.
+    QString description;
+    QString valueName = {};
+    QStringList values = {}; ///< The only values it takes; empty for any.
+    bool isNumber = false;   ///< Whether it takes a number, from 0 on.
+};
+
+/// What the operands of a verb are, for the completion of command lines.
+enum class OperandKind {
+    Entries, ///< Places, paths and URLs.
+    Verbs    ///< Names of verbs.
+};
+
+/**
+ * A verb of the tool. A new one is a file in verbs/ with one function that returns this, and a
+ * line in verbs/verbs.cpp: parsing, help and completion are made from the description.
+ */
+struct Verb
+{
+    QString name;
+    QString operands; ///< As the usage line shows them.
+    QString summary;  ///< One line for the list of verbs.
+    QString details;  ///< Behind the usage line of the verb's own help.
+    OperandKind operandKind = OperandKind::Entries;
+    int leastOperands = 0;
+    bool printsData = true; ///< Whether it knows --json.
+    bool hidden = false;    ///< Whether help and completion pass over it.
+    QVector<Option> options = {};
+    int (*run)(Invocation& invocation) = nullptr; ///< Returns an ExitCode.
+};
+
+} // namespace Tool
+} // namespace VeyFM
+
+#endif

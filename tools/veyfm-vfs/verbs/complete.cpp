@@ -1,0 +1,171 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "commandline.h"
+#include "describe.h"
+#include "locate.h"
+#include "verbs/verbs.h"
+#include "vfs/vfs.h"
+
+#include <QDir>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+/// The fixed places, so far as they exist: the first sections of paths through places.
+EntryList fixedPlaces()
+{
+    const VFS& vfs = *VFS::ptr();
+    EntryList places;
+    const Entry all[] = {
+        vfs.favouritesEntry(), vfs.computerEntry(),    vfs.homeEntry(),
+        vfs.desktopEntry(),    vfs.trashEntry(),       vfs.fileSystemEntry(),
+        vfs.placesEntry(),     vfs.networkEntry(),     vfs.sambaNetworkEntry(),
+        vfs.ftpNetworkEntry(), vfs.sftpNetworkEntry(), vfs.storageDevicesEntry(),
+    };
+    for (const Entry& place : all) {
+        if (!place.isNull())
+            places.append(place);
+    }
+    return places;
+}
+
+/// Texts behind @p typed that name one of the entries. The slash invites the next section.
+void addEntries(
+    QStringList& candidates, const EntryList& entries, const QString& typed, const QString& start)
+{
+    for (const Entry& entry : entries) {
+        const QString name = shownName(entry);
+        if (!name.startsWith(start))
+            continue;
+        const bool hidden = entry.isHidden() && !entry.isPlace();
+        if (hidden && !start.startsWith(QLatin1Char('.')))
+            continue;
+        const bool leadsOn = entry.isPlace() || entry.isDir();
+        candidates.append(typed + name + (leadsOn ? QStringLiteral("/") : QString()));
+    }
+}
+
+QStringList entryCandidates(const QString& word)
+{
+    QStringList candidates;
+    const int slash = word.lastIndexOf(QLatin1Char('/'));
+    const QString typed = word.left(slash + 1);
+    const QString start = word.mid(slash + 1);
+    if (typed.isEmpty())
+        addEntries(candidates, fixedPlaces(), typed, start);
+
+    // The shell hands over a tilde as it was typed.
+    QString directory = typed.isEmpty() ? QStringLiteral(".") : typed;
+    if (directory.startsWith(QLatin1String("~/")))
+        directory.replace(0, 1, QDir::homePath());
+    const Entry entry = resolveText(directory).entry;
+    if (!entry.isNull() && !opensOnFirstLook(entry))
+        addEntries(candidates, VFS::ptr()->childs(entry), typed, start);
+    return candidates;
+}
+
+QStringList verbCandidates(const QString& word)
+{
+    QStringList candidates;
+    for (const Verb& verb : verbs()) {
+        if (!verb.hidden && verb.name.startsWith(word))
+            candidates.append(verb.name);
+    }
+    return candidates;
+}
+
+QString withDashes(const QString& name)
+{
+    return (name.size() == 1 ? QStringLiteral("-") : QStringLiteral("--")) + name;
+}
+
+QStringList optionCandidates(const QVector<Option>& options, const QString& word)
+{
+    QStringList candidates;
+    for (const Option& option : options) {
+        const QString text = withDashes(option.names.constLast());
+        const QString behind = option.valueName.isEmpty() ? QString() : QStringLiteral("=");
+        if (!word.contains(QLatin1Char('=')) && text.startsWith(word))
+            candidates.append(text + behind);
+        for (const QString& value : option.values) {
+            const QString whole = text + QLatin1Char('=') + value;
+            if (word.startsWith(text + QLatin1Char('=')) && whole.startsWith(word))
+                candidates.append(whole);
+        }
+    }
+    return candidates;
+}
+
+/// The values of the option that @p before names, where it waits for one.
+const Option* optionWaiting(const QVector<Option>& options, const QString& before)
+{
+    for (const Option& option : options) {
+        for (const QString& name : option.names) {
+            if (!option.valueName.isEmpty() && before == withDashes(name))
+                return &option;
+        }
+    }
+    return nullptr;
+}
+
+QStringList candidatesFor(const QStringList& words)
+{
+    const QString word = words.isEmpty() ? QString() : words.constLast();
+    if (words.size() < 2) {
+        if (!word.startsWith(QLatin1Char('-')))
+            return verbCandidates(word);
+        return QStringList({QStringLiteral("--help"), QStringLiteral("--version")}).filter(word);
+    }
+    const Verb* verb = findVerb(words.constFirst());
+    if (!verb)
+        return {};
+    const QVector<Option> options = allOptions(*verb);
+    const QStringList before = words.mid(1, words.size() - 2);
+    const bool optionsEnded = before.contains(QStringLiteral("--"));
+    if (!optionsEnded && !before.isEmpty()) {
+        const Option* waiting = optionWaiting(options, before.constLast());
+        if (waiting && waiting->isNumber)
+            return {};
+        if (waiting && !waiting->values.isEmpty()) {
+            QStringList values;
+            for (const QString& value : waiting->values) {
+                if (value.startsWith(word))
+                    values.append(value);
+            }
+            return values;
+        }
+    }
+    if (!optionsEnded && word.startsWith(QLatin1Char('-')))
+        return optionCandidates(options, word);
+    return verb->operandKind == OperandKind::Verbs ? verbCandidates(word) : entryCandidates(word);
+}
+
+int run(Invocation& invocation)
+{
+    QStringList candidates = candidatesFor(invocation.operands());
+    candidates.removeDuplicates();
+    for (const QString& candidate : qAsConst(candidates))
+        invocation.output().write(candidate.toLocal8Bit() + '\0');
+    return Done;
+}
+
+} // namespace
+
+Verb completeVerb()
+{
+    Verb verb;
+    verb.name = QStringLiteral("complete");
+    verb.operands = QStringLiteral("-- [WORD...]");
+    verb.summary = QStringLiteral("Print what may stand for the last word of a command line");
+    verb.details = QStringLiteral("For the shells. Each candidate ends with a NUL byte.");
+    verb.printsData = false;
+    verb.hidden = true;
+    verb.run = run;
+    return verb;
+}
+
+} // namespace Tool
+} // namespace VeyFM

@@ -1,0 +1,46 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "commandline.h"
+#include "report.h"
+#include "verbs/verbs.h"
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+int run(Invocation& invocation)
+{
+    const QStringList names = invocation.operands();
+    if (names.isEmpty())
+        invocation.output().write(generalHelp());
+    int exitCode = Done;
+    for (const QString& name : names) {
+        const Verb* verb = findVerb(name);
+        if (verb) {
+            invocation.output().write(verbHelp(*verb));
+        } else {
+            report(name, QStringLiteral("no such command"));
+            exitCode = Failed;
+        }
+    }
+    return exitCode;
+}
+
+} // namespace
+
+Verb helpVerb()
+{
+    Verb verb;
+    verb.name = QStringLiteral("help");
+    verb.operands = QStringLiteral("[COMMAND...]");
+    verb.summary = QStringLiteral("Show help");
+    verb.operandKind = OperandKind::Verbs;
+    verb.printsData = false;
+    verb.run = run;
+    return verb;
+}
+
+} // namespace Tool
+} // namespace VeyFM

@@ -1,0 +1,169 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "commandline.h"
+#include "describe.h"
+#include "interrupt.h"
+#include "locate.h"
+#include "report.h"
+#include "verbs/verbs.h"
+#include "vfs/vfs.h"
+#include "watch/entrywatcher.h"
+
+#include <QCoreApplication>
+#include <QJsonDocument>
+#include <QSet>
+
+#include <cerrno>
+#include <signal.h>
+#include <sys/inotify.h>
+#include <unistd.h>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+/// The name in front of any child's own name; empty for what has no children.
+QString childPrefix(const Entry& entry)
+{
+    const QString name = QStringLiteral("x");
+    const Entry child = VFS::ptr()->child(entry, name);
+    if (!child.isNull())
+        return child.path().chopped(name.size());
+    return entry.isPlace() ? entry.path() + QLatin1Char('/') : QString();
+}
+
+/// Why the kernel would not watch the entry. The library does not tell, so it is tried out.
+QString whyUnwatchable(const Entry& entry)
+{
+    const QString local = entry.localPath();
+    if (local.isEmpty())
+        return entry.isPlace() ? QString() : QStringLiteral("nothing on the disk to watch");
+    if (!VFS::ptr()->entryWatcher()->isRefreshable(local))
+        return QStringLiteral("what lies below /proc, /dev, /sys and /var is never watched");
+    const int descriptor = ::inotify_init1(IN_CLOEXEC);
+    int error = descriptor < 0 ? errno : 0;
+    if (error == 0 &&
+        ::inotify_add_watch(
+            descriptor, local.toLocal8Bit().constData(), IN_CLOSE_WRITE | IN_DONT_FOLLOW) < 0)
+        error = errno;
+    if (descriptor >= 0)
+        ::close(descriptor);
+    if (error == ENOSPC)
+        return QStringLiteral("no more watches: see /proc/sys/fs/inotify/max_user_watches");
+    if (error == EMFILE)
+        return QStringLiteral("no more watchers: see /proc/sys/fs/inotify/max_user_instances");
+    return error == 0 ? QString() : systemReason(error);
+}
+
+/**
+ * Prints the news of the watched entries.
+ *
+ * The watcher tells of a place's directory twice, under the path of the place and under that of
+ * the directory, and of the directory that holds a watched link. Only what bears the name of an
+ * operand, or of a child of one, was asked for.
+ */
+class Monitor
+{
+public:
+    explicit Monitor(Invocation& invocation)
+        : m_invocation(invocation)
+    {
+        const EntryWatcher* watcher = VFS::ptr()->entryWatcher();
+        const auto print = [this, watcher](void (EntryWatcher::*signal)(Entry), const char* event) {
+            QObject::connect(watcher, signal, watcher, [this, event](const Entry& entry) {
+                printEvent(QLatin1String(event), entry);
+            });
+        };
+        print(&EntryWatcher::entryCreated, "created");
+        print(&EntryWatcher::entryDeleted, "deleted");
+        print(&EntryWatcher::entryChanged, "changed");
+        print(&EntryWatcher::entryAttributesChanged, "attributes");
+        print(&EntryWatcher::entryReset, "reset");
+    }
+
+    void add(Entry entry)
+    {
+        // Another notation of a plain path has children under that path, and so has it here.
+        if (!entry.isPlace() && entry.isPlaceBased() &&
+            childPrefix(entry).startsWith(QLatin1Char('/')))
+            entry = VFS::ptr()->entry(entry.localPath());
+        m_paths.insert(entry.path());
+        m_prefixes.insert(childPrefix(entry));
+        VFS::ptr()->entryWatcher()->addEntry(entry);
+    }
+
+private:
+    bool wasAskedFor(const Entry& entry) const
+    {
+        const QString path = entry.path();
+        const QString prefix = path.left(path.lastIndexOf(QLatin1Char('/')) + 1);
+        return m_paths.contains(path) || (!prefix.isEmpty() && m_prefixes.contains(prefix));
+    }
+
+    void printEvent(QLatin1String event, const Entry& entry)
+    {
+        if (!wasAskedFor(entry))
+            return;
+        Output& output = m_invocation.output();
+        if (m_invocation.json()) {
+            QJsonObject object = toJson(entry);
+            object.insert(QStringLiteral("event"), event);
+            output.write(QJsonDocument(object).toJson(QJsonDocument::Compact) + '\n');
+        } else {
+            const QByteArray word = QString(event).leftJustified(10).toLocal8Bit();
+            output.writeRecord(word + "  " + output.name(entry.path(), entry));
+        }
+        output.flush();
+    }
+
+    Invocation& m_invocation;
+    QSet<QString> m_paths;
+    QSet<QString> m_prefixes;
+};
+
+int run(Invocation& invocation)
+{
+    const Interrupt interrupt({SIGINT, SIGTERM}, Done, [] {
+        QMetaObject::invokeMethod(qApp, &QCoreApplication::quit, Qt::QueuedConnection);
+    });
+    Monitor monitor(invocation);
+    int watched = 0;
+    int exitCode = Done;
+    const QStringList operands = invocation.operands();
+    for (const QString& operand : operands) {
+        const Located located = locate(operand);
+        const QString why = located.why.isEmpty() ? whyUnwatchable(located.entry) : located.why;
+        if (why.isEmpty()) {
+            monitor.add(located.entry);
+            ++watched;
+        } else {
+            report(operand, why);
+            exitCode = Failed;
+        }
+    }
+    if (watched > 0)
+        QCoreApplication::exec();
+    return exitCode;
+}
+
+} // namespace
+
+Verb monitorVerb()
+{
+    Verb verb;
+    verb.name = QStringLiteral("monitor");
+    verb.operands = QStringLiteral("ENTRY...");
+    verb.summary = QStringLiteral("Tell what happens to entries");
+    verb.details = QStringLiteral(
+        "One line an event, until Ctrl-C: created, deleted, changed, attributes, or reset, which\n"
+        "means that everything may have changed. With --json each line is an object.");
+    verb.leastOperands = 1;
+    verb.options = {nullOption(), colorOption()};
+    verb.run = run;
+    return verb;
+}
+
+} // namespace Tool
+} // namespace VeyFM

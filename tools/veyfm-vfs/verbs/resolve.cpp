@@ -1,0 +1,86 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "commandline.h"
+#include "describe.h"
+#include "locate.h"
+#include "report.h"
+#include "verbs/verbs.h"
+#include "vfs/vfs.h"
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+void print(Output& output, const QString& text, const Entry& entry)
+{
+    const auto line = [&output](const char* label, const QByteArray& value) {
+        output.write(QByteArray(label) + ": " + value + '\n');
+    };
+    const auto textLine = [&](const char* label, const QString& value) {
+        if (!value.isEmpty())
+            line(label, output.label(value, Entry()));
+    };
+    textLine("text", text);
+    line("path", output.label(entry.path(), entry));
+    textLine("local path", entry.localPath());
+    textLine("type", QStringLiteral("%1 (%2)").arg(typeName(entry.type())).arg(entry.type()));
+    textLine("URL", urlOf(entry).toString(QUrl::FullyEncoded));
+    textLine("network URL", VFS::ptr()->getUrlForEntry(entry));
+    textLine("exists", entry.isExists() ? QStringLiteral("yes") : QStringLiteral("no"));
+}
+
+int run(Invocation& invocation)
+{
+    Output& output = invocation.output();
+    JsonArray json(output);
+    int exitCode = Done;
+    bool first = true;
+    const QStringList operands = invocation.operands();
+    for (const QString& operand : operands) {
+        const Located located = resolveText(operand);
+        const Entry& entry = located.entry;
+        if (!located.why.isEmpty()) {
+            report(operand, located.why);
+            exitCode = Failed;
+        } else if (invocation.json()) {
+            QJsonObject object = toJson(entry);
+            object.insert(QStringLiteral("text"), operand);
+            object.insert(
+                QStringLiteral("url"), textOrNull(urlOf(entry).toString(QUrl::FullyEncoded)));
+            object.insert(
+                QStringLiteral("networkUrl"), textOrNull(VFS::ptr()->getUrlForEntry(entry)));
+            object.insert(QStringLiteral("exists"), entry.isExists());
+            json.append(object);
+        } else {
+            if (!first)
+                output.write(QByteArrayLiteral("\n"));
+            print(output, operand, entry);
+            first = false;
+        }
+    }
+    if (invocation.json())
+        json.end();
+    return exitCode;
+}
+
+} // namespace
+
+Verb resolveVerb()
+{
+    Verb verb;
+    verb.name = QStringLiteral("resolve");
+    verb.operands = QStringLiteral("TEXT...");
+    verb.summary = QStringLiteral("Show what a text means: path, local path, type and URL");
+    verb.details = QStringLiteral(
+        "What the text names need not exist. A text with a colon behind a word is a URL, and a\n"
+        "place wins over a file of its name: ./Home is the file.");
+    verb.leastOperands = 1;
+    verb.options = {colorOption()};
+    verb.run = run;
+    return verb;
+}
+
+} // namespace Tool
+} // namespace VeyFM
