@@ -8,6 +8,7 @@
 
 #include <QSet>
 #include <QTest>
+#include <QVector>
 
 #include <type_traits>
 
@@ -273,10 +274,16 @@ void TestEntry::exactKinds()
 {
     QFETCH(Predicate, predicate);
     QFETCH(int, type);
-    for (int candidate = -1; candidate <= 30101; ++candidate) {
-        const Entry entry = entryOfType(candidate);
-        if ((entry.*predicate)() != (candidate == type)) {
-            QFAIL(qPrintable(text("wrong for %1").arg(candidate)));
+    static const QVector<Entry> entries = [] {
+        QVector<Entry> result;
+        for (int candidate = -1; candidate <= 30101; ++candidate) {
+            result.append(entryOfType(candidate));
+        }
+        return result;
+    }();
+    for (const Entry& entry : entries) {
+        if ((entry.*predicate)() != (entry.type() == type)) {
+            QFAIL(qPrintable(text("wrong for %1").arg(entry.type())));
         }
     }
 }

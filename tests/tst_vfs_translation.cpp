@@ -91,18 +91,21 @@ private:
 
 void TestVfsTranslation::initTestCase()
 {
+    // The names are bare: there is no ".qm" behind the language.
     QVERIFY(m_tree.makeDir("catalogues"));
     QVERIFY(m_tree.write(
-        "catalogues/libveyfmvfs_de.qm",
+        "catalogues/libveyfmvfs_ru.qm", catalogue("VeyFM::VFS", {{"Home", QStringLiteral("X")}})));
+    QVERIFY(m_tree.write(
+        "catalogues/libveyfmvfs_de",
         catalogue(
             "VeyFM::VFS", {{"Home", QString::fromUtf8("Persönlicher Ordner")},
                            {"Network", QStringLiteral("Netzwerk")},
                            {"_", QStringLiteral("Wurzel")}})));
     QVERIFY(m_tree.write(
-        "catalogues/libveyfmvfs_pt_BR.qm",
+        "catalogues/libveyfmvfs_pt_BR",
         catalogue("VeyFM::VFS", {{"Home", QStringLiteral("Pasta pessoal")}})));
     QVERIFY(m_tree.write(
-        "catalogues/libveyfmvfs_fr.qm",
+        "catalogues/libveyfmvfs_fr",
         catalogue("Elsewhere", {{"Home", QStringLiteral("Dossier personnel")}})));
 }
 

@@ -182,7 +182,7 @@ inline int startupProbe(int argc, char** argv, const char* modeName)
 {
     using namespace VeyFM;
     // A start that hangs ends, and is told from one that is slow.
-    ::alarm(50);
+    ::alarm(20);
     std::setvbuf(stdout, nullptr, _IOLBF, 0);
     const QByteArray mode(modeName);
     {
