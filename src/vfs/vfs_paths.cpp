@@ -9,6 +9,7 @@
 #include <QSet>
 #include <QUrl>
 
+#include <algorithm>
 #include <cstdlib>
 
 #include <sys/stat.h>
@@ -19,12 +20,69 @@ namespace {
 
 const QLatin1Char slash('/');
 
-// QUrl knows best what a scheme is, but a text without a colon has none, and neither has one that
-// begins with a slash: most texts need no parser.
+// QUrl knows best what a scheme is, and the text up to its first colon is all that it needs. Of
+// the whole text it would take the host apart as well, which takes time that grows with the
+// square of the host's length. Most texts have no colon, or begin with a slash, and need no parser.
+QString schemeOf(const QString& text)
+{
+    const int colon = text.startsWith(slash) ? -1 : text.indexOf(QLatin1Char(':'));
+    return colon < 0 ? QString() : QUrl(text.left(colon + 1)).scheme();
+}
+
 bool hasScheme(const QString& text)
 {
-    return !text.startsWith(slash) && text.contains(QLatin1Char(':')) &&
-           !QUrl(text).scheme().isEmpty();
+    return !schemeOf(text).isEmpty();
+}
+
+bool isDotInHost(QChar letter)
+{
+    // Three more characters count as dots there.
+    return letter == QLatin1Char('.') || letter == QChar(0x3002) || letter == QChar(0xFF0E) ||
+           letter == QChar(0xFF61);
+}
+
+// Whether a URL has a host that can't be one, because it has a section so long that it remains too
+// long (63 letters is the limit) when all escapes are resolved. QUrl would find the same, late.
+bool hasOverlongHost(const QString& url)
+{
+    constexpr int limit = 1024;
+    const QStringView text(url);
+    const int colon = url.indexOf(QLatin1Char(':'));
+    if (!text.mid(colon + 1).startsWith(QLatin1String("//"))) {
+        return false;
+    }
+    bool behindUser = false;
+    int length = 0;
+    int longest = 0;
+    for (const QChar letter : text.mid(colon + 3)) {
+        if (letter == slash || letter == QLatin1Char('?') || letter == QLatin1Char('#')) {
+            break;
+        }
+        if (letter == QLatin1Char('@') && !behindUser) {
+            behindUser = true;
+            length = longest = 0;
+        } else if (isDotInHost(letter)) {
+            length = 0;
+        } else {
+            longest = std::max(longest, ++length);
+        }
+    }
+    return longest > limit;
+}
+
+// The local path of a "file" URL that has no host, or an invalid one.
+QString pathOfFileUrl(const QString& text)
+{
+    const QString url = text.trimmed();
+    // fromUserInput() also tries the text as a host and path, without a scheme.
+    const QString asHttp = QLatin1String("http://") + url;
+    if (hasOverlongHost(url)) {
+        return QUrl(asHttp).path(QUrl::FullyDecoded);
+    }
+    if (hasOverlongHost(asHttp)) {
+        return QUrl(url).path(QUrl::FullyDecoded);
+    }
+    return QUrl::fromUserInput(url).path(QUrl::FullyDecoded);
 }
 
 // The type of what lies at a local path. Neither a dangling link nor a device has one.
@@ -120,15 +178,17 @@ Entry VFS::entry(const QString& path) const
 
 Entry VFSPrivate::entryFromSchemePath(const QString& path) const
 {
-    const QUrl url(path);
-    const QString scheme = url.scheme();
-    if (scheme == QLatin1String("file") && url.host().isEmpty()) {
-        return entryFromRelativePath(QUrl::fromUserInput(path).path(QUrl::FullyDecoded));
+    const QString scheme = schemeOf(path);
+    if (scheme == QLatin1String("file") && (hasOverlongHost(path) || QUrl(path).host().isEmpty())) {
+        return entryFromRelativePath(pathOfFileUrl(path));
     }
     if (scheme == QLatin1String("vey-fm")) {
+        if (hasOverlongHost(path)) {
+            return Entry();
+        }
         // Written with no slash behind the colon. These six words are the same in every
         // language; any other place goes by its own, translated path.
-        const QString place = url.path(QUrl::FullyDecoded);
+        const QString place = QUrl(path).path(QUrl::FullyDecoded);
         if (place == QLatin1String("Computer")) {
             return computerEntry;
         }
@@ -309,11 +369,9 @@ QString VFS::localPath(const QString& path) const
 QString VFS::localPath(const Entry& entry) const
 {
     Q_D(const VFS);
-    if (hasScheme(entry.m_path)) {
-        if (QUrl(entry.m_path).scheme() == QLatin1String("file")) {
-            return QUrl::fromUserInput(entry.m_path).path(QUrl::FullyDecoded);
-        }
-        return QString();
+    const QString scheme = schemeOf(entry.m_path);
+    if (!scheme.isEmpty()) {
+        return scheme == QLatin1String("file") ? pathOfFileUrl(entry.m_path) : QString();
     }
     if (!entry.isPlace()) {
         return d->resolveLocalPath(entry.m_path);
