@@ -4,6 +4,7 @@
 #include "core/entry.h"
 
 #include "core/accountnames.h"
+#include "vfs/localbytes.h"
 #include "vfs/vfs.h"
 
 #include <QFileInfo>
@@ -28,7 +29,8 @@ QString behindLastSlash(const QString& text)
 // Facts of the link itself, not of its target.
 bool linkStatus(const QString& localPath, struct stat* status)
 {
-    return ::lstat(localPath.toLocal8Bit().constData(), status) == 0;
+    const LocalBytes bytes(localPath);
+    return bytes.isUsable() && ::lstat(bytes.data(), status) == 0;
 }
 
 // What a file that can't be examined is said to belong to: -2 as unsigned, and not the -1 that

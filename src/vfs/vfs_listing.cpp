@@ -40,6 +40,12 @@ bool isDots(const char* name)
     return name[0] == '.' && (name[1] == '\0' || (name[1] == '.' && name[2] == '\0'));
 }
 
+// The system would end a path at its first NUL, and open another directory.
+DIR* openDirectory(const QByteArray& path)
+{
+    return path.contains('\0') ? nullptr : ::opendir(path.constData());
+}
+
 bool canOpenDirectory(const QByteArray& path)
 {
     return DirectoryStream(::opendir(path.constData())) != nullptr;
@@ -86,7 +92,7 @@ QString joinedAscii(const QString& prefix, const char* name, int length)
 
 DIR* VFSPrivate::openListing(const QByteArray& directory)
 {
-    return ::opendir(directory.constData());
+    return openDirectory(directory);
 }
 
 EntryList VFS::childs(const Entry& entry, EntryChildFilters filter) const
@@ -208,7 +214,7 @@ bool VFS::containsDirsOrPlaces(const Entry& entry) const
     if (directory.isEmpty() || !isListable(entry)) {
         return false;
     }
-    const DirectoryStream stream(::opendir(directory.constData()));
+    const DirectoryStream stream(openDirectory(directory));
     while (const dirent* record = stream ? nextRecord(stream) : nullptr) {
         const auto kind = record->d_type;
         if ((kind != DT_DIR && kind != DT_UNKNOWN) || isDots(record->d_name)) {
@@ -234,14 +240,14 @@ bool VFS::hasChilds(const Entry& entry) const
     // and one that can't be read has none. To meet one of the two settles it.
     const QString local = entry.localPath();
     if (!local.isEmpty()) {
-        const DirectoryStream stream(::opendir(local.toLocal8Bit().constData()));
+        const DirectoryStream stream(openDirectory(local.toLocal8Bit()));
         while (const dirent* record = stream ? nextRecord(stream) : nullptr) {
             if (isDots(record->d_name)) {
                 return true;
             }
         }
     }
-    return QDir(local).count() != 0;
+    return !local.contains(QChar(QChar::Null)) && QDir(local).count() != 0;
 }
 
 } // namespace VeyFM
