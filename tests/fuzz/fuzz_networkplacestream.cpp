@@ -1,0 +1,14 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+// Any bytes to the stream form of NetworkPlace.
+
+#include "recordstream.h"
+
+#include "core/networkplace.h"
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
+{
+    readRecords<VeyFM::NetworkPlace>(data, size);
+    return 0;
+}
