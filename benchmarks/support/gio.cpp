@@ -18,8 +18,9 @@ template <typename Take>
 void enumerate(const QByteArray& path, const char* attributes, Take take)
 {
     const GioObject<GFile> directory(g_file_new_for_path(path.constData()));
+    // Links are followed, as ours are: their kind tells where they lead.
     const GioObject<GFileEnumerator> enumerator(g_file_enumerate_children(
-        directory.get(), attributes, G_FILE_QUERY_INFO_NOFOLLOW_SYMLINKS, nullptr, nullptr));
+        directory.get(), attributes, G_FILE_QUERY_INFO_NONE, nullptr, nullptr));
     while (GFileInfo* info = g_file_enumerator_next_file(enumerator.get(), nullptr, nullptr)) {
         take(enumerator.get(), GioObject<GFileInfo>(info));
     }
