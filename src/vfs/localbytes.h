@@ -8,6 +8,8 @@
 #include <QString>
 #include <QVarLengthArray>
 
+#include <cstring>
+
 namespace VeyFM {
 
 /**
@@ -21,19 +23,21 @@ public:
     {
         const int size = path.size();
         m_bytes.resize(size + 1);
-        const ushort* units = path.utf16();
+        // Locals: what is written as char could alias a member, and the loop would crawl.
+        char* const bytes = m_bytes.data();
+        const ushort* const units = path.utf16();
         ushort all = 0;
         for (int i = 0; i < size; ++i) {
             all |= units[i];
-            m_bytes[i] = char(units[i]);
-            m_holdsNul |= units[i] == 0;
+            bytes[i] = char(units[i]);
         }
-        m_bytes[size] = '\0';
+        bytes[size] = '\0';
         if (all >= 0x80) {
             const QByteArray encoded = path.toLocal8Bit();
             m_bytes.resize(0);
             m_bytes.append(encoded.constData(), encoded.size() + 1);
         }
+        m_holdsNul = std::strlen(m_bytes.constData()) != size_t(m_bytes.size() - 1);
     }
 
     /// Whether the system can take this path at all: it ends a path at the first NUL.
@@ -49,7 +53,7 @@ public:
 
 private:
     QVarLengthArray<char, 512> m_bytes;
-    bool m_holdsNul = false;
+    bool m_holdsNul;
 };
 
 } // namespace VeyFM

@@ -50,6 +50,7 @@ public:
     // Paths.
     Entry entryFromSchemePath(const QString& path) const;
     Entry entryFromRelativePath(const QString& path) const;
+    Entry entryFromNormalPath(const QString& path) const;
     QString resolveLocalPath(const QString& path) const;
     QString removeExcessivePathPlaces(const QString& path) const;
     QString resolveChildPath(const Entry& entry, const QString& name) const;

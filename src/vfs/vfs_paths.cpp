@@ -106,9 +106,12 @@ int typeOnDisk(const QString& localPath)
     return TypeNone;
 }
 
-// Whether an absolute path has no empty, "." or ".." section and no slash at its end.
+// Whether a path is absolute and has no empty, "." or ".." section and no slash at its end.
 bool isNormalAbsolute(const QString& path)
 {
+    if (!path.startsWith(slash)) {
+        return false;
+    }
     const ushort* unit = path.utf16();
     const ushort* const end = unit + path.size();
     for (; unit != end; ++unit) {
@@ -152,6 +155,10 @@ QString linkedDirectory(const QString& link)
 Entry VFS::entry(const QString& path) const
 {
     Q_D(const VFS);
+    // The usual path, which every rule below would leave as it is.
+    if (isNormalAbsolute(path)) {
+        return d->entryFromNormalPath(path);
+    }
     if (path == QLatin1String(".")) {
         return d->entryFromRelativePath(QDir::currentPath());
     }
@@ -223,18 +230,20 @@ Entry VFSPrivate::entryFromSchemePath(const QString& path) const
 Entry VFSPrivate::entryFromRelativePath(const QString& path) const
 {
     const QString normalized = q->normalizePath(path);
-    if (normalized.isEmpty()) {
-        return Entry();
-    }
-    const Entry place = placeBase.placeEntry(normalized);
+    return normalized.isEmpty() ? Entry() : entryFromNormalPath(normalized);
+}
+
+Entry VFSPrivate::entryFromNormalPath(const QString& path) const
+{
+    const Entry place = placeBase.placeEntry(path);
     if (!place.isNull()) {
         return place;
     }
-    const QString local = resolveLocalPath(normalized);
+    const QString local = resolveLocalPath(path);
     if (local.isEmpty()) {
         return Entry();
     }
-    return Entry(normalized, local, typeOnDisk(local));
+    return Entry(path, local, typeOnDisk(local));
 }
 
 QString VFS::normalizePath(const QString& path) const
@@ -245,7 +254,7 @@ QString VFS::normalizePath(const QString& path) const
     }
     const QString cut = path.startsWith(slash) ? path : d->removeExcessivePathPlaces(path);
     const bool absolute = cut.startsWith(slash);
-    if (absolute && isNormalAbsolute(cut)) {
+    if (isNormalAbsolute(cut)) {
         return cut;
     }
 

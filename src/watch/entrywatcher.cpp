@@ -34,11 +34,13 @@ void EntryWatcher::addEntry(const Entry& entry)
     if (!isRefreshable(local)) {
         return;
     }
-    m_inotifyWatcher->addPath(local);
-    const QFileInfo info(local);
-    if (info.isSymLink()) {
+    // Of a path that it did not watch before, the watcher has just found out whether it is a link.
+    const bool isLink = m_inotifyWatcher->addPath(local)
+                            ? m_inotifyWatcher->isSymlinkRegistered(local)
+                            : QFileInfo(local).isSymLink();
+    if (isLink) {
         // That a link is deleted or replaced shows in the directory that holds it.
-        m_inotifyWatcher->addPath(info.absolutePath());
+        m_inotifyWatcher->addPath(QFileInfo(local).absolutePath());
     }
     if (entry.isPlaceBased()) {
         m_watchedEntries[local].insert(entry);
@@ -53,16 +55,18 @@ void EntryWatcher::addEntry(const Entry& entry)
 void EntryWatcher::removeEntry(const Entry& entry)
 {
     const QString local = entry.localPath();
-    QSet<Entry>& entries = m_watchedEntries[local];
-    entries.remove(entry);
-    if (entries.size() == 1 && !entries.cbegin()->isPlaceBased()) {
-        // What is left is the plain twin. The kernel's watch outlives the key, and what it
-        // reports takes the road of plain directories from now on. That is meant.
-        m_watchedEntries.remove(local);
+    const auto entries = m_watchedEntries.find(local);
+    if (entries == m_watchedEntries.end()) {
+        m_inotifyWatcher->removePath(local);
         return;
     }
-    if (entries.isEmpty()) {
-        m_watchedEntries.remove(local);
+    entries->remove(entry);
+    if (entries->size() == 1 && !entries->cbegin()->isPlaceBased()) {
+        // What is left is the plain twin. The kernel's watch outlives the key, and what it
+        // reports takes the road of plain directories from now on. That is meant.
+        m_watchedEntries.erase(entries);
+    } else if (entries->isEmpty()) {
+        m_watchedEntries.erase(entries);
         m_inotifyWatcher->removePath(local);
     }
 }

@@ -13,7 +13,9 @@
 #include <QStringBuilder>
 #include <QTimer>
 
+#include <algorithm>
 #include <cerrno>
+#include <climits>
 #include <cstdlib>
 #include <cstring>
 
@@ -44,22 +46,27 @@ constexpr PathSignal Changed{&InotifyWatcher::pathChanged, "pathChanged"};
 constexpr PathSignal AttributesChanged{
     &InotifyWatcher::pathAttributesChanged, "pathAttributesChanged"};
 
-// Room for one batch of events: the usual one fits on the stack.
-class EventBuffer
+// The events that wait, taken whole. The usual batch takes one read and fits on the stack.
+class EventBatch
 {
 public:
-    explicit EventBuffer(size_t size)
+    explicit EventBatch(int fd)
+        : m_size(read(fd, m_stack, sizeof(m_stack)))
     {
-        if (size > sizeof(m_stack)) {
-            m_heap.reset(static_cast<char*>(std::malloc(size)));
-            if (!m_heap)
-                qBadAlloc();
-        }
+        // A read gives as many whole events as fit. Where one more would have fitted, none waits.
+        if (m_size > ssize_t(sizeof(m_stack) - LargestEvent))
+            readRest(fd);
     }
 
-    char* data()
+    const char* data() const
     {
         return m_heap ? m_heap.get() : m_stack;
+    }
+
+    /// In bytes, negative if nothing waited.
+    ssize_t size() const
+    {
+        return m_size;
     }
 
 private:
@@ -71,8 +78,24 @@ private:
         }
     };
 
+    static constexpr size_t LargestEvent = sizeof(inotify_event) + NAME_MAX + 1;
+
+    void readRest(int fd)
+    {
+        int waiting = 0;
+        ioctl(fd, FIONREAD, &waiting);
+        if (waiting <= 0)
+            return;
+        m_heap.reset(static_cast<char*>(std::malloc(size_t(m_size + waiting))));
+        if (!m_heap)
+            qBadAlloc();
+        std::memcpy(m_heap.get(), m_stack, size_t(m_size));
+        m_size += std::max(ssize_t(0), read(fd, m_heap.get() + m_size, size_t(waiting)));
+    }
+
     alignas(inotify_event) char m_stack[4096];
     std::unique_ptr<char, Free> m_heap;
+    ssize_t m_size;
 };
 
 // Most watched paths are no links, which one readlink() tells more cheaply than any stat.
@@ -98,7 +121,7 @@ class InotifyWatcherPrivate
 public:
     explicit InotifyWatcherPrivate(InotifyWatcher* watcher)
         : q(watcher)
-        , fd(inotify_init1(IN_CLOEXEC))
+        , fd(inotify_init1(IN_CLOEXEC | IN_NONBLOCK))
     {
     }
 
@@ -124,7 +147,7 @@ public:
     bool notify(const PathSignal& signal, const QString& path, const QString& fileName);
 
     InotifyWatcher* const q;
-    const int fd; // negative if the kernel granted no instance
+    const int fd; // negative if the kernel granted no instance; a read never blocks
     WatchTable watches;
     LinkTable links;
     QSet<QString> deletedSymlinks; // links that wait for the verdict, still among the watches
@@ -240,14 +263,9 @@ void InotifyWatcher::notifySymlinks(
 
 void InotifyWatcher::processInotifyMessages()
 {
-    // Reading exactly what waits never gives part of an event. Where nothing waits a read would
-    // block.
-    int waiting = 0;
-    ioctl(d->fd, FIONREAD, &waiting);
-    if (waiting > 0) {
-        EventBuffer buffer{size_t(waiting)};
-        const ssize_t size = read(d->fd, buffer.data(), size_t(waiting));
-        if (!d->processEvents(buffer.data(), size))
+    {
+        const EventBatch events(d->fd);
+        if (!d->processEvents(events.data(), events.size()))
             return;
     }
 
