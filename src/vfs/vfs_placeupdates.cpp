@@ -181,7 +181,15 @@ VFSPrivate::addMountsOfKind(const QList<Entry>& mounts, const Entry& kindPlace, 
         if (!placeBase.placeHasChildEntry(networkEntry, kindPlace)) {
             addEntryToPlace(kindPlace, networkEntry, notify);
         }
-        addEntriesToPlace(entries, kindPlace, notify);
+        // A service that calls a mount after a place above would make a ring of the tree, in which
+        // every walk to the top goes on for ever. Such a mount stays without a link.
+        EntryList linkable;
+        for (const Entry& entry : qAsConst(entries)) {
+            if (entry != kindPlace && placeBase.checkAndGetParentPlace(kindPlace, entry).isNull()) {
+                linkable.append(entry);
+            }
+        }
+        addEntriesToPlace(linkable, kindPlace, notify);
     }
     return entries;
 }
