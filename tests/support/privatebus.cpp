@@ -220,6 +220,11 @@ void FakeServiceControl::stop()
     }
 }
 
+qint64 FakeServiceControl::stoppedProcess() const
+{
+    return m_stopped;
+}
+
 void FakeServiceControl::resume()
 {
     if (m_stopped != 0) {

@@ -93,6 +93,8 @@ public:
     void stop();
     void resume();
     /// @}
+    /// The process that stop() has stopped, 0 without one.
+    qint64 stoppedProcess() const;
     /// Waits until the service owns its name; false when it takes too long.
     bool waitForService(bool running = true) const;
 
