@@ -19,10 +19,10 @@ StoragePlaceJob::StoragePlaceJob(
 
 StoragePlaceJob::~StoragePlaceJob() = default;
 
-void StoragePlaceJob::request(const QString& method)
+void StoragePlaceJob::request(const QString& method, const QString& refusal)
 {
     if (!m_interface) {
-        finishedWithError(1, tr("Can't get service interface"));
+        finishedWithError(1, refusal);
         return;
     }
     const auto call = m_interface->asyncCall(method, QVariant::fromValue(m_storagePlace));
@@ -33,11 +33,12 @@ void StoragePlaceJob::request(const QString& method)
 void StoragePlaceJob::callFinishedSlot(QDBusPendingCallWatcher* call)
 {
     const QDBusPendingReply<bool> reply = *call;
-    // A pending reply lets further arguments pass behind those it expects; a good answer is one
-    // boolean and nothing else. Its value is not looked at: a failure comes as an error.
+    // A pending reply lets further arguments pass behind those it expects, and its own count() is
+    // of these. A good answer is one boolean and nothing else. Its value is not looked at: a
+    // failure comes as an error.
     if (reply.isError()) {
         finishedWithError(2, reply.error().message());
-    } else if (reply.count() != 1) {
+    } else if (reply.reply().arguments().size() != 1) {
         finishedWithError(
             2, tr("Unexpected reply signature: got \"%1\", expected \"b\"")
                    .arg(reply.reply().signature()));
@@ -55,7 +56,7 @@ StoragePlaceMountJob::StoragePlaceMountJob(
 
 void StoragePlaceMountJob::start()
 {
-    request(QStringLiteral("mountStoragePlace"));
+    request(QStringLiteral("mountStoragePlace"), tr("Can't get service interface"));
 }
 
 StoragePlaceUnmountJob::StoragePlaceUnmountJob(
@@ -66,7 +67,7 @@ StoragePlaceUnmountJob::StoragePlaceUnmountJob(
 
 void StoragePlaceUnmountJob::start()
 {
-    request(QStringLiteral("unmountStoragePlace"));
+    request(QStringLiteral("unmountStoragePlace"), tr("Can't get service interface"));
 }
 
 StoragePlaceEjectJob::StoragePlaceEjectJob(
@@ -77,7 +78,7 @@ StoragePlaceEjectJob::StoragePlaceEjectJob(
 
 void StoragePlaceEjectJob::start()
 {
-    request(QStringLiteral("ejectStoragePlaceDevice"));
+    request(QStringLiteral("ejectStoragePlaceDevice"), tr("Can't get service interface"));
 }
 
 } // namespace VeyFM

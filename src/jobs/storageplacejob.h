@@ -35,8 +35,9 @@ protected:
         const StoragePlace& place, const QSharedPointer<QDBusInterface>& interface,
         QObject* parent);
 
-    /// Sends @p method with the record as its one argument.
-    void request(const QString& method);
+    /// Sends @p method with the record as its one argument. Without an interface the job ends with
+    /// code 1 and @p refusal, which each job translates under its own name.
+    void request(const QString& method, const QString& refusal);
 
 protected Q_SLOTS:
     /// Ends the job by the service's reply.

@@ -77,6 +77,7 @@ public:
     EntryList addNetworkMounts(const QMap<QString, Entry>& mounts, bool notify);
     EntryList addMountsOfKind(const QList<Entry>& mounts, const Entry& kindPlace, bool notify);
     QString networkPlacePath(const NetworkPlace& place) const;
+    Entry entryOfRecord(const QString& path) const;
     QString workgroupPath(const QString& workgroup) const;
 
     // Fills of pending places, and news of the service.

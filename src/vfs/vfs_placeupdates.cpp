@@ -38,6 +38,14 @@ int entryType(StoragePlace::Type type)
 
 } // namespace
 
+Entry VFSPrivate::entryOfRecord(const QString& path) const
+{
+    // The name of a record is text: one that is empty, or leads up by "..", would resolve to some
+    // other place, which must not change or go in place of one that the tree does not know.
+    const Entry entry = q->entry(path);
+    return entry.m_path != path && placeBase.hasPlace(entry) ? Entry() : entry;
+}
+
 void VFSPrivate::_q_createStoragePlaces(const QString& path)
 {
     Q_UNUSED(path)
@@ -89,7 +97,7 @@ void VFSPrivate::_q_serviceStoragePlaceUpdated(
     if (previous.isMountable() != place.isMountable()) {
         Q_EMIT q->storagePlaceMountabilityChanged(place);
     }
-    const Entry entry = q->entry(place.name());
+    const Entry entry = entryOfRecord(place.name());
     placeBase.setPlaceLocalPath(entry, place.mountPoint());
     q->notifyWatchers(entry);
 }
@@ -98,7 +106,7 @@ void VFSPrivate::_q_serviceStoragePlaceRemoved(const StoragePlace& place)
 {
     // While the signal runs the place is still in the tree.
     Q_EMIT q->storagePlaceRemoved(place);
-    destroyPlace(q->entry(place.name()));
+    destroyPlace(entryOfRecord(place.name()));
 }
 
 void VFSPrivate::addFavouritePlace(const FavouritePlace& place, bool notify)
@@ -115,7 +123,7 @@ void VFSPrivate::_q_favouritePlaceAdded(const FavouritePlace& place)
 
 void VFSPrivate::_q_favouritePlaceRemoved(const FavouritePlace& place)
 {
-    destroyPlace(q->entry(q->favouritePlacePath(place)));
+    destroyPlace(entryOfRecord(q->favouritePlacePath(place)));
 }
 
 QString VFSPrivate::networkPlacePath(const NetworkPlace& place) const
@@ -146,7 +154,7 @@ void VFSPrivate::_q_networkPlaceRemoved(const NetworkPlace& place)
 void VFSPrivate::_q_networkPlaceUpdated(const NetworkPlace& place)
 {
     // The entry that goes out still has the old local path. Receivers read it again.
-    const Entry entry = q->entry(networkPlacePath(place));
+    const Entry entry = entryOfRecord(networkPlacePath(place));
     placeBase.setPlaceLocalPath(entry, place.localPath());
     q->notifyWatchers(entry);
     Q_EMIT q->networkPlaceUpdated(entry);
@@ -181,7 +189,15 @@ VFSPrivate::addMountsOfKind(const QList<Entry>& mounts, const Entry& kindPlace, 
         if (!placeBase.placeHasChildEntry(networkEntry, kindPlace)) {
             addEntryToPlace(kindPlace, networkEntry, notify);
         }
-        addEntriesToPlace(entries, kindPlace, notify);
+        // A service that calls a mount after a place above would make a ring of the tree, in which
+        // every walk to the top goes on for ever. Such a mount stays without a link.
+        EntryList linkable;
+        for (const Entry& entry : qAsConst(entries)) {
+            if (entry != kindPlace && placeBase.checkAndGetParentPlace(kindPlace, entry).isNull()) {
+                linkable.append(entry);
+            }
+        }
+        addEntriesToPlace(linkable, kindPlace, notify);
     }
     return entries;
 }

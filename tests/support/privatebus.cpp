@@ -132,6 +132,7 @@ FakeServiceControl::FakeServiceControl(const QString& address)
 
 FakeServiceControl::~FakeServiceControl()
 {
+    resume(); // A stopped process would outlive its bus.
     QDBusConnection::disconnectFromBus(m_name);
 }
 
@@ -168,6 +169,18 @@ void FakeServiceControl::emitSignal(
         {interface, name, QString::fromUtf8(QJsonDocument(arguments).toJson())});
 }
 
+void FakeServiceControl::emitRaw(
+    const QString& path, const QString& interface, const QString& name,
+    const QStringList& arguments)
+{
+    call(QStringLiteral("EmitRaw"), {path, interface, name, arguments});
+}
+
+QStringList FakeServiceControl::introspections() const
+{
+    return call(QStringLiteral("Introspections")).toStringList();
+}
+
 QStringList FakeServiceControl::calls() const
 {
     return call(QStringLiteral("Calls")).toStringList();
@@ -196,6 +209,27 @@ void FakeServiceControl::kill()
     if (const qint64 pid = processId()) {
         ::kill(pid_t(pid), SIGKILL);
         waitForService(false);
+    }
+}
+
+void FakeServiceControl::stop()
+{
+    m_stopped = processId();
+    if (m_stopped != 0) {
+        ::kill(pid_t(m_stopped), SIGSTOP);
+    }
+}
+
+qint64 FakeServiceControl::stoppedProcess() const
+{
+    return m_stopped;
+}
+
+void FakeServiceControl::resume()
+{
+    if (m_stopped != 0) {
+        ::kill(pid_t(m_stopped), SIGCONT);
+        m_stopped = 0;
     }
 }
 

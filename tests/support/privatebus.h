@@ -70,6 +70,14 @@ public:
     /// Has the service emit a signal, by the last part of the interface's name.
     void emitSignal(const QString& interface, const QString& name, const QJsonArray& arguments);
 
+    /// Has the service emit any signal, with arguments that are all text.
+    void emitRaw(
+        const QString& path, const QString& interface, const QString& name,
+        const QStringList& arguments);
+
+    /// The object paths that were introspected so far, in order.
+    QStringList introspections() const;
+
     /// Calls so far in their order, as "Interface.method[arguments]".
     QStringList calls() const;
     QStringList takeCalls();
@@ -81,6 +89,12 @@ public:
     void exit(int code = 0);
     /// Kills the service and waits until its name is free.
     void kill();
+    /// Stops the service where it is, or has it go on. @{
+    void stop();
+    void resume();
+    /// @}
+    /// The process that stop() has stopped, 0 without one.
+    qint64 stoppedProcess() const;
     /// Waits until the service owns its name; false when it takes too long.
     bool waitForService(bool running = true) const;
 
@@ -89,6 +103,7 @@ private:
 
     QString m_name;
     QDBusConnection m_bus;
+    qint64 m_stopped = 0;
 };
 
 #endif

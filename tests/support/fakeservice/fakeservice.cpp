@@ -48,6 +48,7 @@ void FakeService::load(const QJsonObject& script)
 
 QString FakeService::introspect(const QString& path) const
 {
+    m_introspections.append(path);
     return m_contract.introspection(path);
 }
 
@@ -205,6 +206,17 @@ bool FakeService::control(const QDBusMessage& message)
         m_calls.clear();
     } else if (message.member() == QLatin1String("Violations")) {
         reply << m_violations;
+    } else if (message.member() == QLatin1String("Introspections")) {
+        reply << m_introspections;
+    } else if (message.member() == QLatin1String("EmitRaw")) {
+        QDBusMessage signal = QDBusMessage::createSignal(
+            arguments.value(0).toString(), arguments.value(1).toString(),
+            arguments.value(2).toString());
+        const QStringList texts = arguments.value(3).toStringList();
+        for (const QString& text : texts) {
+            signal << text;
+        }
+        m_bus.send(signal);
     } else if (message.member() == QLatin1String("Exit")) {
         m_bus.send(reply);
         const int code = arguments.value(0).toInt();

@@ -38,7 +38,9 @@
  *
  * Tests steer it on the path "/Control", interface "org.veylabs.Test.Control":
  *   Load(s json), Emit(s interface, s signal, s arguments), Calls() -> as, ClearCalls(),
- *   Violations() -> as, Exit(i code).
+ *   Violations() -> as, Exit(i code), Introspections() -> as (the paths, in order),
+ *   EmitRaw(s path, s interface, s signal, as arguments): a signal that need not be of the
+ *   contract, with arguments that are all text.
  */
 class FakeService : public QDBusVirtualObject
 {
@@ -68,6 +70,7 @@ private:
     bool m_echo = true;
     QStringList m_calls;
     QStringList m_violations;
+    mutable QStringList m_introspections;
 };
 
 #endif
