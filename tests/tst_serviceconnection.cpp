@@ -52,6 +52,16 @@ void TestServiceConnection::callsAtStart()
         QStringLiteral("NetworkMountsManager.mounts[]"),
         QStringLiteral("NetworkPlacesManager.networkPlaces[]")};
     QCOMPARE(m_service->takeCalls(), expected);
+    // One introspection an object: the two interfaces of the root come together.
+    const QStringList introspected = {
+        QStringLiteral("/"),
+        QStringLiteral("/StoragePlacesManager"),
+        QStringLiteral("/FavouritePlacesManager"),
+        QStringLiteral("/SmbBrowser"),
+        QStringLiteral("/NetworkMountsManager"),
+        QStringLiteral("/NetworkPlacesManager"),
+        QStringLiteral("/FuseMountsManager")};
+    QCOMPARE(m_service->introspections(), introspected);
 }
 
 void TestServiceConnection::favouritesAreInTheTree()
