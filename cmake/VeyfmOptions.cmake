@@ -52,6 +52,10 @@ if(VEYFM_SANITIZE)
         -fsanitize=${VEYFM_SANITIZE} -fno-omit-frame-pointer -fno-optimize-sibling-calls
     )
     add_link_options(-fsanitize=${VEYFM_SANITIZE})
+    if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
+        # The checks that are built in lead this warning astray.
+        add_compile_options(-Wno-maybe-uninitialized)
+    endif()
     if(VEYFM_SANITIZE MATCHES undefined)
         add_compile_options(-fno-sanitize-recover=undefined)
     endif()
