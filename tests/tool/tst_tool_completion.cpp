@@ -60,8 +60,15 @@ void ToolCompletionTest::verbs()
 {
     QCOMPARE(complete({QStringLiteral("li")}), QByteArrayList({"list"}));
     QCOMPARE(
-        complete({QString()}),
-        QByteArrayList({"list", "tree", "info", "monitor", "parent", "resolve", "help"}));
+        complete({QString()}), QByteArrayList(
+                                   {"list", "tree", "info", "monitor", "parent", "resolve",
+                                    "storage", "bookmark", "network", "notify", "status", "help"}));
+    QCOMPARE(
+        complete({QStringLiteral("bookmark"), QString()}),
+        QByteArrayList({"list", "add", "remove"}));
+    QCOMPARE(
+        complete({QStringLiteral("help"), QStringLiteral("network"), QStringLiteral("w")}),
+        QByteArrayList({"workgroups"}));
     QCOMPARE(complete({}), complete({QString()}));
     QCOMPARE(complete({QStringLiteral("help"), QStringLiteral("mo")}), QByteArrayList({"monitor"}));
     QCOMPARE(complete({QStringLiteral("--")}), QByteArrayList({"--help", "--version"}));

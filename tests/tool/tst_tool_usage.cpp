@@ -10,15 +10,40 @@
 
 namespace {
 
+/// The commands that a help text shows.
+QStringList commandsIn(const ToolResult& help)
+{
+    QStringList commands;
+    const QList<QByteArray> lines = help.lines();
+    const int start = lines.indexOf("Commands:");
+    for (int i = start + 1; start >= 0 && i < lines.size() && lines.at(i).startsWith("  "); ++i)
+        commands.append(QString::fromLatin1(lines.at(i).mid(2).split(' ').constFirst()));
+    return commands;
+}
+
+QStringList words(const QString& verb)
+{
+    return verb.split(QLatin1Char(' '));
+}
+
 /// The verbs that the help shows.
 QStringList shownVerbs()
 {
-    QStringList verbs;
-    const QList<QByteArray> lines = runTool({QStringLiteral("--help")}).lines();
-    const int start = lines.indexOf("Commands:");
-    for (int i = start + 1; start >= 0 && i < lines.size() && lines.at(i).startsWith("  "); ++i)
-        verbs.append(QString::fromLatin1(lines.at(i).mid(2).split(' ').constFirst()));
-    return verbs;
+    return commandsIn(runTool({QStringLiteral("--help")}));
+}
+
+/// The same with the verbs of verbs, such as "storage list".
+QStringList allShownVerbs()
+{
+    QStringList all;
+    const QStringList verbs = shownVerbs();
+    for (const QString& verb : verbs) {
+        all.append(verb);
+        const QStringList inner = commandsIn(runTool({verb, QStringLiteral("--help")}));
+        for (const QString& word : inner)
+            all.append(verb + QLatin1Char(' ') + word);
+    }
+    return all;
 }
 
 } // namespace
@@ -48,10 +73,13 @@ void ToolUsageTest::helpShowsAllVerbs()
     QCOMPARE(result.exitCode, 0);
     QVERIFY(result.err.isEmpty());
     QCOMPARE(
-        shownVerbs(), QStringList(
-                          {QStringLiteral("list"), QStringLiteral("tree"), QStringLiteral("info"),
-                           QStringLiteral("monitor"), QStringLiteral("parent"),
-                           QStringLiteral("resolve"), QStringLiteral("help")}));
+        shownVerbs(),
+        QStringList(
+            {QStringLiteral("list"), QStringLiteral("tree"), QStringLiteral("info"),
+             QStringLiteral("monitor"), QStringLiteral("parent"), QStringLiteral("resolve"),
+             QStringLiteral("storage"), QStringLiteral("bookmark"), QStringLiteral("network"),
+             QStringLiteral("notify"), QStringLiteral("status"), QStringLiteral("help")}));
+    QVERIFY(allShownVerbs().contains(QStringLiteral("storage eject")));
     QCOMPARE(runTool({QStringLiteral("-h")}).out, result.out);
     QCOMPARE(runTool({QStringLiteral("help")}).out, result.out);
 }
@@ -59,7 +87,7 @@ void ToolUsageTest::helpShowsAllVerbs()
 void ToolUsageTest::verbHelp_data()
 {
     QTest::addColumn<QString>("verb");
-    QStringList verbs = shownVerbs();
+    QStringList verbs = allShownVerbs();
     QVERIFY(!verbs.isEmpty());
     verbs.append(QStringLiteral("complete"));
     for (const QString& verb : qAsConst(verbs))
@@ -69,13 +97,16 @@ void ToolUsageTest::verbHelp_data()
 void ToolUsageTest::verbHelp()
 {
     QFETCH(const QString, verb);
-    const ToolResult result = runTool({verb, QStringLiteral("--help")});
+    const ToolResult result = runTool(words(verb) << QStringLiteral("--help"));
     QCOMPARE(result.exitCode, 0);
     QVERIFY(result.err.isEmpty());
-    QVERIFY(result.out.startsWith("Usage:\n  veyfm-vfs " + verb.toLatin1() + " [OPTION...]"));
+    const QByteArray usage = "Usage:\n  veyfm-vfs " + verb.toLatin1();
+    QVERIFY(
+        result.out.startsWith(usage + " [OPTION...]") ||
+        result.out.startsWith(usage + " COMMAND [OPTION...]"));
     QVERIFY(result.out.contains("--version"));
-    QCOMPARE(runTool({verb, QStringLiteral("-h")}).out, result.out);
-    QCOMPARE(runTool({QStringLiteral("help"), verb}).out, result.out);
+    QCOMPARE(runTool(words(verb) << QStringLiteral("-h")).out, result.out);
+    QCOMPARE(runTool(QStringList(QStringLiteral("help")) + words(verb)).out, result.out);
     const QList<QByteArray> lines = result.lines();
     for (const QByteArray& line : lines)
         QVERIFY2(line.size() <= 100, line.constData());
@@ -87,9 +118,9 @@ void ToolUsageTest::version()
     QCOMPARE(result.exitCode, 0);
     QVERIFY(result.out.startsWith("veyfm-vfs "));
     QCOMPARE(result.lines().size(), 1);
-    QStringList verbs = shownVerbs();
+    QStringList verbs = allShownVerbs();
     for (const QString& verb : qAsConst(verbs)) {
-        const ToolResult same = runTool({verb, QStringLiteral("--version")});
+        const ToolResult same = runTool(words(verb) << QStringLiteral("--version"));
         QCOMPARE(same.exitCode, 0);
         QCOMPARE(same.out, result.out);
     }
@@ -202,11 +233,12 @@ void ToolUsageTest::manualPageNamesEveryOption()
     QFile file(toolSource(QStringLiteral("veyfm-vfs.1")));
     QVERIFY(file.open(QIODevice::ReadOnly));
     const QByteArray page = file.readAll().replace("\\-", "-");
-    const QStringList verbs = shownVerbs();
+    const QStringList verbs = allShownVerbs();
     for (const QString& verb : verbs) {
         QVERIFY2(page.contains("\n.SS \"" + verb.toLatin1() + ' '), qPrintable(verb));
-        const ToolResult candidates =
-            runTool({QStringLiteral("complete"), QStringLiteral("--"), verb, QStringLiteral("--")});
+        const ToolResult candidates = runTool(
+            QStringList({QStringLiteral("complete"), QStringLiteral("--")}) + words(verb) +
+            QStringList(QStringLiteral("--")));
         const QList<QByteArray> options = candidates.out.split('\0');
         QVERIFY(options.size() > 2);
         for (QByteArray option : options) {

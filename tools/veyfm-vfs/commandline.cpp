@@ -4,6 +4,7 @@
 #include "commandline.h"
 
 #include "report.h"
+#include "session.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 
@@ -51,6 +52,17 @@ QString optionLine(const Option& option)
     return left.leftJustified(26) + QLatin1Char(' ') + option.description + QLatin1Char('\n');
 }
 
+QString helpLines(const QVector<Verb>& verbs)
+{
+    QString text = QStringLiteral("Commands:\n");
+    for (const Verb& verb : verbs) {
+        if (!verb.hidden)
+            text += QLatin1String("  ") + verb.word().leftJustified(12) + verb.summary +
+                    QLatin1Char('\n');
+    }
+    return text;
+}
+
 } // namespace
 
 Option nullOption()
@@ -74,6 +86,16 @@ Option allOption()
     return {
         {QStringLiteral("a"), QStringLiteral("all")},
         QStringLiteral("Show names that begin with a dot")};
+}
+
+Option timeoutOption()
+{
+    return {
+        {QStringLiteral("timeout")},
+        QStringLiteral("Wait so long for the news of the change (default: 10)"),
+        QStringLiteral("SECONDS"),
+        {},
+        true};
 }
 
 QVector<Option> allOptions(const Verb& verb)
@@ -125,6 +147,10 @@ QString Invocation::checkValues() const
     const bool asksForText = isSet(QStringLiteral("help")) || isSet(QStringLiteral("version"));
     if (operands().size() < m_verb.leastOperands && !asksForText)
         return QStringLiteral("an operand is missing");
+    if (m_verb.mostOperands >= 0 && operands().size() > m_verb.mostOperands && !asksForText) {
+        return QStringLiteral("'%1' is an operand too many")
+            .arg(operands().at(m_verb.mostOperands));
+    }
     return QString();
 }
 
@@ -174,27 +200,27 @@ Output& Invocation::output()
 
 QString generalHelp()
 {
-    QString text = QStringLiteral("Usage:\n  veyfm-vfs COMMAND [OPTION...] [OPERAND...]\n\n"
-                                  "Shows the places, files and directories of the virtual file "
-                                  "system.\n\nCommands:\n");
-    for (const Verb& verb : verbs()) {
-        if (!verb.hidden)
-            text += QLatin1String("  ") + verb.name.leftJustified(10) + verb.summary +
-                    QLatin1Char('\n');
-    }
-    return text + QStringLiteral("\n'veyfm-vfs COMMAND --help' tells more of one command, and "
-                                 "veyfm-vfs(1) of all.\n");
+    return QStringLiteral("Usage:\n  veyfm-vfs COMMAND [OPTION...] [OPERAND...]\n\n"
+                          "Shows the places, files and directories of the virtual file "
+                          "system.\n\n") +
+           helpLines(verbs()) +
+           QStringLiteral("\n'veyfm-vfs COMMAND --help' tells more of one command, and "
+                          "veyfm-vfs(1) of all.\n");
 }
 
 QString verbHelp(const Verb& verb)
 {
+    const QString words = verb.verbs.isEmpty() ? QStringLiteral("[OPTION...]")
+                                               : QStringLiteral("COMMAND [OPTION...]");
     QString text =
-        QStringLiteral("Usage:\n  veyfm-vfs %1 [OPTION...] %2").arg(verb.name, verb.operands);
+        QStringLiteral("Usage:\n  veyfm-vfs %1 %2 %3").arg(verb.name, words, verb.operands);
     while (text.endsWith(QLatin1Char(' ')))
         text.chop(1);
     text += QStringLiteral("\n\n%1.\n").arg(verb.summary);
     if (!verb.details.isEmpty())
         text += QLatin1Char('\n') + verb.details + QLatin1Char('\n');
+    if (!verb.verbs.isEmpty())
+        text += QLatin1Char('\n') + helpLines(verb.verbs);
     text += QStringLiteral("\nOptions:\n");
     const QVector<Option> options = allOptions(verb);
     for (const Option& option : options)
@@ -221,8 +247,16 @@ int runCommandLine(const QStringList& words)
                            word, word.startsWith(QLatin1Char('-'))
                                      ? QStringLiteral("an option needs a command before it")
                                      : QStringLiteral("no such command")));
+    int used = 1;
+    if (!verb->verbs.isEmpty() && words.size() > 1 && !words.at(1).startsWith(QLatin1Char('-'))) {
+        const Verb* inner = findVerb(words.at(1), verb->verbs);
+        if (!inner)
+            return wrongUsage(verb->name, words.at(1) + QStringLiteral(": no such command"));
+        verb = inner;
+        ++used;
+    }
 
-    Invocation invocation(*verb, words.mid(1));
+    Invocation invocation(*verb, words.mid(used));
     if (!invocation.complaint().isEmpty())
         return wrongUsage(verb->name, invocation.complaint());
     Output& output = invocation.output();
@@ -234,9 +268,11 @@ int runCommandLine(const QStringList& words)
         output.write(versionText());
         return output.finish(Done);
     }
+    if (!verb->run)
+        return wrongUsage(verb->name, QStringLiteral("a command is missing"));
     setVerbose(invocation.isSet(QStringLiteral("verbose")));
     VFS::initialize();
-    return output.finish(verb->run(invocation));
+    return output.finish(runVerb(invocation));
 }
 
 } // namespace Tool

@@ -54,6 +54,7 @@ int runCommandLine(const QStringList& words);
 Option nullOption();
 Option colorOption();
 Option allOption();
+Option timeoutOption();
 /// @}
 
 } // namespace Tool

@@ -3,6 +3,8 @@
 
 #include "interrupt.h"
 
+#include "spinner.h"
+
 #include <cerrno>
 #include <fcntl.h>
 #include <poll.h>
@@ -14,6 +16,7 @@ namespace Tool {
 namespace {
 
 constexpr int graceMilliseconds = 500;
+constexpr int partingMilliseconds = 2000;
 constexpr char signalByte = 's';
 constexpr char endByte = 'e';
 
@@ -107,6 +110,12 @@ bool Interrupt::wasRequested() const
     return m_requested;
 }
 
+void Interrupt::setWorkEnded()
+{
+    setMessage(QByteArray());
+    m_workEnded = true;
+}
+
 void Interrupt::watch()
 {
     if (nextByte(m_pipe[0], -1) != signalByte)
@@ -115,7 +124,10 @@ void Interrupt::watch()
     m_stop();
     if (nextByte(m_pipe[0], graceMilliseconds) != 0)
         return;
+    if (m_workEnded && nextByte(m_pipe[0], partingMilliseconds) != 0)
+        return;
 
+    Spinner::end();
     const std::lock_guard<std::mutex> lock(m_messageLock);
     if (::write(STDERR_FILENO, m_message.constData(), size_t(m_message.size())) < 0) {
         // Nobody to tell.

@@ -39,6 +39,10 @@ public:
 
     bool wasRequested() const;
 
+    /// The work has come to its end on a signal, and has told so. What is left to do before the
+    /// program ends may take two seconds more, and is cut off without a word.
+    void setWorkEnded();
+
 private:
     Q_DISABLE_COPY(Interrupt)
 
@@ -57,6 +61,7 @@ private:
     const int m_exitCode;
     const std::function<void()> m_stop;
     std::atomic<bool> m_requested{false};
+    std::atomic<bool> m_workEnded{false};
     std::mutex m_messageLock;
     QByteArray m_message;
     std::thread m_thread;

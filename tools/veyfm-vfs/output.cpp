@@ -4,6 +4,7 @@
 #include "output.h"
 
 #include "report.h"
+#include "spinner.h"
 #include "terminal.h"
 
 #include <QJsonDocument>
@@ -70,6 +71,8 @@ void Output::write(const QString& text)
 
 void Output::flush()
 {
+    if (!m_buffer.isEmpty())
+        Spinner::end();
     const char* data = m_buffer.constData();
     size_t left = size_t(m_buffer.size());
     while (left > 0 && m_error == 0) {

@@ -3,6 +3,7 @@
 
 #include "report.h"
 
+#include "spinner.h"
 #include "terminal.h"
 
 #include <atomic>
@@ -26,6 +27,7 @@ void handleMessage(QtMsgType type, const QMessageLogContext& context, const QStr
 
 void writeError(const QByteArray& bytes)
 {
+    Spinner::end();
     // One call, so that lines of several processes do not mix; nobody to tell of a failure.
     if (::write(STDERR_FILENO, bytes.constData(), size_t(bytes.size())) < 0)
         return;

@@ -32,13 +32,27 @@ struct Option
 
 /// What the operands of a verb are, for the completion of command lines.
 enum class OperandKind {
-    Entries, ///< Places, paths and URLs.
-    Verbs    ///< Names of verbs.
+    Entries,    ///< Places, paths and URLs.
+    Verbs,      ///< Names of verbs.
+    Devices,    ///< Storage devices.
+    Favourites, ///< Favourite bookmarks.
+    Bookmarks,  ///< Network bookmarks.
+    Texts       ///< What nobody can guess, or what is too slow to ask for.
+};
+
+/// What has to be there before a verb runs.
+enum class Needs {
+    Nothing, ///< The verb makes what it needs by itself.
+    Tree,    ///< The tree of places, with the service or without.
+    Service  ///< The tree and the service. The verb does not run without.
 };
 
 /**
  * A verb of the tool. A new one is a file in verbs/ with one function that returns this, and a
  * line in verbs/verbs.cpp: parsing, help and completion are made from the description.
+ *
+ * A verb with verbs of its own, such as "storage list", does nothing else than to hold them. Their
+ * names are whole: both words, with a space between.
  */
 struct Verb
 {
@@ -48,10 +62,19 @@ struct Verb
     QString details;  ///< Behind the usage line of the verb's own help.
     OperandKind operandKind = OperandKind::Entries;
     int leastOperands = 0;
+    int mostOperands = -1; ///< -1 for any number.
+    Needs needs = Needs::Tree;
     bool printsData = true; ///< Whether it knows --json.
     bool hidden = false;    ///< Whether help and completion pass over it.
     QVector<Option> options = {};
     int (*run)(Invocation& invocation) = nullptr; ///< Returns an ExitCode.
+    QVector<Verb> verbs = {};                     ///< In place of run().
+
+    /// The word behind that of the verb which holds this one; else the name.
+    QString word() const
+    {
+        return name.mid(name.lastIndexOf(QLatin1Char(' ')) + 1);
+    }
 };
 
 } // namespace Tool

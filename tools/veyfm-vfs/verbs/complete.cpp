@@ -3,7 +3,9 @@
 
 #include "commandline.h"
 #include "describe.h"
+#include "devices.h"
 #include "locate.h"
+#include "service/networkplacesmanagerproxy.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 
@@ -67,12 +69,55 @@ QStringList entryCandidates(const QString& word)
     return candidates;
 }
 
-QStringList verbCandidates(const QString& word)
+QStringList verbCandidates(const QString& word, const QVector<Verb>& verbs)
 {
     QStringList candidates;
-    for (const Verb& verb : verbs()) {
-        if (!verb.hidden && verb.name.startsWith(word))
-            candidates.append(verb.name);
+    for (const Verb& verb : verbs) {
+        if (!verb.hidden && verb.word().startsWith(word))
+            candidates.append(verb.word());
+    }
+    return candidates;
+}
+
+/// What the service knows, so far as it is at hand: nobody waits for a network to be searched.
+QStringList recordNames(OperandKind kind)
+{
+    const VFS& vfs = *VFS::ptr();
+    QStringList names;
+    if (kind == OperandKind::Devices) {
+        const QList<Device> devices = allDevices();
+        for (const Device& device : devices)
+            names.append(device.name);
+    } else if (kind == OperandKind::Favourites) {
+        const EntryList favourites = vfs.childs(vfs.favouritesEntry());
+        for (const Entry& favourite : favourites)
+            names.append(shownName(favourite));
+    } else if (kind == OperandKind::Bookmarks) {
+        const QList<NetworkPlace> places = VFS::ptr()->networkPlacesManager()->networkPlaces();
+        for (const NetworkPlace& place : places)
+            names.append(place.name());
+    }
+    return names;
+}
+
+QStringList operandCandidates(OperandKind kind, const QString& word)
+{
+    switch (kind) {
+    case OperandKind::Entries:
+        return entryCandidates(word);
+    case OperandKind::Verbs:
+        return verbCandidates(word, verbs());
+    case OperandKind::Devices:
+    case OperandKind::Favourites:
+    case OperandKind::Bookmarks:
+    case OperandKind::Texts:
+        break;
+    }
+    QStringList candidates;
+    const QStringList names = recordNames(kind);
+    for (const QString& name : names) {
+        if (name.startsWith(word))
+            candidates.append(name);
     }
     return candidates;
 }
@@ -111,15 +156,23 @@ const Option* optionWaiting(const QVector<Option>& options, const QString& befor
     return nullptr;
 }
 
-QStringList candidatesFor(const QStringList& words)
+QStringList candidatesFor(QStringList words)
 {
     const QString word = words.isEmpty() ? QString() : words.constLast();
     if (words.size() < 2) {
         if (!word.startsWith(QLatin1Char('-')))
-            return verbCandidates(word);
+            return verbCandidates(word, verbs());
         return QStringList({QStringLiteral("--help"), QStringLiteral("--version")}).filter(word);
     }
     const Verb* verb = findVerb(words.constFirst());
+    if (verb && !verb->verbs.isEmpty()) {
+        if (words.size() == 2 && !word.startsWith(QLatin1Char('-')))
+            return verbCandidates(word, verb->verbs);
+        if (words.size() > 2) {
+            verb = findVerb(words.at(1), verb->verbs);
+            words.removeFirst();
+        }
+    }
     if (!verb)
         return {};
     const QVector<Option> options = allOptions(*verb);
@@ -140,7 +193,12 @@ QStringList candidatesFor(const QStringList& words)
     }
     if (!optionsEnded && word.startsWith(QLatin1Char('-')))
         return optionCandidates(options, word);
-    return verb->operandKind == OperandKind::Verbs ? verbCandidates(word) : entryCandidates(word);
+    if (verb->operandKind == OperandKind::Verbs && !before.isEmpty()) {
+        const Verb* named = findVerb(before.constLast());
+        if (named && !named->verbs.isEmpty())
+            return verbCandidates(word, named->verbs);
+    }
+    return operandCandidates(verb->operandKind, word);
 }
 
 int run(Invocation& invocation)
@@ -161,6 +219,7 @@ Verb completeVerb()
     verb.operands = QStringLiteral("-- [WORD...]");
     verb.summary = QStringLiteral("Print what may stand for the last word of a command line");
     verb.details = QStringLiteral("For the shells. Each candidate ends with a NUL byte.");
+    verb.needs = Needs::Nothing;
     verb.printsData = false;
     verb.hidden = true;
     verb.run = run;

@@ -16,8 +16,15 @@ int run(Invocation& invocation)
     if (names.isEmpty())
         invocation.output().write(generalHelp());
     int exitCode = Done;
-    for (const QString& name : names) {
+    for (int i = 0; i < names.size(); ++i) {
+        const QString& name = names.at(i);
         const Verb* verb = findVerb(name);
+        // "help storage list" is about one command.
+        const Verb* inner = verb ? findVerb(names.value(i + 1), verb->verbs) : nullptr;
+        if (inner) {
+            verb = inner;
+            ++i;
+        }
         if (verb) {
             invocation.output().write(verbHelp(*verb));
         } else {
@@ -37,6 +44,7 @@ Verb helpVerb()
     verb.operands = QStringLiteral("[COMMAND...]");
     verb.summary = QStringLiteral("Show help");
     verb.operandKind = OperandKind::Verbs;
+    verb.needs = Needs::Nothing;
     verb.printsData = false;
     verb.run = run;
     return verb;

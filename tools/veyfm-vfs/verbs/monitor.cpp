@@ -6,8 +6,10 @@
 #include "interrupt.h"
 #include "locate.h"
 #include "report.h"
+#include "service.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
+#include "vfs/vfsplacebase.h"
 #include "watch/entrywatcher.h"
 
 #include <QCoreApplication>
@@ -57,6 +59,22 @@ QString whyUnwatchable(const Entry& entry)
     return error == 0 ? QString() : systemReason(error);
 }
 
+/// Whether all news of what is below the place come from the service.
+bool livesFromService(const Entry& entry)
+{
+    return entry.isFavouritesPlace() || entry.isStorageDevicesPlace() || entry.isNetworkPlace() ||
+           entry.isFtpNetworkPlace() || entry.isSFtpNetworkPlace() || entry.isSambaNetworkPlace() ||
+           entry.isSambaWorkgroupPlace() || entry.isSambaServerPlace();
+}
+
+/// Why the service sends no news, or empty. The tree was made and has tried to start it.
+QString whyNoNews()
+{
+    const ServiceState state = serviceState();
+    const QString why = whyNoService(state);
+    return why.isEmpty() && !state.running ? startService() : why;
+}
+
 /**
  * Prints the news of the watched entries.
  *
@@ -81,6 +99,7 @@ public:
         print(&EntryWatcher::entryChanged, "changed");
         print(&EntryWatcher::entryAttributesChanged, "attributes");
         print(&EntryWatcher::entryReset, "reset");
+        followPlaces();
     }
 
     void add(Entry entry)
@@ -89,31 +108,88 @@ public:
         if (!entry.isPlace() && entry.isPlaceBased() &&
             childPrefix(entry).startsWith(QLatin1Char('/')))
             entry = VFS::ptr()->entry(entry.localPath());
+        // The news of devices and of the Samba network come to those only who have looked.
+        if (opensOnFirstLook(entry))
+            VFS::ptr()->childs(entry);
+        if (entry.isNetworkPlace() || entry.isFtpNetworkPlace() || entry.isSFtpNetworkPlace())
+            m_mounts = true;
+        if (entry.isNetworkPlace()) {
+            // They come with their first mount, and their paths do not begin with their parent's.
+            m_paths.insert(VFS::ptr()->ftpNetworkEntry().path());
+            m_paths.insert(VFS::ptr()->sftpNetworkEntry().path());
+        }
         m_paths.insert(entry.path());
         m_prefixes.insert(childPrefix(entry));
         VFS::ptr()->entryWatcher()->addEntry(entry);
     }
 
 private:
-    bool wasAskedFor(const Entry& entry) const
+    /// What the watcher does not tell of places.
+    void followPlaces()
     {
-        const QString path = entry.path();
+        const VFS* vfs = VFS::ptr();
+        QObject::connect(
+            vfs, &VFS::storagePlaceMountStateChanged, vfs, [this](const StoragePlace& place) {
+                printDevice(place.isMounted() ? "mounted" : "unmounted", place);
+            });
+        QObject::connect(
+            vfs, &VFS::storagePlaceMountabilityChanged, vfs, [this](const StoragePlace& place) {
+                printDevice(place.isMountable() ? "mountable" : "unmountable", place);
+            });
+        const auto printUpdate = [this](const Entry& entry) {
+            // The entry that comes along has the local path of before.
+            printEvent(QLatin1String("updated"), knownPlace(entry.path()));
+        };
+        QObject::connect(vfs, &VFS::smbShareUpdated, vfs, printUpdate);
+        QObject::connect(vfs, &VFS::networkPlaceUpdated, vfs, printUpdate);
+        QObject::connect(
+            vfs, &VFS::fuseMountAdded, vfs, [this](const QString& url, const Entry& entry) {
+                // One that makes no place has its URL alone.
+                const QString path = entry.isNull() ? url : entry.path();
+                if (m_mounts || wasAskedFor(path))
+                    write(QLatin1String("mounted"), entry, path, entry.localPath());
+            });
+    }
+
+    /// The tree still has the place as it was, so the record tells.
+    void printDevice(const char* event, const StoragePlace& place)
+    {
+        if (wasAskedFor(place.name()))
+            write(QLatin1String(event), knownPlace(place.name()), place.name(), place.mountPoint());
+    }
+
+    static Entry knownPlace(const QString& path)
+    {
+        return VFS::ptr()->placeBase()->placeEntry(path);
+    }
+
+    bool wasAskedFor(const QString& path) const
+    {
         const QString prefix = path.left(path.lastIndexOf(QLatin1Char('/')) + 1);
         return m_paths.contains(path) || (!prefix.isEmpty() && m_prefixes.contains(prefix));
     }
 
     void printEvent(QLatin1String event, const Entry& entry)
     {
-        if (!wasAskedFor(entry))
-            return;
+        if (wasAskedFor(entry.path()))
+            write(event, entry, entry.path(), entry.localPath());
+    }
+
+    void
+    write(QLatin1String event, const Entry& entry, const QString& path, const QString& localPath)
+    {
         Output& output = m_invocation.output();
         if (m_invocation.json()) {
             QJsonObject object = toJson(entry);
+            if (entry.path() != path)
+                object.insert(QStringLiteral("name"), path.section(QLatin1Char('/'), -1));
+            object.insert(QStringLiteral("path"), path);
+            object.insert(QStringLiteral("localPath"), textOrNull(localPath));
             object.insert(QStringLiteral("event"), event);
             output.write(QJsonDocument(object).toJson(QJsonDocument::Compact) + '\n');
         } else {
             const QByteArray word = QString(event).leftJustified(10).toLocal8Bit();
-            output.writeRecord(word + "  " + output.name(entry.path(), entry));
+            output.writeRecord(word + "  " + output.name(path, entry));
         }
         output.flush();
     }
@@ -121,6 +197,7 @@ private:
     Invocation& m_invocation;
     QSet<QString> m_paths;
     QSet<QString> m_prefixes;
+    bool m_mounts = false; // Whether mounts by any program are of interest.
 };
 
 int run(Invocation& invocation)
@@ -134,7 +211,9 @@ int run(Invocation& invocation)
     const QStringList operands = invocation.operands();
     for (const QString& operand : operands) {
         const Located located = locate(operand);
-        const QString why = located.why.isEmpty() ? whyUnwatchable(located.entry) : located.why;
+        QString why = located.why.isEmpty() ? whyUnwatchable(located.entry) : located.why;
+        if (why.isEmpty() && livesFromService(located.entry))
+            why = whyNoNews();
         if (why.isEmpty()) {
             monitor.add(located.entry);
             ++watched;
@@ -158,7 +237,9 @@ Verb monitorVerb()
     verb.summary = QStringLiteral("Tell what happens to entries");
     verb.details = QStringLiteral(
         "One line an event, until Ctrl-C: created, deleted, changed, attributes, or reset, which\n"
-        "means that everything may have changed. With --json each line is an object.");
+        "means that everything may have changed. Devices are mounted, unmounted, mountable and\n"
+        "unmountable as well, shares and network bookmarks updated. Storage devices and the\n"
+        "places of Samba are opened first. With --json each line is an object.");
     verb.leastOperands = 1;
     verb.options = {nullOption(), colorOption()};
     verb.run = run;

@@ -9,16 +9,17 @@ namespace Tool {
 const QVector<Verb>& verbs()
 {
     static const QVector<Verb> all = {
-        listVerb(),   treeVerb(),    infoVerb(), monitorVerb(),
-        parentVerb(), resolveVerb(), helpVerb(), completeVerb(),
+        listVerb(),    treeVerb(),    infoVerb(),     monitorVerb(), parentVerb(),
+        resolveVerb(), storageVerb(), bookmarkVerb(), networkVerb(), notifyVerb(),
+        statusVerb(),  helpVerb(),    completeVerb(),
     };
     return all;
 }
 
-const Verb* findVerb(const QString& name)
+const Verb* findVerb(const QString& word, const QVector<Verb>& verbs)
 {
-    for (const Verb& verb : verbs()) {
-        if (verb.name == name)
+    for (const Verb& verb : verbs) {
+        if (verb.word() == word)
             return &verb;
     }
     return nullptr;

@@ -12,17 +12,22 @@ namespace Tool {
 /// All verbs, in the order of the help.
 const QVector<Verb>& verbs();
 
-/// The verb of that name, or null.
-const Verb* findVerb(const QString& name);
+/// The verb among @p verbs that the word names, or null.
+const Verb* findVerb(const QString& word, const QVector<Verb>& verbs = verbs());
 
 /// One function a verb, each in the file of its name. @{
+Verb bookmarkVerb();
 Verb completeVerb();
 Verb helpVerb();
 Verb infoVerb();
 Verb listVerb();
 Verb monitorVerb();
+Verb networkVerb();
+Verb notifyVerb();
 Verb parentVerb();
 Verb resolveVerb();
+Verb statusVerb();
+Verb storageVerb();
 Verb treeVerb();
 /// @}
 

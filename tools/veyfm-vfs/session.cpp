@@ -1,0 +1,161 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "session.h"
+
+#include "commandline.h"
+#include "interrupt.h"
+#include "report.h"
+#include "service.h"
+#include "spinner.h"
+#include "vfs/vfs.h"
+
+#include <QAbstractEventDispatcher>
+#include <QCoreApplication>
+#include <QEventLoop>
+#include <QTimer>
+
+#include <algorithm>
+#include <chrono>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+constexpr int defaultTimeout = 10;
+constexpr uint longestTimeout = 1000000; // Seconds; a timer holds milliseconds in an int.
+
+QString waitingForService()
+{
+    return QStringLiteral("Waiting for the file manager service");
+}
+
+QString interrupted()
+{
+    return QStringLiteral("interrupted");
+}
+
+/**
+ * Made before the tree, and so there until the tree has gone: a service that hangs keeps a
+ * process at its very end too.
+ */
+Interrupt& serviceInterrupt()
+{
+    static Interrupt interrupt({SIGINT}, Failed, [] {
+        if (qApp)
+            QMetaObject::invokeMethod(qApp, &QCoreApplication::quit, Qt::QueuedConnection);
+    });
+    return interrupt;
+}
+
+/// Makes the tree, which asks the service, and has slow places show that they are slow.
+void openTree()
+{
+    const VFS* vfs = VFS::ptr();
+    QObject::connect(
+        vfs, &VFS::longTimeOperationStarted, vfs, [] { Spinner::begin(waitingForService()); });
+    QObject::connect(vfs, &VFS::longTimeOperationFinished, vfs, [] { Spinner::end(); });
+}
+
+int runWithTree(Invocation& invocation)
+{
+    {
+        // The verbs have interrupts of their own, one at a time.
+        Interrupt interrupt({SIGINT}, Failed, [] {});
+        interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
+        const Waiting waiting(waitingForService());
+        openTree();
+        if (interrupt.wasRequested()) {
+            interrupt.setWorkEnded();
+            report(invocation.verb().name, interrupted());
+            return Failed;
+        }
+    }
+    return invocation.verb().run(invocation);
+}
+
+} // namespace
+
+int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))
+{
+    const Verb& verb = invocation.verb();
+    Interrupt& interrupt = serviceInterrupt();
+    interrupt.setMessage(reportLine(verb.name, interrupted()));
+    int exitCode = Failed;
+    QString why;
+    {
+        const Waiting waiting(waitingForService());
+        why = whyNoService(serviceState());
+        if (why.isEmpty())
+            why = startService();
+        if (why.isEmpty())
+            openTree();
+    }
+    if (!interrupt.wasRequested()) {
+        if (why.isEmpty())
+            exitCode = run(invocation);
+        else
+            report(verb.name, why);
+    }
+    if (interrupt.wasRequested()) {
+        interrupt.setWorkEnded();
+        report(verb.name, interrupted());
+        exitCode = Failed;
+    }
+    return exitCode;
+}
+
+int runVerb(Invocation& invocation)
+{
+    switch (invocation.verb().needs) {
+    case Needs::Tree:
+        return runWithTree(invocation);
+    case Needs::Service:
+        return runWithService(invocation, invocation.verb().run);
+    case Needs::Nothing:
+        break;
+    }
+    return invocation.verb().run(invocation);
+}
+
+bool wasInterrupted()
+{
+    return serviceInterrupt().wasRequested();
+}
+
+int waitForNews(
+    const Invocation& invocation, const QString& what, const std::function<bool()>& changed)
+{
+    if (wasInterrupted())
+        return Failed;
+    const QString option = QStringLiteral("timeout");
+    const int seconds = invocation.isSet(option)
+                            ? int(std::min(invocation.value(option).toUInt(), longestTimeout))
+                            : defaultTimeout;
+    bool come = changed();
+    if (!come) {
+        const Waiting waiting(QStringLiteral("Waiting for the news of the change"));
+        QEventLoop loop;
+        QObject::connect(
+            QAbstractEventDispatcher::instance(), &QAbstractEventDispatcher::aboutToBlock, &loop,
+            [&] {
+                if (changed())
+                    loop.quit();
+            });
+        QTimer::singleShot(std::chrono::seconds(seconds), &loop, &QEventLoop::quit);
+        loop.exec();
+        come = changed();
+    }
+    if (come)
+        return Done;
+    if (!wasInterrupted()) {
+        report(
+            what, QStringLiteral("asked for, but the service told of no change within %1 s")
+                      .arg(seconds));
+    }
+    return Failed;
+}
+
+} // namespace Tool
+} // namespace VeyFM

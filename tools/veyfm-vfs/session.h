@@ -1,0 +1,38 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TOOL_SESSION_H
+#define VEYFM_TOOL_SESSION_H
+
+#include <QString>
+
+#include <functional>
+
+namespace VeyFM {
+namespace Tool {
+
+class Invocation;
+
+/// Runs a verb, after what it needs has been made. An ExitCode.
+int runVerb(Invocation& invocation);
+
+/// Starts the service and makes the tree, then calls @p run. Without a service it reports why.
+int runWithService(Invocation& invocation, int (*run)(Invocation& invocation));
+
+/// Whether Ctrl-C has ended a verb that needs the service. The verb then returns at once and says
+/// nothing: that it was interrupted is told for it.
+bool wasInterrupted();
+
+/**
+ * Waits until the service's news of a change have come and made @p changed true, at most for
+ * --timeout or ten seconds. When none come, that is reported of @p what. An ExitCode.
+ *
+ * The condition is looked at after each batch of events, so it should be cheap.
+ */
+int waitForNews(
+    const Invocation& invocation, const QString& what, const std::function<bool()>& changed);
+
+} // namespace Tool
+} // namespace VeyFM
+
+#endif

@@ -1,0 +1,348 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "commandline.h"
+#include "describe.h"
+#include "report.h"
+#include "service.h"
+#include "service/networkplacesmanagerproxy.h"
+#include "service/smbbrowserproxy.h"
+#include "session.h"
+#include "spinner.h"
+#include "table.h"
+#include "verbs/verbs.h"
+#include "vfs/vfs.h"
+
+#include <QUrl>
+
+#include <algorithm>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+const QLatin1Char slash('/');
+
+/// Below a place, or empty where the network is switched off and the place is not there.
+QString pathBelow(const Entry& place, const QString& name)
+{
+    return place.isNull() ? QString() : place.path() + slash + name;
+}
+
+QString whyNoBookmarks()
+{
+    const Waiting waiting(QStringLiteral("Reading the network bookmarks"));
+    return whyNothing(
+        {QStringLiteral("NetworkPlacesManager"), QStringLiteral("networkPlaces"),
+         QStringLiteral("a(sss)")});
+}
+
+int runList(Invocation& invocation)
+{
+    const QList<NetworkPlace> places = VFS::ptr()->networkPlacesManager()->networkPlaces();
+    if (places.isEmpty()) {
+        const QString why = whyNoBookmarks();
+        if (wasInterrupted())
+            return Failed;
+        if (!why.isEmpty()) {
+            report(invocation.verb().name, why);
+            return Failed;
+        }
+    }
+    Output& output = invocation.output();
+    if (invocation.json()) {
+        JsonArray json(output);
+        for (const NetworkPlace& place : places)
+            json.append(
+                {{QStringLiteral("name"), place.name()},
+                 {QStringLiteral("path"),
+                  textOrNull(pathBelow(VFS::ptr()->networkEntry(), place.name()))},
+                 {QStringLiteral("url"), place.url()},
+                 {QStringLiteral("localPath"), textOrNull(place.localPath())}});
+        json.end();
+        return Done;
+    }
+    Table table;
+    for (const NetworkPlace& place : places)
+        table.add({place.name(), place.url(), place.localPath()});
+    table.write(output);
+    return Done;
+}
+
+QString whyNoUrl(const QString& text, const QUrl& url)
+{
+    const QStringList schemes = {
+        QStringLiteral("smb"), QStringLiteral("ftp"), QStringLiteral("sftp")};
+    if (!url.isValid() || !schemes.contains(url.scheme()) || url.host().isEmpty())
+        return QStringLiteral("not a URL of a network resource: smb, ftp or sftp, and a host");
+    if (!url.password().isEmpty())
+        return QStringLiteral("a bookmark is no place for a password");
+    return text.contains(QChar(QChar::Null)) ? QStringLiteral("not a URL") : QString();
+}
+
+int runAdd(Invocation& invocation)
+{
+    NetworkPlacesManagerProxy* manager = VFS::ptr()->networkPlacesManager();
+    const QString text = invocation.operands().constFirst();
+    const QUrl url(text, QUrl::StrictMode);
+    const QString why = whyNoUrl(text, url);
+    if (!why.isEmpty()) {
+        report(url.password().isEmpty() ? text : url.toString(QUrl::RemovePassword), why);
+        return Failed;
+    }
+    const QString name = invocation.operands().value(1, url.host());
+    if (name.isEmpty() || name.contains(slash) || name == QLatin1String(".") ||
+        name == QLatin1String("..")) {
+        report(name, QStringLiteral("no name for a place: give another behind the URL"));
+        return Failed;
+    }
+    const NetworkPlace place(name, text, QString());
+    const auto isThere = [manager, &place] {
+        return manager->networkPlaces().contains(place);
+    };
+    if (isThere()) {
+        report(name, QStringLiteral("there is a network bookmark of that name already"));
+        return Failed;
+    }
+    bool accepted = false;
+    {
+        const Waiting waiting(QStringLiteral("Asking for the change"));
+        accepted = manager->addNetworkPlace(place);
+    }
+    if (!accepted) {
+        if (!wasInterrupted())
+            report(name, QStringLiteral("the service did not accept the bookmark"));
+        return Failed;
+    }
+    return waitForNews(invocation, name, isThere);
+}
+
+int runRemove(Invocation& invocation)
+{
+    NetworkPlacesManagerProxy* manager = VFS::ptr()->networkPlacesManager();
+    int exitCode = Done;
+    const QStringList operands = invocation.operands();
+    for (const QString& operand : operands) {
+        const QList<NetworkPlace> places = manager->networkPlaces();
+        const QString path = VFS::ptr()->entry(operand).path();
+        const auto first = [&places](const auto& fits) {
+            const auto found = std::find_if(places.begin(), places.end(), fits);
+            return found == places.end() ? NetworkPlace() : *found;
+        };
+        NetworkPlace place =
+            first([&](const NetworkPlace& each) { return each.name() == operand; });
+        if (place.isNull())
+            place = first([&](const NetworkPlace& each) {
+                const QString its = pathBelow(VFS::ptr()->networkEntry(), each.name());
+                return !its.isEmpty() && (its == operand || its == path);
+            });
+        if (place.isNull())
+            place = first([&](const NetworkPlace& each) { return each.url() == operand; });
+        if (place.isNull()) {
+            const QString why = places.isEmpty() ? whyNoBookmarks() : QString();
+            if (wasInterrupted())
+                return Failed;
+            report(operand, why.isEmpty() ? QStringLiteral("no such network bookmark") : why);
+            exitCode = Failed;
+            continue;
+        }
+        {
+            const Waiting waiting(QStringLiteral("Asking for the change"));
+            manager->removeNetworkPlace(place);
+        }
+        const int code = waitForNews(invocation, operand, [manager, &place] {
+            return !manager->networkPlaces().contains(place);
+        });
+        if (wasInterrupted())
+            return Failed;
+        if (code != Done)
+            exitCode = code;
+    }
+    return exitCode;
+}
+
+/// A level of the Samba network: names, and local paths where it has them.
+struct Level
+{
+    StringMap names;
+    QString path; ///< Of the place above; empty for none.
+    bool hasLocalPaths = false;
+    QString why; ///< Why it can't be read, or empty.
+};
+
+Question question(const char* method, const char* signature, const QVariantList& arguments = {})
+{
+    return {
+        QStringLiteral("SmbBrowser"), QLatin1String(method), QLatin1String(signature), arguments};
+}
+
+void fill(Level& level, const QStringList& names, const Question& again)
+{
+    for (const QString& name : names)
+        level.names.insert(name, QString());
+    if (names.isEmpty() && !wasInterrupted())
+        level.why = whyNothing(again);
+}
+
+// Each level is known only through the one above.
+
+Level workgroups()
+{
+    Level level;
+    level.path = VFS::ptr()->sambaNetworkEntry().path();
+    fill(level, VFS::ptr()->smbBrowser()->workgroups(), question("workgroups", "as"));
+    return level;
+}
+
+Level below(const Level& above, const QString& name, const char* what)
+{
+    Level level;
+    level.why = above.why;
+    if (level.why.isEmpty() && !above.names.contains(name))
+        level.why = QStringLiteral("no such ") + QLatin1String(what);
+    if (!above.path.isEmpty())
+        level.path = above.path + slash + name;
+    return level;
+}
+
+Level hosts(const QString& workgroup)
+{
+    Level level = below(workgroups(), workgroup, "workgroup");
+    if (level.why.isEmpty() && !wasInterrupted())
+        fill(
+            level, VFS::ptr()->smbBrowser()->hosts(workgroup),
+            question("hosts", "as", {workgroup}));
+    return level;
+}
+
+Level shares(const QString& workgroup, const QString& host)
+{
+    Level level = below(hosts(workgroup), host, "host or workgroup");
+    level.hasLocalPaths = true;
+    if (!level.why.isEmpty() || wasInterrupted())
+        return level;
+    level.names = VFS::ptr()->smbBrowser()->shares(host, workgroup);
+    if (level.names.isEmpty() && !wasInterrupted())
+        level.why = whyNothing(question("shares", "a{ss}", {host, workgroup}));
+    return level;
+}
+
+int print(Invocation& invocation, const Level& level)
+{
+    if (wasInterrupted())
+        return Failed;
+    const QStringList operands = invocation.operands();
+    if (!level.why.isEmpty()) {
+        report(operands.isEmpty() ? invocation.verb().name : operands.join(slash), level.why);
+        return Failed;
+    }
+    Output& output = invocation.output();
+    JsonArray json(output);
+    Table table;
+    for (auto it = level.names.cbegin(); it != level.names.cend(); ++it) {
+        if (!invocation.json()) {
+            table.add(
+                level.hasLocalPaths ? QStringList({it.key(), it.value()}) : QStringList(it.key()));
+            continue;
+        }
+        const QString path = level.path.isEmpty() ? QString() : level.path + slash + it.key();
+        QJsonObject object = {
+            {QStringLiteral("name"), it.key()}, {QStringLiteral("path"), textOrNull(path)}};
+        if (level.hasLocalPaths)
+            object.insert(QStringLiteral("localPath"), textOrNull(it.value()));
+        json.append(object);
+    }
+    if (invocation.json())
+        json.end();
+    else
+        table.write(output);
+    return Done;
+}
+
+int runBrowse(Invocation& invocation)
+{
+    const QStringList operands = invocation.operands();
+    Level level;
+    {
+        const Waiting waiting(QStringLiteral("Looking at the Samba network"));
+        if (operands.isEmpty())
+            level = workgroups();
+        else if (operands.size() == 1)
+            level = hosts(operands.at(0));
+        else
+            level = shares(operands.at(0), operands.at(1));
+    }
+    return print(invocation, level);
+}
+
+Verb makeVerb(const char* name, const char* operands, const char* summary)
+{
+    Verb verb;
+    verb.name = QStringLiteral("network ") + QLatin1String(name);
+    verb.operands = QLatin1String(operands);
+    verb.summary = QLatin1String(summary);
+    verb.operandKind = OperandKind::Texts;
+    verb.needs = Needs::Service;
+    return verb;
+}
+
+Verb browseVerb(const char* name, const char* operands, int count, const char* summary)
+{
+    Verb verb = makeVerb(name, operands, summary);
+    verb.leastOperands = count;
+    verb.mostOperands = count;
+    verb.run = runBrowse;
+    return verb;
+}
+
+} // namespace
+
+Verb networkVerb()
+{
+    Verb list = makeVerb("list", "", "List the network bookmarks");
+    list.details =
+        QStringLiteral("One bookmark a line: its name, its URL, and its directory while mounted.");
+    list.mostOperands = 0;
+    list.run = runList;
+
+    Verb add = makeVerb("add", "URL [NAME]", "Add a network bookmark");
+    add.details = QStringLiteral(
+        "A URL of the schemes smb, ftp and sftp. Without a name the bookmark gets that of the\n"
+        "host. A name is there once.");
+    add.leastOperands = 1;
+    add.mostOperands = 2;
+    add.printsData = false;
+    add.options = {timeoutOption()};
+    add.run = runAdd;
+
+    Verb remove = makeVerb("remove", "BOOKMARK...", "Remove network bookmarks");
+    remove.details = QStringLiteral("A bookmark is named by its name, its place path, or its URL.");
+    remove.operandKind = OperandKind::Bookmarks;
+    remove.leastOperands = 1;
+    remove.printsData = false;
+    remove.options = {timeoutOption()};
+    remove.run = runRemove;
+
+    Verb shares =
+        browseVerb("shares", "WORKGROUP HOST", 2, "List the shares of a host in the Samba network");
+    shares.details = QStringLiteral("One share a line: its name, and its directory while mounted.");
+
+    Verb verb;
+    verb.name = QStringLiteral("network");
+    verb.operands = QStringLiteral("[OPERAND...]");
+    verb.summary = QStringLiteral("Manage network bookmarks, browse the Samba network");
+    verb.operandKind = OperandKind::Verbs;
+    verb.printsData = false;
+    verb.verbs = {
+        list,
+        add,
+        remove,
+        browseVerb("workgroups", "", 0, "List the workgroups of the Samba network"),
+        browseVerb("hosts", "WORKGROUP", 1, "List the hosts of a workgroup"),
+        shares};
+    return verb;
+}
+
+} // namespace Tool
+} // namespace VeyFM
