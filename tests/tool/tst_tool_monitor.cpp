@@ -64,7 +64,8 @@ public:
 
     bool isRunning() const
     {
-        return m_process.state() == QProcess::Running;
+        // "Starting" until this process has taken notice.
+        return m_process.state() != QProcess::NotRunning;
     }
 
 private:
