@@ -186,7 +186,7 @@ void ToolBookmarkTest::addWaitsForNews()
     scene.service().emitSignal(
         QStringLiteral("FavouritePlacesManager"), QStringLiteral("favouritePlaceAdded"),
         oneArgument(QJsonArray{QStringLiteral("etc"), QStringLiteral("/etc")}));
-    QVERIFY(tool.waitForFinished(20000));
+    QTRY_COMPARE_WITH_TIMEOUT(tool.state(), QProcess::NotRunning, 20000);
     QCOMPARE(tool.exitCode(), 0);
     QCOMPARE(tool.readAllStandardError(), QByteArray());
 }
