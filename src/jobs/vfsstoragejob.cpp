@@ -31,6 +31,8 @@ void VFSStorageJob::run(Factory makeJob, const QString& refusal)
     }
     const StoragePlace place = VFS::ptr()->storagePlace(m_entry);
     Job* const job = (m_storagePlacesManager->*makeJob)(place);
+    // Made without a parent; a request that is still under way goes with this job.
+    job->setParent(this);
     connect(job, &Job::finished, this, &VFSStorageJob::storageJobFinished);
     job->start();
 }
