@@ -37,7 +37,10 @@ QString outcome(Job* job)
 
 // Plain functions: a compiler that checks for undefined behaviour stumbles over pointers to
 // members.
-using Factory = Job* (*)(const Entry&);
+struct Factory
+{
+    Job* (*make)(const Entry&);
+};
 
 Job* mountJob(const Entry& entry)
 {
@@ -96,9 +99,9 @@ void StorageJobsTest::kinds_data()
 {
     QTest::addColumn<Factory>("factory");
     QTest::addColumn<QString>("method");
-    QTest::newRow("mount") << mountJob << u"mountStoragePlace"_s;
-    QTest::newRow("unmount") << unmountJob << u"unmountStoragePlace"_s;
-    QTest::newRow("eject") << ejectJob << u"ejectStoragePlaceDevice"_s;
+    QTest::newRow("mount") << Factory{mountJob} << u"mountStoragePlace"_s;
+    QTest::newRow("unmount") << Factory{unmountJob} << u"unmountStoragePlace"_s;
+    QTest::newRow("eject") << Factory{ejectJob} << u"ejectStoragePlaceDevice"_s;
 }
 
 void StorageJobsTest::kinds()
@@ -106,7 +109,7 @@ void StorageJobsTest::kinds()
     QFETCH(Factory, factory);
     QFETCH(QString, method);
     // False in a good reply is success.
-    const QString result = outcome(factory(vfs->entry(u"Storage devices/sdb"_s)));
+    const QString result = outcome(factory.make(vfs->entry(u"Storage devices/sdb"_s)));
     QCOMPARE(result, u"0 "_s);
     QCOMPARE(
         service->takeCalls(),
@@ -119,9 +122,10 @@ void StorageJobsTest::refusedEntry_data()
 {
     QTest::addColumn<Factory>("factory");
     QTest::addColumn<QString>("text");
-    QTest::newRow("mount") << mountJob << u"1 This type of point cannot be mounted"_s;
-    QTest::newRow("unmount") << unmountJob << u"1 This type of point cannot be unmounted"_s;
-    QTest::newRow("eject") << ejectJob << u"1 This type of point cannot be ejected"_s;
+    QTest::newRow("mount") << Factory{mountJob} << u"1 This type of point cannot be mounted"_s;
+    QTest::newRow("unmount") << Factory{unmountJob}
+                             << u"1 This type of point cannot be unmounted"_s;
+    QTest::newRow("eject") << Factory{ejectJob} << u"1 This type of point cannot be ejected"_s;
 }
 
 void StorageJobsTest::refusedEntry()
@@ -129,9 +133,9 @@ void StorageJobsTest::refusedEntry()
     QFETCH(Factory, factory);
     QFETCH(QString, text);
     for (const Entry& entry : {vfs->entry(u"/etc/passwd"_s), vfs->homeEntry(), Entry()}) {
-        QCOMPARE(outcome(factory(entry)), text);
+        QCOMPARE(outcome(factory.make(entry)), text);
         // Before start() returns.
-        Job* const job = factory(entry);
+        Job* const job = factory.make(entry);
         QSignalSpy finished(job, &Job::finished);
         job->start();
         QCOMPARE(finished.count(), 1);
