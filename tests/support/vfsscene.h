@@ -5,9 +5,9 @@
 #define VEYFM_TESTS_VFSSCENE_H
 
 #include "core/entry.h"
+#include "support/makeentry.h"
 
 #include <QByteArray>
-#include <QDataStream>
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
@@ -20,18 +20,6 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
-
-/// An entry of any content, as a service or a stream may hand one in.
-inline VeyFM::Entry makeEntry(const QString& path, const QString& localPath, int type)
-{
-    QByteArray bytes;
-    QDataStream writer(&bytes, QIODevice::WriteOnly);
-    writer << path << localPath << qint32(type);
-    QDataStream reader(bytes);
-    VeyFM::Entry entry;
-    reader >> entry;
-    return entry;
-}
 
 inline QString text(const char* utf8)
 {
