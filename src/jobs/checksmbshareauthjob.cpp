@@ -1,0 +1,177 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "jobs/checksmbshareauthjob.h"
+
+#include "core/fuse.h"
+#include "vfs/standardpaths.h"
+
+#include <QProcess>
+#include <QProcessEnvironment>
+
+#include <algorithm>
+
+namespace VeyFM {
+
+namespace {
+
+constexpr int toolTimeoutMs = 30000;
+
+// Runs a tool to its end, or until it takes too long, and returns what it printed, line by line.
+// The command is split into words with no shell. How the tool ended is not looked at.
+QStringList linesOf(QProcess& process, const QString& command)
+{
+    QStringList words = QProcess::splitCommand(command);
+    const QString program = words.takeFirst();
+    process.start(program, words, QIODevice::ReadWrite);
+    process.waitForFinished(toolTimeoutMs);
+    return QString::fromLocal8Bit(process.readAllStandardOutput())
+        .split(QLatin1Char('\n'), Qt::SkipEmptyParts);
+}
+
+} // namespace
+
+CheckSmbShareAuthJob::CheckSmbShareAuthJob(
+    QSharedPointer<Authenticator> authenticator, const QString& share, const QString& host,
+    const QString& workgroup, QObject* parent)
+    : Job(parent)
+    , m_authenticator(std::move(authenticator))
+{
+    m_authenticator->setResource(QStringLiteral("smb"), workgroup, host, share);
+}
+
+CheckSmbShareAuthJob::~CheckSmbShareAuthJob() = default;
+
+QString CheckSmbShareAuthJob::share() const
+{
+    return m_authenticator->object();
+}
+
+QString CheckSmbShareAuthJob::host() const
+{
+    return m_authenticator->server();
+}
+
+QString CheckSmbShareAuthJob::workgroup() const
+{
+    return m_authenticator->domain();
+}
+
+QString CheckSmbShareAuthJob::hostForKerberos() const
+{
+    return m_hostForKerberos;
+}
+
+QString CheckSmbShareAuthJob::resourcePath() const
+{
+    return workgroup().isEmpty() ? QStringLiteral("%1/%2").arg(host(), share())
+                                 : QStringLiteral("%1;%2/%3").arg(workgroup(), host(), share());
+}
+
+int CheckSmbShareAuthJob::checkKerberosAuth()
+{
+    const QString canonicalHost = StandardPaths::toCanonicalHostName(host());
+    QProcess process;
+    const QStringList lines =
+        linesOf(process, QStringLiteral("smbclient //%1/%2 -k -c du").arg(canonicalHost, share()));
+    const bool listed = std::any_of(lines.begin(), lines.end(), [](const QString& line) {
+        return line.contains(QLatin1String("Total number of bytes"));
+    });
+    if (!listed) {
+        return 1;
+    }
+    m_hostForKerberos = canonicalHost;
+    return 0;
+}
+
+int CheckSmbShareAuthJob::checkAuth(const QString& user, const QString& password) const
+{
+    QProcess process;
+    QString userArgument = QStringLiteral("-U %"); // A guest.
+    if (!user.isEmpty()) {
+        userArgument = QLatin1String("-U ") + user;
+        if (!password.isEmpty()) {
+            QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+            environment.insert(QStringLiteral("PASSWD"), password);
+            process.setProcessEnvironment(environment);
+        }
+    }
+    const QStringList lines = linesOf(
+        process, QStringLiteral("smbclient //%1/%2 %3 -c du").arg(host(), share(), userArgument));
+    QProcessEnvironment environment = process.processEnvironment();
+    environment.remove(QStringLiteral("PASSWD"));
+    process.setProcessEnvironment(environment);
+
+    // Only a refusal counts. A tool that can't be started, crashes or fails in another way reads
+    // as access granted; what is really wrong will show when the share is used.
+    for (const QString& line : lines) {
+        if (line.contains(QLatin1String("NT_STATUS_ACCESS_DENIED"))) {
+            return AccessDenied;
+        }
+        if (line.contains(QLatin1String("NT_STATUS_LOGON_FAILURE"))) {
+            return LogonFailure;
+        }
+    }
+    return NoRefusal;
+}
+
+void CheckSmbShareAuthJob::start()
+{
+    if (!Fuse::isInFuseGroup()) {
+        finishedWithError(4, tr("You must be in 'fuse' group in order to browse samba shares!"));
+        return;
+    }
+    if (checkKerberosAuth() == 0) {
+        finishedOk();
+        return;
+    }
+    const int guestResult = checkAuth(QString(), QString());
+    if (guestResult == NoRefusal) {
+        finishedOk();
+        return;
+    }
+    if (askUntilGranted(guestResult)) {
+        finishedOk();
+    } else {
+        finishedWithError(2, tr("Login cancelled"));
+    }
+}
+
+bool CheckSmbShareAuthJob::askUntilGranted(int guestResult)
+{
+    int result = guestResult;
+    bool userChanged = false;
+    bool cancelled = false;
+    QString user;
+    QString password = m_authenticator->requestPassword(
+        false, QString(), QString(), user, &userChanged, &cancelled);
+    if (!cancelled) {
+        result = checkAuth(user, password);
+        if (result == NoRefusal) {
+            // A first answer that works is not reported as accepted, unlike a later one.
+            return true;
+        }
+        m_authenticator->credentialsRejected(user);
+    }
+    // A user who gave up at the first question is asked once more, with the reason why the guest
+    // was refused. The flags are not cleared in between.
+    while (true) {
+        const bool denied = result == AccessDenied;
+        const QString title = denied ? tr("Access denied") : tr("Logon failure");
+        const QString message =
+            (denied ? tr("Access denied for %1") : tr("Logon failure for %1")).arg(resourcePath());
+        password =
+            m_authenticator->requestPassword(true, title, message, user, &userChanged, &cancelled);
+        if (cancelled) {
+            return false;
+        }
+        result = checkAuth(user, password);
+        if (result == NoRefusal) {
+            m_authenticator->credentialsAccepted();
+            return true;
+        }
+        m_authenticator->credentialsRejected(user);
+    }
+}
+
+} // namespace VeyFM

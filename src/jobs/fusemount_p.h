@@ -1,0 +1,59 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_FUSEMOUNT_P_H
+#define VEYFM_FUSEMOUNT_P_H
+
+#include "jobs/authenticator.h"
+
+#include <QSharedPointer>
+#include <QString>
+#include <QUrl>
+
+namespace VeyFM {
+
+/// What the FTP and SFTP jobs have in common: a URL, the directory that it is mounted on, and the
+/// question for a password.
+class FuseMount
+{
+public:
+    FuseMount(const QString& url, QSharedPointer<Authenticator> authenticator);
+
+    QString user() const;
+    QString host() const;
+    /// "user@host", or "host" without a user.
+    QString account() const;
+
+    /**
+     * Whether user and host may be handed to a tool. A host or target that begins with a dash
+     * would be an option of the tool, which can run commands; a slash would leave the mount
+     * directory.
+     */
+    bool isSafe() const;
+
+    /// Where the service says that the URL's root is mounted already; empty if nowhere. Its word
+    /// is taken as it stands.
+    QString registeredMountPath() const;
+    /// Tells the service.
+    void registerMount() const;
+
+    /// Makes the directory of the mount, and removes the one of an earlier attempt if that
+    /// differs.
+    void setMountPath(const QString& path);
+    /// Removes the directory, if there is one and it is empty.
+    void removeMountDirectory() const;
+
+    enum Answer { Answered, UserChanged, Cancelled };
+    /// Asks for the password; a changed user name goes into the URL.
+    Answer requestPassword(const QString& title, const QString& message, QString* password);
+    /// Tells the authenticator, if there is a user that it can be told of.
+    void credentialsRejected() const;
+
+    QUrl url;
+    QString mountPath;
+    const QSharedPointer<Authenticator> authenticator;
+};
+
+} // namespace VeyFM
+
+#endif

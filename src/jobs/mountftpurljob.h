@@ -1,0 +1,54 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_MOUNTFTPURLJOB_H
+#define VEYFM_MOUNTFTPURLJOB_H
+
+#include "jobs/authenticator.h"
+#include "jobs/job.h"
+
+#include <QSharedPointer>
+
+namespace VeyFM {
+
+class MountFtpURLJobPrivate;
+
+/**
+ * Makes an "ftp" URL reachable in the local file system, by running `curlftpfs` on a directory
+ * below VFSSettings::mountRootPath(). The tool asks for the password, the job asks the
+ * authenticator, and the answer goes to the tool's standard input. A mount is recorded in the
+ * service, so that other processes find it; one that is recorded there already is taken.
+ *
+ * Ends with code 5 for another scheme, for a host or user that no tool may be given, and when the
+ * tool fails; with code 2 when the user gives up. A tool that can't be started leaves the job
+ * running.
+ */
+class VEYFMVFS_EXPORT MountFtpURLJob : public Job
+{
+    Q_OBJECT
+
+public:
+    MountFtpURLJob(
+        QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
+    ~MountFtpURLJob() override;
+
+    QString url() const;       ///< The URL, with a user name that was changed on the way.
+    QString localPath() const; ///< The result, empty until success.
+
+    void start() override;
+
+private Q_SLOTS:
+    void readStandardError();
+    void processFinished(int exitCode);
+
+private:
+    Q_DECLARE_PRIVATE(MountFtpURLJob)
+    static QString ftpDirPath();
+    void updateMountPath();
+    void run();
+    bool checkAlreadyMounted();
+};
+
+} // namespace VeyFM
+
+#endif

@@ -1,0 +1,55 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_MOUNTFUSEENTRYJOB_H
+#define VEYFM_MOUNTFUSEENTRYJOB_H
+
+#include "core/entry.h"
+#include "jobs/authenticator.h"
+#include "jobs/job.h"
+
+#include <QSharedPointer>
+
+namespace VeyFM {
+
+/**
+ * Makes a network URL show in the place tree of every process of the session: the job for a host
+ * that wants to show a URL. It takes a mount that is there, or makes one with MountURLJob, has
+ * the service record it, and waits until the service has told everybody.
+ *
+ * There is no bound on that wait: a service that never announces the mount leaves the job
+ * running, and so does a user who gives up an SFTP login at its first question.
+ *
+ * Ends with code 2 for a user outside the "fuse" group, with code 1 when the URL makes no place,
+ * and with the code of MountURLJob.
+ */
+class VEYFMVFS_EXPORT MountFuseEntryJob : public Job
+{
+    Q_OBJECT
+
+public:
+    MountFuseEntryJob(
+        QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
+    ~MountFuseEntryJob() override;
+
+    /// The path of the URL's entry, for VFS::entry(); empty until success.
+    QString path() const;
+
+    void start() override;
+
+private Q_SLOTS:
+    void slotMountUrlFinished(Job* job);
+    void slotFuseMountAdded(const QString& url, const Entry& entry);
+
+private:
+    QString pathBelow(const Entry& mount) const;
+
+    const QString m_url;
+    QString m_path;
+    const QSharedPointer<Authenticator> m_authenticator;
+    QString m_waitedUrl; // Whose registration the job waits for; empty until then.
+};
+
+} // namespace VeyFM
+
+#endif

@@ -1,0 +1,60 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_MOUNTSFTPURLJOB_H
+#define VEYFM_MOUNTSFTPURLJOB_H
+
+#include "jobs/authenticator.h"
+#include "jobs/job.h"
+
+#include <QSharedPointer>
+
+namespace VeyFM {
+
+class MountSFtpURLJobPrivate;
+
+/**
+ * Makes an "sftp" URL reachable in the local file system, by running `sshfs` on a directory below
+ * VFSSettings::mountRootPath(). The tool sits before a pseudo-terminal, on which the job answers
+ * its questions (the password, the key of an unknown host) with what the authenticator says. A
+ * mount is recorded in the service, so that other processes find it; one that is recorded there
+ * already is taken.
+ *
+ * Everything happens inside start(), which blocks for as long as the tool runs. A path that
+ * begins with "/~" means the user's home directory on the host, and is a mount of its own.
+ *
+ * Ends with code 5 for another scheme, for a host or user that no tool may be given, and when the
+ * tool fails; with code 2 when the user gives up after a refusal. A user who gives up at a
+ * password prompt, or refuses the key of a host, leaves the job unfinished: start() returns and
+ * finished() never comes.
+ */
+class VEYFMVFS_EXPORT MountSFtpURLJob : public Job
+{
+    Q_OBJECT
+
+public:
+    MountSFtpURLJob(
+        QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
+    ~MountSFtpURLJob() override;
+
+    QString url() const;       ///< The URL, with a user name that was changed on the way.
+    QString localPath() const; ///< The result, empty until success.
+
+    void start() override;
+
+private:
+    Q_DECLARE_PRIVATE(MountSFtpURLJob)
+    static QString sftpDirPath();
+    void updateMountPath();
+    bool checkAlreadyMounted();
+    void run();
+    bool runOnce();
+    bool converseSshfs();
+    bool processFinished(int status);
+    void askHostKeyQuestion(const QByteArray& output);
+    bool answerPasswordPrompt();
+};
+
+} // namespace VeyFM
+
+#endif
