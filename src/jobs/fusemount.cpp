@@ -4,6 +4,7 @@
 #include "jobs/fusemount_p.h"
 
 #include "core/mountpaths.h"
+#include "jobs/urlscheme_p.h"
 #include "service/fusemountsmanagerproxy.h"
 #include "vfs/vfs.h"
 
@@ -25,7 +26,8 @@ bool isHarmless(const QString& name)
 } // namespace
 
 FuseMount::FuseMount(const QString& url, QSharedPointer<Authenticator> authenticator)
-    : url(url)
+    : scheme(writtenScheme(url))
+    , url(url)
     , authenticator(std::move(authenticator))
 {
 }

@@ -49,6 +49,7 @@ public:
     /// Tells the authenticator, if there is a user that it can be told of.
     void credentialsRejected() const;
 
+    const QString scheme; // As it was written.
     QUrl url;
     QString mountPath;
     const QSharedPointer<Authenticator> authenticator;

@@ -57,7 +57,7 @@ QString MountFtpURLJob::localPath() const
 void MountFtpURLJob::start()
 {
     Q_D(MountFtpURLJob);
-    if (d->mount.url.scheme() != QLatin1String("ftp")) {
+    if (d->mount.scheme != QLatin1String("ftp")) {
         finishedWithError(5, tr("Url scheme is not ftp"));
         return;
     }

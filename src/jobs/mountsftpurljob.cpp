@@ -78,7 +78,7 @@ QString MountSFtpURLJob::localPath() const
 void MountSFtpURLJob::start()
 {
     Q_D(MountSFtpURLJob);
-    if (d->mount.url.scheme() != QLatin1String("sftp")) {
+    if (d->mount.scheme != QLatin1String("sftp")) {
         finishedWithError(5, tr("Url scheme is not sftp"));
         return;
     }

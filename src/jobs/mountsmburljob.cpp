@@ -5,10 +5,9 @@
 
 #include "core/smburl.h"
 #include "jobs/checksmbshareauthjob.h"
+#include "jobs/urlscheme_p.h"
 #include "service/smbbrowserproxy.h"
 #include "vfs/vfs.h"
-
-#include <QUrl>
 
 namespace VeyFM {
 
@@ -40,8 +39,7 @@ QString MountSmbURLJob::localPath() const
 
 void MountSmbURLJob::start()
 {
-    // QUrl lowers the case of a scheme; the text has to be "smb" as it stands.
-    if (QUrl(m_url).scheme() != QLatin1String("smb")) {
+    if (writtenScheme(m_url) != QLatin1String("smb")) {
         finishedWithError(5, tr("Url scheme is not smb"));
         return;
     }

@@ -6,8 +6,7 @@
 #include "jobs/mountftpurljob.h"
 #include "jobs/mountsftpurljob.h"
 #include "jobs/mountsmburljob.h"
-
-#include <QUrl>
+#include "jobs/urlscheme_p.h"
 
 namespace VeyFM {
 
@@ -33,7 +32,7 @@ QString MountURLJob::localPath() const
 
 void MountURLJob::start()
 {
-    const QString scheme = QUrl(m_url).scheme();
+    const QString scheme = writtenScheme(m_url);
     Job* job = nullptr;
     if (scheme == QLatin1String("smb")) {
         job = new MountSmbURLJob(m_authenticator, m_url, this);
