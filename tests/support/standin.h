@@ -1,0 +1,127 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TESTS_STANDIN_H
+#define VEYFM_TESTS_STANDIN_H
+
+#include <QByteArray>
+#include <QByteArrayList>
+#include <QDir>
+#include <QFile>
+#include <QTemporaryDir>
+
+/**
+ * A tool that plays what the test says, first on PATH for as long as the object lives.
+ *
+ * Each expect() is one run, as lines:
+ *
+ *   out TEXT, err TEXT   prints; \n, \\ and \0 stand for what they do in C
+ *   read                 takes a line from standard input
+ *   echo on, echo off    switches the echo of the terminal
+ *   drained              waits until all that it printed on standard error has been read
+ *   hang                 waits for a signal
+ *   kill N, exit N       ends
+ *
+ * At the end of the lines it exits with 0. A run that nobody expects exits with 93, and shows in
+ * runs() like any other.
+ */
+class StandIn
+{
+public:
+    explicit StandIn(const QByteArray& tool)
+        : m_tool(tool)
+        , m_path(qgetenv("PATH"))
+    {
+        QDir(m_directory.path()).mkdir(QStringLiteral("bin"));
+        QFile::link(
+            QStringLiteral(VEYFM_STANDIN_PROGRAM),
+            m_directory.filePath(QStringLiteral("bin/") + QString::fromLatin1(tool)));
+        qputenv("PATH", m_directory.filePath(QStringLiteral("bin")).toLocal8Bit() + ':' + m_path);
+        qputenv("VEYFM_STANDIN", m_directory.path().toLocal8Bit());
+    }
+    ~StandIn()
+    {
+        qputenv("PATH", m_path);
+        qunsetenv("VEYFM_STANDIN");
+    }
+    StandIn(const StandIn&) = delete;
+    StandIn& operator=(const StandIn&) = delete;
+
+    void expect(const QByteArrayList& lines)
+    {
+        QFile file(path(++m_expected, "play"));
+        if (!file.open(QIODevice::WriteOnly)) {
+            qFatal("%s", qPrintable(file.errorString()));
+        }
+        file.write(lines.join('\n') + '\n');
+    }
+
+    /// How often the tool was started.
+    int runs() const
+    {
+        int run = 0;
+        while (QFile::exists(path(run + 1, "args"))) {
+            ++run;
+        }
+        return run;
+    }
+
+    int expected() const
+    {
+        return m_expected;
+    }
+
+    /// The arguments of a run, counted from 1.
+    QByteArrayList arguments(int run) const
+    {
+        return zeroTerminated(read(run, "args"));
+    }
+
+    QByteArrayList environment(int run) const
+    {
+        return zeroTerminated(read(run, "env"));
+    }
+
+    /// What a run has read.
+    QByteArray input(int run) const
+    {
+        return read(run, "input");
+    }
+
+    /// The command line as every user of the system could see it.
+    QByteArray commandLine(int run) const
+    {
+        return read(run, "cmdline");
+    }
+
+private:
+    static QByteArrayList zeroTerminated(QByteArray bytes)
+    {
+        if (bytes.isEmpty()) {
+            return {};
+        }
+        bytes.chop(1);
+        return bytes.split('\0');
+    }
+
+    QString path(int run, const char* suffix) const
+    {
+        return m_directory.filePath(QStringLiteral("%1.%2.%3")
+                                        .arg(
+                                            QString::fromLatin1(m_tool), QString::number(run),
+                                            QString::fromLatin1(suffix)));
+    }
+
+    QByteArray read(int run, const char* suffix) const
+    {
+        QFile file(path(run, suffix));
+        return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
+    }
+
+    QTemporaryDir m_directory;
+    const QByteArray m_tool;
+    const QByteArray m_path;
+    int m_expected = 0;
+};
+
+#endif
