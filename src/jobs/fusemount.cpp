@@ -48,10 +48,10 @@ QString FuseMount::account() const
     return name.isEmpty() ? host() : name + QLatin1Char('@') + host();
 }
 
-bool FuseMount::isSafe() const
+bool FuseMount::isSafe(const QString& target) const
 {
     const QLatin1Char dash('-');
-    return !host().isEmpty() && !host().startsWith(dash) && !account().startsWith(dash) &&
+    return !host().isEmpty() && !host().startsWith(dash) && !target.startsWith(dash) &&
            isHarmless(user()) && isHarmless(host());
 }
 

@@ -25,11 +25,11 @@ public:
     QString account() const;
 
     /**
-     * Whether user and host may be handed to a tool. A host or target that begins with a dash
-     * would be an option of the tool, which can run commands; a slash would leave the mount
-     * directory.
+     * Whether user and host may be handed to a tool whose first argument is @p target. One that
+     * begins with a dash would be an option of the tool, which can run commands; a slash would
+     * leave the mount directory.
      */
-    bool isSafe() const;
+    bool isSafe(const QString& target) const;
 
     /// Where the service says that the URL's root is mounted already; empty if nowhere. Its word
     /// is taken as it stands.

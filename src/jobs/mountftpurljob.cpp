@@ -93,7 +93,7 @@ void MountFtpURLJob::updateMountPath()
 void MountFtpURLJob::run()
 {
     Q_D(MountFtpURLJob);
-    if (!d->mount.isSafe()) {
+    if (!d->mount.isSafe(d->mount.host())) {
         d->mount.removeMountDirectory();
         finishedWithError(5, tr("Mounting ftp resource failed"));
         return;

@@ -124,7 +124,7 @@ void MountSFtpURLJob::run()
 bool MountSFtpURLJob::runOnce()
 {
     Q_D(MountSFtpURLJob);
-    if (!d->mount.isSafe()) {
+    if (!d->mount.isSafe(d->mount.account())) {
         d->mount.removeMountDirectory();
         finishedWithError(5, tr("Mounting sftp resource failed"));
         return false;
