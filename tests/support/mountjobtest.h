@@ -72,10 +72,10 @@ protected:
         return u"FuseMountsManager.addMount[\"%1\",\"%2\"]"_s.arg(url, path);
     }
 
-    /// A directory below the root of all mounts.
+    /// Something below the root of all mounts; it begins with a slash.
     QString mountDir(const QString& relative) const
     {
-        return scene.home() + u"/.vey-fm-vfs/"_s + relative;
+        return scene.home() + u"/.vey-fm-vfs"_s + relative;
     }
 
     VfsScene scene;

@@ -159,7 +159,9 @@ int main(int argc, char** argv)
     }
     std::string line;
     while (std::getline(scenario, line)) {
-        play(line);
+        if (!line.empty()) {
+            play(line);
+        }
     }
     return 0;
 }
