@@ -38,9 +38,9 @@ public:
         const QString& workgroup, QObject* parent = nullptr);
     ~CheckSmbShareAuthJob() override;
 
-    QString share() const;
-    QString host() const;
-    QString workgroup() const;
+    QString share() const;     ///< The share, as the authenticator holds it.
+    QString host() const;      ///< The host, likewise.
+    QString workgroup() const; ///< The workgroup, likewise; may be empty.
 
     /// The canonical host name under which the share has to be reached, where Kerberos is what
     /// worked; empty otherwise.

@@ -28,6 +28,7 @@ class VEYFMVFS_EXPORT MountFtpURLJob : public Job
     Q_OBJECT
 
 public:
+    /// A job for a URL as text; it asks @p authenticator, which it holds.
     MountFtpURLJob(
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountFtpURLJob() override;

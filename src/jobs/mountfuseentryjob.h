@@ -28,6 +28,7 @@ class VEYFMVFS_EXPORT MountFuseEntryJob : public Job
     Q_OBJECT
 
 public:
+    /// A job for a URL as text; it asks @p authenticator, which it holds.
     MountFuseEntryJob(
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountFuseEntryJob() override;

@@ -33,6 +33,7 @@ class VEYFMVFS_EXPORT MountSFtpURLJob : public Job
     Q_OBJECT
 
 public:
+    /// A job for a URL as text; it asks @p authenticator, which it holds.
     MountSFtpURLJob(
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountSFtpURLJob() override;

@@ -24,6 +24,7 @@ class VEYFMVFS_EXPORT MountSmbURLJob : public Job
     Q_OBJECT
 
 public:
+    /// A job for a URL as text; it asks @p authenticator, which it holds.
     MountSmbURLJob(
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountSmbURLJob() override;

@@ -20,6 +20,7 @@ class VEYFMVFS_EXPORT MountURLJob : public Job
     Q_OBJECT
 
 public:
+    /// A job for a URL as text; it asks @p authenticator, which it holds.
     MountURLJob(
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountURLJob() override;

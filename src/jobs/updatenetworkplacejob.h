@@ -23,12 +23,13 @@ class VEYFMVFS_EXPORT UpdateNetworkPlaceJob : public Job
     Q_OBJECT
 
 public:
+    /// A job for the entry of a bookmark; it asks @p authenticator, which it holds.
     UpdateNetworkPlaceJob(
         QSharedPointer<Authenticator> authenticator, const Entry& netPlaceEntry,
         QObject* parent = nullptr);
     ~UpdateNetworkPlaceJob() override;
 
-    Entry netPlaceEntry() const;
+    Entry netPlaceEntry() const; ///< The entry that was passed in.
 
     void start() override;
 

@@ -25,12 +25,13 @@ class VEYFMVFS_EXPORT UpdateSmbEntryJob : public Job
     Q_OBJECT
 
 public:
+    /// A job for a Samba entry; it asks @p authenticator, which it holds.
     UpdateSmbEntryJob(
         QSharedPointer<Authenticator> authenticator, const Entry& smbEntry,
         QObject* parent = nullptr);
     ~UpdateSmbEntryJob() override;
 
-    Entry smbEntry() const;
+    Entry smbEntry() const; ///< The entry that was passed in.
 
     void start() override;
 
