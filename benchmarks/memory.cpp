@@ -4,6 +4,7 @@
 // Memory of a listing, an entry: VFS::childs() beside GIO.
 
 #include "support/contest.h"
+#include "support/cost.h"
 #include "support/directories.h"
 #include "support/gio.h"
 #include "support/options.h"
@@ -14,7 +15,6 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include <malloc.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -23,12 +23,6 @@ namespace Benchmarks {
 namespace {
 
 constexpr int pathLength = 45;
-
-double bytesInUse()
-{
-    const struct mallinfo2 info = mallinfo2();
-    return double(info.uordblks + info.hblkhd);
-}
 
 // What stays allocated for as long as the result of the work lives. A process of its own each
 // time: allocators keep what was freed, and a second run would find it there.
