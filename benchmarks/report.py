@@ -37,6 +37,8 @@ def measured(name, value):
         return f"{value:.0f} bytes"
     if name.startswith("system calls"):
         return f"{value:.2f}"
+    if name.startswith("round trips"):
+        return f"{value:.0f}"
     if "growth" in name and value < 1000 and name.split(",")[0] != "event":
         return f"{value:.2f} x inotify"
     if value >= 1e6:

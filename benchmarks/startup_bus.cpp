@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-// A program that starts and opens the session bus, of which there is none.
+// A program that starts and opens the session bus: there is one if it has an argument.
 
 #include <QCoreApplication>
 #include <QDBusConnection>
@@ -9,5 +9,5 @@
 int main(int argc, char** argv)
 {
     const QCoreApplication application(argc, argv);
-    return QDBusConnection::sessionBus().isConnected() ? 1 : 0;
+    return QDBusConnection::sessionBus().isConnected() == (argc > 1) ? 0 : 1;
 }

@@ -54,6 +54,8 @@ int main(int argc, char** argv)
     }
     Benchmarks::registerRows(options);
     benchmark::RunSpecifiedBenchmarks();
+    // What the rows hold, a bus for one, ends while there is an application.
+    benchmark::ClearRegisteredBenchmarks();
     benchmark::Shutdown();
     return 0;
 }
