@@ -43,5 +43,10 @@ int main(int argc, char** argv)
         !bus.registerService(QStringLiteral("org.veylabs.vey-fm.vfs"))) {
         qFatal("%s", qPrintable(bus.lastError().message()));
     }
+    // QtDBus goes on without its bus, and the process would stay when the test is long over.
+    bus.connect(
+        QString(), QStringLiteral("/org/freedesktop/DBus/Local"),
+        QStringLiteral("org.freedesktop.DBus.Local"), QStringLiteral("Disconnected"), &app,
+        SLOT(quit()));
     return app.exec();
 }
