@@ -53,8 +53,8 @@ if(VEYFM_SANITIZE)
     )
     add_link_options(-fsanitize=${VEYFM_SANITIZE})
     if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
-        # The checks that are built in lead this warning astray.
-        add_compile_options(-Wno-maybe-uninitialized)
+        # The checks that are built in lead these warnings astray.
+        add_compile_options(-Wno-maybe-uninitialized -Wno-stringop-overread)
     endif()
     if(VEYFM_SANITIZE MATCHES undefined)
         add_compile_options(-fno-sanitize-recover=undefined)
