@@ -9,6 +9,9 @@ if(TARGET translations)
     if(TARGET tst_translations)
         target_compile_definitions(tst_translations PRIVATE
             VEYFM_CATALOGUES="${PROJECT_BINARY_DIR}/translations"
+            VEYFM_LUPDATE="${VEYFM_LUPDATE}"
+            VEYFM_SOURCES="${PROJECT_SOURCE_DIR}/src"
+            VEYFM_TRANSLATIONS="${PROJECT_SOURCE_DIR}/translations"
         )
     endif()
 endif()

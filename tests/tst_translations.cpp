@@ -2,10 +2,64 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include <QCoreApplication>
+#include <QFile>
 #include <QLocale>
+#include <QProcess>
+#include <QRegularExpression>
 #include <QSet>
+#include <QTemporaryDir>
 #include <QTranslator>
+#include <QXmlStreamReader>
 #include <QtTest>
+
+namespace {
+
+struct Message
+{
+    QString source;
+    QString translation;
+    bool isFinished;
+};
+
+QList<Message> messagesOf(const QString& path)
+{
+    QList<Message> messages;
+    QFile file(path);
+    if (!file.open(QIODevice::ReadOnly)) {
+        return messages;
+    }
+    QXmlStreamReader xml(&file);
+    Message message;
+    while (!xml.atEnd()) {
+        xml.readNext();
+        if (!xml.isStartElement()) {
+            continue;
+        }
+        if (xml.name() == QLatin1String("source")) {
+            message.source = xml.readElementText();
+        } else if (xml.name() == QLatin1String("translation")) {
+            message.isFinished = !xml.attributes().hasAttribute(QStringLiteral("type"));
+            message.translation = xml.readElementText();
+            messages.append(message);
+        }
+    }
+    return xml.hasError() ? QList<Message>() : messages;
+}
+
+/// "%1" and the like, sorted.
+QStringList placeholdersOf(const QString& text)
+{
+    QStringList found;
+    QRegularExpressionMatchIterator match =
+        QRegularExpression(QStringLiteral("%\\d+")).globalMatch(text);
+    while (match.hasNext()) {
+        found.append(match.next().captured());
+    }
+    found.sort();
+    return found;
+}
+
+} // namespace
 
 class TestTranslations : public QObject
 {
@@ -14,6 +68,8 @@ class TestTranslations : public QObject
 private Q_SLOTS:
     void namesOfPlaces_data();
     void namesOfPlaces();
+    void everyTextIsTranslated_data();
+    void everyTextIsTranslated();
 };
 
 void TestTranslations::namesOfPlaces_data()
@@ -47,6 +103,41 @@ void TestTranslations::namesOfPlaces()
         names.insert(name);
     }
     QCOMPARE(translator.translate("VeyFM::VFS", "Home"), home);
+}
+
+void TestTranslations::everyTextIsTranslated_data()
+{
+    QTest::addColumn<QString>("catalogue");
+    QTest::newRow("de") << QStringLiteral("libveyfmvfs_de.ts");
+    QTest::newRow("ru") << QStringLiteral("libveyfmvfs_ru.ts");
+}
+
+// As the sources have the texts today, not as the catalogue had them at its last update.
+void TestTranslations::everyTextIsTranslated()
+{
+    QFETCH(QString, catalogue);
+    const QTemporaryDir directory;
+    const QString copy = directory.filePath(catalogue);
+    QVERIFY(QFile::copy(QStringLiteral(VEYFM_TRANSLATIONS "/") + catalogue, copy));
+    const int before = messagesOf(copy).size();
+    QVERIFY(QFile::setPermissions(copy, QFile::ReadOwner | QFile::WriteOwner));
+    QCOMPARE(
+        QProcess::execute(
+            QStringLiteral(VEYFM_LUPDATE),
+            {QStringLiteral("-silent"), QStringLiteral("-no-obsolete"),
+             QStringLiteral(VEYFM_SOURCES), QStringLiteral("-ts"), copy}),
+        0);
+
+    const QList<Message> messages = messagesOf(copy);
+    QCOMPARE(messages.size(), before);
+    QVERIFY(messages.size() > 12);
+    for (const Message& message : messages) {
+        QVERIFY2(message.isFinished, qPrintable(message.source));
+        QVERIFY2(!message.translation.isEmpty(), qPrintable(message.source));
+        QCOMPARE(placeholdersOf(message.translation), placeholdersOf(message.source));
+        QCOMPARE(
+            message.translation.count(QLatin1Char('\n')), message.source.count(QLatin1Char('\n')));
+    }
 }
 
 QTEST_GUILESS_MAIN(TestTranslations)
