@@ -80,6 +80,11 @@ grep -q "veyfmvfs_DIR:PATH=$prefix/" "$work/cmake/CMakeCache.txt" ||
 cmake --build "$work/cmake" >"$work/build.log" || fail "the build by find_package failed: see $work"
 "$work/cmake/consumer" || fail "the consumer by find_package failed"
 
+cmake -S "$source/examples/mount" -B "$work/example" -DCMAKE_CXX_COMPILER="$CXX" \
+    -DCMAKE_PREFIX_PATH="$prefix" >"$work/example.log" || fail "the example: see $work/example.log"
+cmake --build "$work/example" >>"$work/example.log" || fail "the example: see $work/example.log"
+[[ $("$work/example/mount-example" 2>&1) == *usage* ]] || fail "the example does not run"
+
 # In the 0.x series another minor version is another interface.
 sed 's/find_package(veyfmvfs [0-9.]*/find_package(veyfmvfs 0.0/' \
     "$source/tests/consumer/CMakeLists.txt" >"$work/older.txt"

@@ -1,0 +1,75 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "consoleauthenticator.h"
+
+#include <QTextStream>
+
+#include <termios.h>
+#include <unistd.h>
+
+namespace {
+
+/// What is typed does not show as long as this lives.
+class HiddenInput
+{
+public:
+    HiddenInput()
+    {
+        m_isTerminal = ::tcgetattr(STDIN_FILENO, &m_before) == 0;
+        termios hidden = m_before;
+        hidden.c_lflag &= ~tcflag_t(ECHO);
+        if (m_isTerminal) {
+            ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &hidden);
+        }
+    }
+    ~HiddenInput()
+    {
+        if (m_isTerminal) {
+            ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &m_before);
+        }
+    }
+
+private:
+    Q_DISABLE_COPY(HiddenInput)
+
+    bool m_isTerminal = false;
+    termios m_before = {};
+};
+
+/// A line; null at the end of the input.
+QString readLine(const QString& prompt)
+{
+    static QTextStream input(stdin);
+    QTextStream(stdout) << prompt << Qt::flush;
+    return input.readLine();
+}
+
+} // namespace
+
+std::optional<Credentials>
+ConsoleAuthenticator::ask(const QString& server, const QString& user, bool wasRejected)
+{
+    if (wasRejected) {
+        QTextStream(stdout) << QStringLiteral("The login was refused.\n");
+    }
+    const QString name = readLine(QStringLiteral("User on %1 [%2]: ").arg(server, user));
+    Credentials credentials = {name.isEmpty() ? user : name, QString()};
+    if (credentials.user.isEmpty()) {
+        return std::nullopt;
+    }
+    {
+        const HiddenInput hidden;
+        credentials.password = readLine(QStringLiteral("Password: "));
+    }
+    QTextStream(stdout) << '\n';
+    if (credentials.password.isNull()) {
+        return std::nullopt;
+    }
+    return credentials;
+}
+
+bool ConsoleAuthenticator::confirm(const QString& text)
+{
+    return readLine(text + QLatin1Char(' ')) == QLatin1String("yes");
+}

@@ -1,0 +1,137 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "support/servicescene.h"
+#include "support/standin.h"
+#include "support/terminalsession.h"
+#include "support/vfsscene.h"
+
+#include <QTest>
+
+#include <memory>
+
+namespace {
+
+const QByteArrayList asks = {"echo off", "out anna@host's password: ", "read", "echo on"};
+const QByteArrayList refuses =
+    asks + QByteArrayList({"out read: Connection reset by peer\\n", "exit 1"});
+const QByteArrayList asksForKey = {"out key fingerprint is SHA256:ab (yes/no)? ", "read"};
+
+} // namespace
+
+/// The example of a host that mounts, at work on a terminal.
+class ExampleMountTest : public QObject
+{
+    Q_OBJECT
+
+private Q_SLOTS:
+    void initTestCase();
+    void init();
+    void cleanup();
+    void asksOnceForWhatTheJobAsksTwice();
+    void endsWhereTheJobDoesNot_data();
+    void endsWhereTheJobDoesNot();
+    void tellsFailures();
+
+private:
+    std::unique_ptr<TerminalSession> run(const QString& url) const
+    {
+        return std::make_unique<TerminalSession>(
+            QStringLiteral(VEYFM_EXAMPLE), QStringList(url), scene.root(),
+            QProcessEnvironment::systemEnvironment());
+    }
+
+    VfsScene scene;
+    ServiceScene service;
+    std::unique_ptr<StandIn> tool;
+};
+
+void ExampleMountTest::initTestCase()
+{
+    QVERIFY2(service.start(object(R"({"echo": true})")), qPrintable(service.errorString()));
+}
+
+void ExampleMountTest::init()
+{
+    tool = std::make_unique<StandIn>("sshfs");
+}
+
+void ExampleMountTest::cleanup()
+{
+    QCOMPARE(tool->runs(), tool->expected());
+    tool.reset();
+}
+
+void ExampleMountTest::asksOnceForWhatTheJobAsksTwice()
+{
+    tool->expect(asks); // As nobody in particular, to learn the name.
+    tool->expect(refuses);
+    tool->expect(asks);
+    QVERIFY(scene.makeDir("home/.vey-fm-vfs") && scene.makeDir("home/.vey-fm-vfs/sftp"));
+    QVERIFY(scene.makeDir("home/.vey-fm-vfs/sftp/anna@host"));
+    QVERIFY(scene.makeFile("home/.vey-fm-vfs/sftp/anna@host/letter"));
+
+    const auto example = run(QStringLiteral("sftp://host/"));
+    QVERIFY2(example->waitFor("User on host []: "), example->output().constData());
+    example->type("anna\n");
+    QVERIFY(example->waitFor("Password: "));
+    example->type("wrong\n");
+    QVERIFY2(example->waitFor("User on host [anna]: "), example->output().constData());
+    example->type("\n");
+    QVERIFY(example->waitFor("[anna]: \nPassword: "));
+    example->type("right\n");
+    QCOMPARE(example->waitForEnd(), 0);
+
+    QCOMPARE(example->output().count("Password: "), 2);
+    QCOMPARE(example->output().count("The login was refused."), 1);
+    QVERIFY2(example->output().endsWith("/letter\n"), example->output().constData());
+    QVERIFY(!example->output().contains("wrong") && !example->output().contains("right"));
+    QCOMPARE(tool->input(1), QByteArray("\n"));
+    QCOMPARE(tool->input(2), QByteArray("wrong\n"));
+    QCOMPARE(tool->input(3), QByteArray("right\n"));
+}
+
+void ExampleMountTest::endsWhereTheJobDoesNot_data()
+{
+    QTest::addColumn<QByteArrayList>("play");
+    QTest::addColumn<QByteArrayList>("dialogue"); // A prompt, and what is typed there.
+
+    const QByteArray password = "Password: ";
+    QTest::newRow("given up") << asks + QByteArrayList({"exit 1"})
+                              << QByteArrayList({"User on host [anna]: ", "\x04"});
+    QTest::newRow("host not trusted") << asksForKey + QByteArrayList({refuses.at(4), "exit 1"})
+                                      << QByteArrayList({"(yes/no)? ", "no\n"});
+    QTest::newRow("refused in the run of the host key")
+        << asksForKey + refuses
+        << QByteArrayList(
+               {"(yes/no)? ", "yes\n", "User on host [anna]: ", "\n", password, "secret\n"});
+}
+
+void ExampleMountTest::endsWhereTheJobDoesNot()
+{
+    QFETCH(QByteArrayList, play);
+    QFETCH(QByteArrayList, dialogue);
+    tool->expect(play);
+
+    const auto example = run(QStringLiteral("sftp://anna@host/"));
+    for (int i = 0; i < dialogue.size(); i += 2) {
+        QVERIFY2(example->waitFor(dialogue.at(i)), example->output().constData());
+        example->type(dialogue.at(i + 1));
+    }
+    QCOMPARE(example->waitForEnd(), 1);
+    QVERIFY2(
+        example->output().endsWith("mount-example: the login was given up or failed\n"),
+        example->output().constData());
+}
+
+void ExampleMountTest::tellsFailures()
+{
+    const auto example = run(QStringLiteral("http://host/"));
+    QCOMPARE(example->waitForEnd(), 1);
+    QVERIFY2(
+        example->output().endsWith("mount-example: This network protocol is not supported\n"),
+        example->output().constData());
+}
+
+QTEST_GUILESS_MAIN(ExampleMountTest)
+#include "tst_example_mount.moc"
