@@ -41,13 +41,15 @@ public:
         bool isRetry, const QString& title, const QString& message, QString& user,
         bool* userChanged, bool* cancelled) = 0;
 
-    /// The server refused the credentials of @p user.
+    /// The server refused the credentials of @p user. The FTP and SFTP jobs leave it out for a URL
+    /// without a user name.
     virtual void credentialsRejected(const QString& user) = 0;
 
-    /// The credentials last handed out worked.
+    /// The credentials last handed out worked. The Samba job leaves it out where its first question
+    /// brought the right ones.
     virtual void credentialsAccepted() = 0;
 
-    /// Asks a question and returns true for yes.
+    /// Asks a question and returns true for yes. The text may be what a tool or a server printed.
     virtual bool askQuestion(const QString& title, const QString& text) = 0;
 
     /// What the next question is about; a job calls this before it asks.
