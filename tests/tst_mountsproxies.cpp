@@ -22,6 +22,7 @@ private Q_SLOTS:
     void fuseMountsAreAskedEachTime();
     void failedReadsAreEmpty();
     void addMountIsSent();
+    void rememberedMountsComeBack();
     void mountAddedComesFromTheServiceAlone();
     void fuseMountAddedNeverFires();
     void expiredInterfaces();
@@ -42,7 +43,7 @@ void MountsProxiesTest::initTestCase()
 
 void MountsProxiesTest::init()
 {
-    m_service->load(object(R"({"echo": false, "values": {
+    m_service->load(object(R"({"echo": false, "remember": false, "values": {
         "NetworkMountsManager.mounts": {"ftp://h": ["FTP/h", "/m/h", 4002]},
         "FuseMountsManager.mounts": {"ftp://h": "/m/h"}}})"));
     m_service->takeCalls();
@@ -101,6 +102,30 @@ void MountsProxiesTest::addMountIsSent()
         QStringList(
             {u"NetworkMountsManager.addMount[\"ftp://x\",[\"FTP/h\",\"/m/h\",4002]]"_s,
              u"FuseMountsManager.addMount[\"ftp://x\",\"/m/x\"]"_s}));
+}
+
+void MountsProxiesTest::rememberedMountsComeBack()
+{
+    NetworkMountsManagerProxy network(m_network);
+    FuseMountsManagerProxy fuse(m_fuse);
+    const Entry entry = network.mounts().first();
+    network.addMount(u"sftp://x"_s, entry);
+    fuse.addMount(u"sftp://x"_s, u"/m/x"_s);
+    QCOMPARE(network.mounts().keys(), QStringList(u"ftp://h"_s));
+    QCOMPARE(fuse.mounts().keys(), QStringList(u"ftp://h"_s));
+
+    m_service->load(object(R"({"echo": true, "remember": true})"));
+    m_service->setRules(u"FuseMountsManager.addMount"_s, array(R"([{"error": "full"}])"));
+    fuse.addMount(u"sftp://lost"_s, u"/m/lost"_s);
+    QSignalSpy added(&network, &NetworkMountsManagerProxy::mountAdded);
+    network.addMount(u"sftp://x"_s, entry);
+    fuse.addMount(u"sftp://x"_s, u"/m/x"_s);
+    QCOMPARE(network.mounts().keys(), QStringList({u"ftp://h"_s, u"sftp://x"_s}));
+    QCOMPARE(network.mounts().value(u"sftp://x"_s), entry);
+    QCOMPARE(fuse.mounts().keys(), QStringList({u"ftp://h"_s, u"sftp://x"_s}));
+    QCOMPARE(fuse.mounts().value(u"sftp://x"_s), u"/m/x"_s);
+    QVERIFY(!added.isEmpty() || added.wait());
+    QCOMPARE(added.first().at(0).toString(), u"sftp://x"_s);
 }
 
 void MountsProxiesTest::mountAddedComesFromTheServiceAlone()

@@ -62,7 +62,7 @@ public:
     /// Process of the service, 0 without one.
     qint64 processId() const;
 
-    /// Takes values, rules and "echo" over; see FakeService for the form.
+    /// Takes values, rules, "echo" and "remember" over; see FakeService for the form.
     void load(const QJsonObject& script);
     void setValue(const QString& method, const QJsonValue& value);
     void setRules(const QString& method, const QJsonArray& rules);

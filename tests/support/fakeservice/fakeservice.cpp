@@ -44,6 +44,7 @@ void FakeService::load(const QJsonObject& script)
         m_rules.insert(it.key(), it.value());
     }
     m_echo = script[QStringLiteral("echo")].toBool(m_echo);
+    m_remember = script[QStringLiteral("remember")].toBool(m_remember);
 }
 
 QString FakeService::introspect(const QString& path) const
@@ -134,6 +135,9 @@ void FakeService::answer(
             QStringLiteral("org.veylabs.Test.Failed"), rule[QStringLiteral("error")].toString()));
         return;
     }
+    if (m_remember && message.member() == QLatin1String("addMount")) {
+        rememberMount(message.interface(), arguments);
+    }
     const QString name =
         message.interface().mid(prefix.size()) + QLatin1Char('.') + message.member();
     const QString out = m_contract.method(message.interface(), message.member()).out;
@@ -154,6 +158,14 @@ void FakeService::answer(
     if (m_echo) {
         echo(message.interface(), message.member(), arguments);
     }
+}
+
+void FakeService::rememberMount(const QString& interface, const QJsonArray& arguments)
+{
+    const QString key = interface.mid(prefix.size()) + QLatin1String(".mounts");
+    QJsonObject mounts = m_values[key].toObject();
+    mounts.insert(arguments.at(0).toString(), arguments.at(1));
+    m_values[key] = mounts;
 }
 
 void FakeService::echo(const QString& interface, const QString& member, const QJsonArray& arguments)

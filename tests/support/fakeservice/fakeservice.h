@@ -36,6 +36,9 @@
  * What a service does of its own accord (the echo of notifyWatchers, the signals behind add,
  * remove and update, mountAdded) it does while "echo" is true, as it is by default.
  *
+ * While "remember" is true, which it is not by default, what addMount brings is in the values of
+ * the register's "mounts" from then on, unless a rule has the call fail.
+ *
  * Tests steer it on the path "/Control", interface "org.veylabs.Test.Control":
  *   Load(s json), Emit(s interface, s signal, s arguments), Calls() -> as, ClearCalls(),
  *   Violations() -> as, Exit(i code), Introspections() -> as (the paths, in order),
@@ -49,7 +52,7 @@ class FakeService : public QDBusVirtualObject
 public:
     FakeService(const Contract& contract, const QDBusConnection& bus);
 
-    /// Takes values, rules and "echo" over from a script.
+    /// Takes values, rules, "echo" and "remember" over from a script.
     void load(const QJsonObject& script);
 
     QString introspect(const QString& path) const override;
@@ -60,6 +63,7 @@ private:
     QJsonObject takeRule(const QString& method);
     QJsonValue valueFor(const QString& method, const QJsonArray& arguments) const;
     void answer(const QDBusMessage& message, const QJsonObject& rule, const QJsonArray& arguments);
+    void rememberMount(const QString& interface, const QJsonArray& arguments);
     void echo(const QString& interface, const QString& member, const QJsonArray& arguments);
     void emitSignal(const QString& interface, const QString& name, const QJsonArray& arguments);
 
@@ -68,6 +72,7 @@ private:
     QJsonObject m_values;
     QJsonObject m_rules;
     bool m_echo = true;
+    bool m_remember = false;
     QStringList m_calls;
     QStringList m_violations;
     mutable QStringList m_introspections;
