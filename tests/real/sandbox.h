@@ -15,7 +15,8 @@
 #include <memory>
 #include <vector>
 
-/// An account of the sandbox. Its home is /run/sandbox/home/<name>.
+/// An account of the sandbox. Its home is /run/sandbox/home/<name>, and holds "name.txt", which has
+/// the name, and a folder "papers" with an empty "draft.txt".
 struct SandboxAccount
 {
     const char* name;
@@ -54,6 +55,7 @@ public:
     static constexpr SandboxAccount tester = {"tester", "quill-0-tester", 2000};
     static constexpr SandboxAccount alice = {"alice", "amber-1-alice", 2001};
     static constexpr SandboxAccount bob = {"bob", "basalt-2-bob", 2002};
+    static constexpr const char* wrongPassword = "cobalt-3-wrong";
 
     static constexpr const char* serverHost = "server.test";
     static constexpr const char* otherHost = "other.test";

@@ -61,6 +61,20 @@ bool makeDirectory(const QByteArray& path, unsigned mode = 0755, unsigned owner 
            ::chown(path.constData(), owner, owner) == 0;
 }
 
+bool makeFile(const QByteArray& path, const QByteArray& content, unsigned owner)
+{
+    return SandboxSystem::writeFile(path, content) && ::chown(path.constData(), owner, owner) == 0;
+}
+
+bool makeHome(const SandboxAccount& account)
+{
+    const QByteArray home = QFile::encodeName(Sandbox::home(account));
+    return makeDirectory(home, 0755, account.id) &&
+           makeFile(home + "/name.txt", account.name, account.id) &&
+           makeDirectory(home + "/papers", 0755, account.id) &&
+           makeFile(home + "/papers/draft.txt", {}, account.id);
+}
+
 bool raiseLoopback()
 {
     ifreq request = {};
@@ -101,7 +115,7 @@ bool makeAccounts()
         groups += name + ":x:" + id + ":\n";
         passwords += name + ":" + QByteArray(::crypt(account.password, "$5$rounds=1000$sandbox$")) +
                      ":19000::::::\n";
-        made = made && makeDirectory(home, 0755, account.id);
+        made = made && makeHome(account);
     }
     return made && SandboxSystem::replaceFile("/etc/passwd", users) &&
            SandboxSystem::replaceFile("/etc/group", groups) &&
@@ -152,7 +166,7 @@ QString SandboxSystem::prepare()
     }
     if (::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) != 0 ||
         ::mount("proc", "/proc", "proc", MS_NOSUID | MS_NODEV | MS_NOEXEC, nullptr) != 0 ||
-        !mountMemory("/run")) {
+        !mountMemory("/run") || !mountMemory("/var/log")) {
         return failure("mounts");
     }
     ::umask(022);

@@ -3,9 +3,12 @@
 
 #include "core/fuse.h"
 #include "real/sandbox.h"
+#include "real/secretwatch.h"
 
 #include <QDir>
 #include <QFile>
+#include <QProcess>
+#include <QProcessEnvironment>
 #include <QTemporaryDir>
 #include <QTest>
 
@@ -30,6 +33,8 @@ private Q_SLOTS:
     void hasItsOwnProcesses();
     void hasItsOwnNetwork();
     void writesIntoMemoryAlone();
+    void passwordsAreSeen_data();
+    void passwordsAreSeen();
     void knowsItsHosts_data();
     void knowsItsHosts();
 };
@@ -63,10 +68,12 @@ void RealSandboxTest::opensTheFuseDevice()
 
 void RealSandboxTest::hasItsOwnProcesses()
 {
-    // The first one, and this.
+    // The first one, the watch and this.
     const QStringList processes =
         QDir(QStringLiteral("/proc")).entryList({QStringLiteral("[0-9]*")}, QDir::Dirs);
-    QCOMPARE(processes, QStringList({QStringLiteral("1"), QString::number(::getpid())}));
+    QCOMPARE(processes.size(), 3);
+    QCOMPARE(processes.first(), QStringLiteral("1"));
+    QCOMPARE(processes.last(), QString::number(::getpid()));
     QCOMPARE(::prctl(PR_GET_DUMPABLE), 1);
 }
 
@@ -87,6 +94,41 @@ void RealSandboxTest::writesIntoMemoryAlone()
     QVERIFY(QDir::homePath().startsWith(Sandbox::directory()));
     QVERIFY(QDir::home().mkpath(QStringLiteral(".config")));
     QVERIFY(!QFileInfo(Sandbox::home(Sandbox::alice)).isWritable());
+}
+
+void RealSandboxTest::passwordsAreSeen_data()
+{
+    QTest::addColumn<QString>("argument");
+    QTest::addColumn<QString>("variable");
+    QTest::addColumn<QStringList>("findings");
+    const QString password = QString::fromLatin1(Sandbox::alice.password);
+    const QString argument = QStringLiteral("sh cmdline");
+    const QString variable = QStringLiteral("sh environ");
+    QTest::newRow("nowhere") << QString() << QString() << QStringList();
+    QTest::newRow("argument") << password << QString() << QStringList(argument);
+    QTest::newRow("environment") << QString() << password << QStringList(variable);
+    QTest::newRow("in something") << QStringLiteral("pass=") + password
+                                  << QStringLiteral("%1@host").arg(password)
+                                  << QStringList({argument, variable});
+}
+
+void RealSandboxTest::passwordsAreSeen()
+{
+    QFETCH(QString, argument);
+    QFETCH(QString, variable);
+    QFETCH(QStringList, findings);
+    QProcess process;
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(QStringLiteral("PASS"), variable);
+    process.setProcessEnvironment(environment);
+    process.start(
+        QStringLiteral("sh"), {QStringLiteral("-c"), QStringLiteral("read line"), argument});
+    QVERIFY(process.waitForStarted());
+    QCOMPARE(SecretWatch::takeFindings(), findings);
+    process.kill();
+    process.waitForFinished();
+    SecretWatch::takeFindings();
+    QCOMPARE(SecretWatch::takeFindings(), QStringList());
 }
 
 void RealSandboxTest::knowsItsHosts_data()
@@ -114,6 +156,7 @@ void RealSandboxTest::knowsItsHosts()
 int main(int argc, char** argv)
 {
     Sandbox sandbox;
+    sandbox.addServer(std::make_unique<SecretWatch>());
     return sandbox.run([&] { return runSandboxTests<RealSandboxTest>(argc, argv); });
 }
 
