@@ -32,6 +32,13 @@ inline QList<int> processesNamed(const char* name)
     return result;
 }
 
+/// The words of a process, each with a NUL behind it.
+inline QByteArray commandLine(int process)
+{
+    QFile file(u"/proc/%1/cmdline"_s.arg(process));
+    return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
+}
+
 inline QByteArray fileContents(const QString& path)
 {
     QFile file(path);
@@ -74,6 +81,7 @@ protected:
         }
         QCOMPARE(mountDirs(), QStringList());
         QCOMPARE(SecretWatch::takeFindings(), QStringList());
+        QCOMPARE(SecretWatch::findFiles(), QStringList());
         QVERIFY(auth->answers.isEmpty());
         QVERIFY(auth->questionAnswers.isEmpty());
         QCOMPARE(service->violations(), QStringList());

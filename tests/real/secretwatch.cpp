@@ -7,6 +7,7 @@
 #include "real/sandboxsystem.h"
 
 #include <QDir>
+#include <QDirIterator>
 #include <QFile>
 #include <QSet>
 
@@ -119,4 +120,19 @@ QStringList SecretWatch::takeFindings()
         QString::fromLocal8Bit(connection.readAll()).split(QLatin1Char('\n'), Qt::SkipEmptyParts);
     findings.sort();
     return findings;
+}
+
+QStringList SecretWatch::findFiles()
+{
+    QStringList found;
+    for (const QString& folder : {QDir::homePath(), QDir::tempPath()}) {
+        QDirIterator files(folder, QDir::Files | QDir::Hidden, QDirIterator::Subdirectories);
+        while (files.hasNext()) {
+            const QString file = files.next();
+            if (holdsSecret(contents(file))) {
+                found.append(file);
+            }
+        }
+    }
+    return found;
 }

@@ -21,6 +21,10 @@ public:
     /// What was seen since the last call, once each and in order: the name of the process and the
     /// file below /proc/<pid>, such as "smbclient environ". Has all processes looked at once more.
     static QStringList takeFindings();
+
+    /// The files of the tests' user, at home and among the temporary ones, that hold a password.
+    /// Not while something is mounted there.
+    static QStringList findFiles();
 };
 
 #endif

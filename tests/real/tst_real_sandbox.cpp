@@ -35,6 +35,7 @@ private Q_SLOTS:
     void writesIntoMemoryAlone();
     void passwordsAreSeen_data();
     void passwordsAreSeen();
+    void passwordsInFilesAreFound();
     void knowsItsHosts_data();
     void knowsItsHosts();
 };
@@ -129,6 +130,18 @@ void RealSandboxTest::passwordsAreSeen()
     process.waitForFinished();
     SecretWatch::takeFindings();
     QCOMPARE(SecretWatch::takeFindings(), QStringList());
+}
+
+void RealSandboxTest::passwordsInFilesAreFound()
+{
+    const QTemporaryDir temporary;
+    QFile file(temporary.filePath(QStringLiteral("x")));
+    QVERIFY(file.open(QIODevice::WriteOnly));
+    file.write(QByteArray("a") + Sandbox::bob.password + "b");
+    file.close();
+    QCOMPARE(SecretWatch::findFiles(), QStringList(file.fileName()));
+    QVERIFY(file.remove());
+    QCOMPARE(SecretWatch::findFiles(), QStringList());
 }
 
 void RealSandboxTest::knowsItsHosts_data()
