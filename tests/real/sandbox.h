@@ -32,8 +32,8 @@ struct SandboxAccount
  *   - the tests run as the user `tester`, who is in the group `fuse` and may open /dev/fuse for
  *     that alone, without a terminal,
  *   - `alice` and `bob` have accounts on the servers, and the three homes are different,
- *   - there is loopback and nothing else: server.test, other.test and closed.test, which nobody
- *     listens on, are addresses of their own, so each server may have its usual port,
+ *   - there is loopback and nothing else: server.test (or server), other.test and closed.test,
+ *     which nobody listens on, are addresses of their own, so each server has its usual port,
  *   - /run is empty, and everything is written below it, in memory: HOME, the XDG folders and
  *     temporary files of the tests too. Nothing is left on the disk, however the test ends.
  *

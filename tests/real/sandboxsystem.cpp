@@ -27,7 +27,7 @@ namespace {
 constexpr unsigned fuseGroup = 2100;
 
 const char hosts[] = "127.0.0.1 localhost sandbox\n"
-                     "127.0.0.11 server.test\n"
+                     "127.0.0.11 server.test server\n"
                      "127.0.0.12 other.test\n"
                      "127.0.0.13 closed.test\n";
 
