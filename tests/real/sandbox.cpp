@@ -117,6 +117,11 @@ void Sandbox::addServer(std::unique_ptr<SandboxServer> server)
     m_servers.push_back(std::move(server));
 }
 
+bool Sandbox::isEntered()
+{
+    return reason.isEmpty();
+}
+
 QString Sandbox::skipReason()
 {
     return reason;

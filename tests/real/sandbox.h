@@ -76,8 +76,10 @@ public:
      */
     int run(const std::function<int()>& tests);
 
-    /// Why the tests can't run; empty when they can.
+    /// Whether this process is in a sandbox, as far as it knows; why not, if it isn't. @{
+    static bool isEntered();
     static QString skipReason();
+    /// @}
 
     /// The home of an account.
     static QString home(const SandboxAccount& account);
@@ -95,10 +97,10 @@ private:
     std::vector<std::unique_ptr<SandboxServer>> m_servers;
 };
 
-/// Skips the test where there is no sandbox. For init() and initTestCase().
+/// Skips the test where there is no sandbox. For init(), so that each test says so.
 #define SKIP_WITHOUT_SANDBOX()                                                                     \
     do {                                                                                           \
-        if (!Sandbox::skipReason().isEmpty())                                                      \
+        if (!Sandbox::isEntered())                                                                 \
             QSKIP(qPrintable(Sandbox::skipReason()));                                              \
     } while (false)
 

@@ -117,7 +117,9 @@ private:
 
 void RealSftpTest::initTestCase()
 {
-    SKIP_WITHOUT_SANDBOX();
+    if (!Sandbox::isEntered()) {
+        return;
+    }
     QVERIFY2(startVfs(R"({"remember": true})"), qPrintable(service.errorString()));
 }
 
@@ -130,7 +132,7 @@ void RealSftpTest::init()
 
 void RealSftpTest::cleanup()
 {
-    if (!Sandbox::skipReason().isEmpty()) {
+    if (!Sandbox::isEntered()) {
         return;
     }
     endScene();
@@ -302,17 +304,26 @@ void RealSftpTest::cannotConnect_data()
     QTest::newRow("unknown host") << QByteArray("unknown.test");
 }
 
-// sshfs ends with the same words as after a wrong password.
+// sshfs ends with the same words as after a wrong password. Now and then ssh has ended before
+// sshfs wrote to it, and then the words are "write: Broken pipe", which is a failure like any
+// other.
 void RealSftpTest::cannotConnect()
 {
     QFETCH(QByteArray, host);
     auth->answers = {password(Sandbox::alice), Auth::cancel()};
     const auto job = makeJob<MountSFtpURLJob>(u"sftp://alice@%1/"_s.arg(QString::fromLatin1(host)));
     QVERIFY(starts(job.get()));
-    QCOMPARE(job->error(), 2);
-    QCOMPARE(job->errorString(), u"Accessing sftp resource was cancelled"_s);
-    const QStringList refused = {u"rejected alice"_s, asked(u"alice"_s, host.constData())};
-    QCOMPARE(auth->calls, refused + refused);
+    const bool broken = !auth->answers.isEmpty();
+    QCOMPARE(job->error(), broken ? 5 : 2);
+    QCOMPARE(
+        job->errorString(),
+        broken ? u"Mounting sftp resource failed"_s : u"Accessing sftp resource was cancelled"_s);
+    QStringList calls;
+    for (int i = auth->answers.size(); i < 2; ++i) {
+        calls << u"rejected alice"_s << asked(u"alice"_s, host.constData());
+    }
+    QCOMPARE(auth->calls, calls);
+    auth->answers.clear();
     verifyNothingLeft();
 }
 
