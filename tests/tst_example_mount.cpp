@@ -29,6 +29,7 @@ private Q_SLOTS:
     void init();
     void cleanup();
     void asksOnceForWhatTheJobAsksTwice();
+    void takesWhatIsMounted();
     void endsWhereTheJobDoesNot_data();
     void endsWhereTheJobDoesNot();
     void tellsFailures();
@@ -54,6 +55,7 @@ void ExampleMountTest::initTestCase()
 void ExampleMountTest::init()
 {
     tool = std::make_unique<StandIn>("sshfs");
+    service->setValue(QStringLiteral("NetworkMountsManager.mounts"), QJsonObject());
 }
 
 void ExampleMountTest::cleanup()
@@ -69,9 +71,10 @@ void ExampleMountTest::asksOnceForWhatTheJobAsksTwice()
     tool->expect(asks);
     QVERIFY(scene.makeDir("home/.vey-fm-vfs") && scene.makeDir("home/.vey-fm-vfs/sftp"));
     QVERIFY(scene.makeDir("home/.vey-fm-vfs/sftp/anna@host"));
-    QVERIFY(scene.makeFile("home/.vey-fm-vfs/sftp/anna@host/letter"));
+    QVERIFY(scene.makeDir("home/.vey-fm-vfs/sftp/anna@host/letters"));
+    QVERIFY(scene.makeFile("home/.vey-fm-vfs/sftp/anna@host/letters/first"));
 
-    const auto example = run(QStringLiteral("sftp://host/"));
+    const auto example = run(QStringLiteral("sftp://host/letters"));
     QVERIFY2(example->waitFor("User on host []: "), example->output().constData());
     example->type("anna\n");
     QVERIFY(example->waitFor("Password: "));
@@ -84,11 +87,24 @@ void ExampleMountTest::asksOnceForWhatTheJobAsksTwice()
 
     QCOMPARE(example->output().count("Password: "), 2);
     QCOMPARE(example->output().count("The login was refused."), 1);
-    QVERIFY2(example->output().endsWith("/letter\n"), example->output().constData());
+    QVERIFY2(example->output().endsWith("SFTP/anna@host/first\n"), example->output().constData());
     QVERIFY(!example->output().contains("wrong") && !example->output().contains("right"));
     QCOMPARE(tool->input(1), QByteArray("\n"));
     QCOMPARE(tool->input(2), QByteArray("wrong\n"));
     QCOMPARE(tool->input(3), QByteArray("right\n"));
+}
+
+// The place of the mount above, as another process finds it.
+void ExampleMountTest::takesWhatIsMounted()
+{
+    service->setValue(
+        QStringLiteral("NetworkMountsManager.mounts"),
+        object(
+            R"({"sftp://anna@host/": ["SFTP/anna@host", ")" + scene.path("").toUtf8() +
+            R"(home/.vey-fm-vfs/sftp/anna@host", 4003]})"));
+    const auto example = run(QStringLiteral("sftp://anna@host/letters"));
+    QCOMPARE(example->waitForEnd(), 0);
+    QCOMPARE(example->output(), QByteArray("SFTP/anna@host/letters/first\n"));
 }
 
 void ExampleMountTest::endsWhereTheJobDoesNot_data()

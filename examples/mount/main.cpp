@@ -24,10 +24,9 @@ int fail(const QString& why)
     return 1;
 }
 
-int list(const QString& path)
+int list(const VeyFM::Entry& directory)
 {
-    VeyFM::VFS* const vfs = VeyFM::VFS::ptr();
-    VeyFM::EntryList entries = vfs->childs(vfs->entry(path));
+    VeyFM::EntryList entries = VeyFM::VFS::ptr()->childs(directory);
     entries.sort(true);
     QTextStream out(stdout);
     for (const VeyFM::Entry& entry : entries) {
@@ -57,6 +56,13 @@ int main(int argc, char** argv)
     QObject::connect(&job, &VeyFM::Job::finished, &app, &QCoreApplication::quit);
     bool finished = false;
     QObject::connect(&job, &VeyFM::Job::finished, &app, [&finished] { finished = true; });
+    // A new mount gets a place that stands for the whole URL. For a mount that was there already
+    // nothing is announced, and path() leads on from its place.
+    VeyFM::VFS* const vfs = VeyFM::VFS::ptr();
+    VeyFM::Entry made;
+    QObject::connect(
+        vfs, &VeyFM::VFS::fuseMountAdded, &app,
+        [&made](const QString&, const VeyFM::Entry& entry) { made = entry; });
     job.start();
 
     if (!finished) {
@@ -72,5 +78,8 @@ int main(int argc, char** argv)
     if (!finished) {
         return fail(QStringLiteral("nothing came of it in five minutes"));
     }
-    return job.error() == 0 ? list(job.path()) : fail(job.errorString());
+    if (job.error() != 0) {
+        return fail(job.errorString());
+    }
+    return list(made.isNull() ? vfs->entry(job.path()) : made);
 }
