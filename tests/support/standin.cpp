@@ -152,6 +152,7 @@ int main(int argc, char** argv)
     }
     append(".env", contents("/proc/self/environ"));
     append(".cmdline", contents("/proc/self/cmdline"));
+    append(".pid", std::to_string(getpid()));
 
     std::ifstream scenario(base + ".play");
     if (!scenario) {

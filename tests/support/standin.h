@@ -82,6 +82,12 @@ public:
         return zeroTerminated(read(run, "env"));
     }
 
+    /// The process of a run; 0 before it has begun.
+    qint64 processId(int run) const
+    {
+        return read(run, "pid").toLongLong();
+    }
+
     /// What a run has read.
     QByteArray input(int run) const
     {

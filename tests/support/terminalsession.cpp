@@ -117,6 +117,12 @@ int TerminalSession::waitForEnd()
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
+bool TerminalSession::hasEcho() const
+{
+    termios settings = {};
+    return ::tcgetattr(m_master, &settings) == 0 && (settings.c_lflag & ECHO) != 0;
+}
+
 QByteArray TerminalSession::output() const
 {
     return m_output;

@@ -31,6 +31,9 @@ public:
     /// Reads to the end. The exit code, or -1 for a program that was killed or takes too long.
     int waitForEnd();
 
+    /// Whether the terminal shows what is typed.
+    bool hasEcho() const;
+
     /// All that has been read.
     QByteArray output() const;
 
