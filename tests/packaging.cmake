@@ -32,6 +32,16 @@ if(NOT VEYFM_SANITIZE)
         TIMEOUT 600
     )
 
+    add_test(NAME curlftpfsinstall
+        COMMAND ${CMAKE_CURRENT_SOURCE_DIR}/support/curlftpfsinstall.sh
+            ${PROJECT_SOURCE_DIR} ${CMAKE_CURRENT_BINARY_DIR}/curlftpfsinstall
+    )
+    set_tests_properties(curlftpfsinstall PROPERTIES
+        ENVIRONMENT "CXX=${CMAKE_CXX_COMPILER};CMAKE_GENERATOR=${CMAKE_GENERATOR}"
+        SKIP_RETURN_CODE 77
+        TIMEOUT 300
+    )
+
     find_package(Git QUIET)
     find_program(VEYFM_REUSE reuse)
     if(VEYFM_REUSE AND GIT_FOUND AND EXISTS ${PROJECT_SOURCE_DIR}/.git)

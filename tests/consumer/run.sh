@@ -33,6 +33,10 @@ soname=$(objdump -p "$library" | awk '$1 == "SONAME" { print $2 }')
 [[ $(realpath "$library") == "$(realpath "$libdir/$soname")" ]] ||
     fail "$library and $soname are not the same library"
 
+if ! grep -q '^VEYFM_INSTALL_CURLFTPFS_RCLONE:BOOL=ON' "$build/CMakeCache.txt"; then
+    [[ ! -e $prefix/bin/curlftpfs ]] || fail "a curlftpfs was installed without being asked for"
+fi
+
 # A program of the installed tree finds the library of that tree.
 if grep -q '^VEYFM_BUILD_TOOLS:BOOL=ON' "$build/CMakeCache.txt"; then
     "$prefix/bin/veyfm-vfs" --version >"$work/version" ||
