@@ -125,7 +125,8 @@ QStringList SecretWatch::takeFindings()
 QStringList SecretWatch::findFiles()
 {
     QStringList found;
-    for (const QString& folder : {QDir::homePath(), QDir::tempPath()}) {
+    const QString session = QFile::decodeName(qgetenv("XDG_RUNTIME_DIR"));
+    for (const QString& folder : {QDir::homePath(), QDir::tempPath(), session}) {
         QDirIterator files(folder, QDir::Files | QDir::Hidden, QDirIterator::Subdirectories);
         while (files.hasNext()) {
             const QString file = files.next();

@@ -22,8 +22,8 @@ public:
     /// file below /proc/<pid>, such as "smbclient environ". Has all processes looked at once more.
     static QStringList takeFindings();
 
-    /// The files of the tests' user, at home and among the temporary ones, that hold a password.
-    /// Not while something is mounted there.
+    /// The files of the tests' user, at home, among the temporary ones and those of the session,
+    /// that hold a password. What is mounted there is searched too.
     static QStringList findFiles();
 };
 
