@@ -115,6 +115,7 @@ private Q_SLOTS:
     void execOfAJobThatEndsInStart();
     void execWaits();
     void execKeepsTheJobAlive();
+    void execEndsWithADeletedJob();
     void execRestoresDeleteOnFinish();
     void execLeavesAFailure();
     void setErrorEndsNothing();
@@ -317,6 +318,17 @@ void JobTest::authenticatorHoldsTheResource()
     QCOMPARE(authenticator.domain(), QStringLiteral("WG"));
     QCOMPARE(authenticator.server(), QStringLiteral("HOST"));
     QCOMPARE(authenticator.object(), QStringLiteral("share"));
+}
+
+// As when the window that owns the job is closed.
+void JobTest::execEndsWithADeletedJob()
+{
+    auto* const owner = new QObject;
+    QTimer::singleShot(0, owner, &QObject::deleteLater);
+    (new ScriptedJob([](ScriptedJob*) {}, owner))->exec();
+
+    auto* const other = new QObject;
+    (new ScriptedJob([other](ScriptedJob*) { delete other; }, other))->exec();
 }
 
 QTEST_GUILESS_MAIN(JobTest)

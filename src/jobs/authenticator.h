@@ -18,8 +18,10 @@ namespace VeyFM {
  * the same time must therefore not share one authenticator. All calls come in the thread of the
  * job, which waits for the answer.
  *
- * After a refused login the mount jobs call requestPassword() twice, and use the second answer.
- * An implementation that remembers its last answer until credentialsRejected() asks once.
+ * After a refused login the FTP and SFTP jobs call requestPassword() twice, and use the second
+ * answer. An implementation that remembers its last answer until credentialsRejected() asks once.
+ *
+ * An implementation may run an event loop while it asks, and the job be deleted in there.
  */
 class VEYFMVFS_EXPORT Authenticator
 {
@@ -30,12 +32,14 @@ public:
     /**
      * Returns the password of a user for the resource. An empty one is a password as well.
      *
-     * @param isRetry whether an earlier answer, or an anonymous login, was refused
+     * @param isRetry whether an earlier answer was refused; the FTP and SFTP jobs say so always
      * @param title heading for the user, may be empty
      * @param message text for the user, may be empty
      * @param user in: the user name known so far; out: the one to use
-     * @param userChanged set to true when the user edited the name; never cleared here
-     * @param cancelled set to true when the user gave up; never cleared here
+     * @param userChanged in: false, or what the Samba job was told before; out: whether the user
+     *     edited the name
+     * @param cancelled in: likewise; out: whether the user gave up. Who answers the Samba job
+     *     after having given up at its first question clears it
      */
     virtual QString requestPassword(
         bool isRetry, const QString& title, const QString& message, QString& user,
@@ -45,8 +49,8 @@ public:
     /// without a user name.
     virtual void credentialsRejected(const QString& user) = 0;
 
-    /// The credentials last handed out worked. The Samba job leaves it out where its first question
-    /// brought the right ones.
+    /// The credentials last handed out worked, or none were needed. The Samba job leaves it out
+    /// where none were needed, or its first question brought the right ones.
     virtual void credentialsAccepted() = 0;
 
     /// Asks a question and returns true for yes. The text may be what a tool or a server printed.

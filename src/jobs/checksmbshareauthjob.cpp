@@ -6,6 +6,7 @@
 #include "core/fuse.h"
 #include "vfs/standardpaths.h"
 
+#include <QPointer>
 #include <QProcess>
 #include <QProcessEnvironment>
 
@@ -24,6 +25,8 @@ QStringList linesOf(QProcess& process, const QString& command)
     QStringList words = QProcess::splitCommand(command);
     const QString program = words.takeFirst();
     process.start(program, words, QIODevice::ReadWrite);
+    // A tool that asks for a password itself, for a user with an empty one, is refused at once.
+    process.closeWriteChannel();
     process.waitForFinished(toolTimeoutMs);
     return QString::fromLocal8Bit(process.readAllStandardOutput())
         .split(QLatin1Char('\n'), Qt::SkipEmptyParts);
@@ -130,47 +133,56 @@ void CheckSmbShareAuthJob::start()
         finishedOk();
         return;
     }
-    if (askUntilGranted(guestResult)) {
-        finishedOk();
-    } else {
-        finishedWithError(2, tr("Login cancelled"));
-    }
+    askUntilGranted(guestResult);
 }
 
-bool CheckSmbShareAuthJob::askUntilGranted(int guestResult)
+void CheckSmbShareAuthJob::askUntilGranted(int guestResult)
 {
+    // An authenticator may run an event loop, and the job be deleted in there.
+    const QPointer<CheckSmbShareAuthJob> alive(this);
+    const QSharedPointer<Authenticator> asked = m_authenticator;
     int result = guestResult;
     bool userChanged = false;
     bool cancelled = false;
     QString user;
-    QString password = m_authenticator->requestPassword(
-        false, QString(), QString(), user, &userChanged, &cancelled);
+    QString password =
+        asked->requestPassword(false, QString(), QString(), user, &userChanged, &cancelled);
+    if (!alive) {
+        return;
+    }
     if (!cancelled) {
         result = checkAuth(user, password);
         if (result == NoRefusal) {
             // A first answer that works is not reported as accepted, unlike a later one.
-            return true;
+            finishedOk();
+            return;
         }
-        m_authenticator->credentialsRejected(user);
+        asked->credentialsRejected(user);
     }
     // A user who gave up at the first question is asked once more, with the reason why the guest
     // was refused. The flags are not cleared in between.
-    while (true) {
+    while (alive) {
         const bool denied = result == AccessDenied;
         const QString title = denied ? tr("Access denied") : tr("Logon failure");
         const QString message =
             (denied ? tr("Access denied for %1") : tr("Logon failure for %1")).arg(resourcePath());
-        password =
-            m_authenticator->requestPassword(true, title, message, user, &userChanged, &cancelled);
+        password = asked->requestPassword(true, title, message, user, &userChanged, &cancelled);
+        if (!alive) {
+            return;
+        }
         if (cancelled) {
-            return false;
+            finishedWithError(2, tr("Login cancelled"));
+            return;
         }
         result = checkAuth(user, password);
         if (result == NoRefusal) {
-            m_authenticator->credentialsAccepted();
-            return true;
+            asked->credentialsAccepted();
+            if (alive) {
+                finishedOk();
+            }
+            return;
         }
-        m_authenticator->credentialsRejected(user);
+        asked->credentialsRejected(user);
     }
 }
 

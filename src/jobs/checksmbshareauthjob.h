@@ -59,7 +59,7 @@ public:
     void start() override;
 
 private:
-    bool askUntilGranted(int guestResult);
+    void askUntilGranted(int guestResult);
 
     const QSharedPointer<Authenticator> m_authenticator;
     QString m_hostForKerberos;

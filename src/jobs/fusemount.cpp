@@ -4,11 +4,13 @@
 #include "jobs/fusemount_p.h"
 
 #include "core/mountpaths.h"
+#include "jobs/job.h"
 #include "jobs/urlscheme_p.h"
 #include "service/fusemountsmanagerproxy.h"
 #include "vfs/vfs.h"
 
 #include <QDir>
+#include <QPointer>
 
 #include <algorithm>
 
@@ -32,6 +34,13 @@ FuseMount::FuseMount(const QString& url, QSharedPointer<Authenticator> authentic
 {
 }
 
+FuseMount::~FuseMount()
+{
+    if (m_isAsking) {
+        removeMountDirectory();
+    }
+}
+
 QString FuseMount::user() const
 {
     return url.userName(QUrl::FullyDecoded);
@@ -51,8 +60,12 @@ QString FuseMount::account() const
 bool FuseMount::isSafe(const QString& target) const
 {
     const QLatin1Char dash('-');
-    return !host().isEmpty() && !host().startsWith(dash) && !target.startsWith(dash) &&
-           isHarmless(user()) && isHarmless(host());
+    // Brackets may stand around a host, and sshfs takes them off.
+    const QLatin1String dashInBrackets("[-");
+    // Without a port that fits into its number, say, a URL is none, and all of those share a key.
+    return url.isValid() && !host().isEmpty() && !host().startsWith(dash) &&
+           !target.startsWith(dash) && !target.startsWith(dashInBrackets) && isHarmless(user()) &&
+           isHarmless(host());
 }
 
 QString FuseMount::registeredMountPath() const
@@ -84,14 +97,20 @@ void FuseMount::removeMountDirectory() const
     }
 }
 
-FuseMount::Answer
-FuseMount::requestPassword(const QString& title, const QString& message, QString* password)
+FuseMount::Answer FuseMount::requestPassword(
+    const Job* job, const QString& title, const QString& message, QString* password)
 {
+    const QPointer<const Job> alive(job);
+    const QSharedPointer<Authenticator> asked = authenticator; // Outlives its own call.
     bool userChanged = false;
     bool cancelled = false;
     QString name = user();
-    *password =
-        authenticator->requestPassword(true, title, message, name, &userChanged, &cancelled);
+    m_isAsking = true;
+    *password = asked->requestPassword(true, title, message, name, &userChanged, &cancelled);
+    if (!alive) {
+        return JobDeleted;
+    }
+    m_isAsking = false;
     if (cancelled) {
         return Cancelled;
     }
@@ -102,11 +121,35 @@ FuseMount::requestPassword(const QString& title, const QString& message, QString
     return Answered;
 }
 
-void FuseMount::credentialsRejected() const
+bool FuseMount::askQuestion(const Job* job, const QString& title, const QString& text, bool* yes)
 {
-    if (!user().isEmpty()) {
-        authenticator->credentialsRejected(user());
+    const QPointer<const Job> alive(job);
+    const QSharedPointer<Authenticator> asked = authenticator;
+    m_isAsking = true;
+    *yes = asked->askQuestion(title, text);
+    if (!alive) {
+        return false;
     }
+    m_isAsking = false;
+    return true;
+}
+
+bool FuseMount::credentialsRejected(const Job* job) const
+{
+    const QPointer<const Job> alive(job);
+    const QSharedPointer<Authenticator> told = authenticator;
+    if (!user().isEmpty()) {
+        told->credentialsRejected(user());
+    }
+    return alive;
+}
+
+bool FuseMount::credentialsAccepted(const Job* job) const
+{
+    const QPointer<const Job> alive(job);
+    const QSharedPointer<Authenticator> told = authenticator;
+    told->credentialsAccepted();
+    return alive;
 }
 
 } // namespace VeyFM

@@ -12,12 +12,15 @@
 
 namespace VeyFM {
 
+class Job;
+
 /// What the FTP and SFTP jobs have in common: a URL, the directory that it is mounted on, and the
 /// question for a password.
 class FuseMount
 {
 public:
     FuseMount(const QString& url, QSharedPointer<Authenticator> authenticator);
+    ~FuseMount();
 
     QString user() const;
     QString host() const;
@@ -43,16 +46,29 @@ public:
     /// Removes the directory, if there is one and it is empty.
     void removeMountDirectory() const;
 
-    enum Answer { Answered, UserChanged, Cancelled };
+    // An authenticator may run an event loop, and the job, with this object, be deleted in there.
+    // The functions that call it tell, and touch nothing then; the directory goes with the job.
+
+    enum Answer { Answered, UserChanged, Cancelled, JobDeleted };
     /// Asks for the password; a changed user name goes into the URL.
-    Answer requestPassword(const QString& title, const QString& message, QString* password);
-    /// Tells the authenticator, if there is a user that it can be told of.
-    void credentialsRejected() const;
+    Answer requestPassword(
+        const Job* job, const QString& title, const QString& message, QString* password);
+    /// Asks for a yes or no. False for a deleted job.
+    bool askQuestion(const Job* job, const QString& title, const QString& text, bool* yes);
+    /// Tells the authenticator, if there is a user that it can be told of. False for a deleted job.
+    bool credentialsRejected(const Job* job) const;
+    /// False for a deleted job.
+    bool credentialsAccepted(const Job* job) const;
 
     const QString scheme; // As it was written.
     QUrl url;
     QString mountPath;
     const QSharedPointer<Authenticator> authenticator;
+
+private:
+    Q_DISABLE_COPY(FuseMount)
+
+    bool m_isAsking = false;
 };
 
 } // namespace VeyFM

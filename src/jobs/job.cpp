@@ -6,6 +6,7 @@
 #include "jobs/job_p.h"
 
 #include <QEventLoop>
+#include <QPointer>
 #include <QTimer>
 
 namespace VeyFM {
@@ -29,8 +30,9 @@ Job::~Job() = default;
 void Job::exec()
 {
     Q_D(Job);
+    const QPointer<Job> alive(this);
     start();
-    if (d->finished) {
+    if (!alive || d->finished) {
         return;
     }
     // The job has to outlive the loop.
@@ -38,7 +40,11 @@ void Job::exec()
     d->deleteOnFinish = false;
     QEventLoop loop;
     d->eventLoop = &loop;
+    connect(this, &QObject::destroyed, &loop, &QEventLoop::quit); // By its parent, for example.
     loop.exec(QEventLoop::ExcludeUserInputEvents);
+    if (!alive) {
+        return;
+    }
     d->eventLoop = nullptr;
     d->deleteOnFinish = deleteOnFinish;
     if (deleteOnFinish) {

@@ -23,7 +23,9 @@ class JobPrivate;
  * and tells success or failure by error() and errorString(). A job that deletes itself goes by
  * deleteLater(), so every slot of finished() runs with a live job, but must not keep the pointer.
  *
- * Jobs have no threads: a job stays in the thread that created it.
+ * Jobs have no threads: a job stays in the thread that created it. One that waits for the news of
+ * the service ends by the first that fits; should a second come before the event loop turns,
+ * finished() comes again. A job may be deleted at any time but in a slot of finished().
  *
  * Codes: 0 success; 1 the entry or the service can't serve the request; 2 the user gave up, or
  * the operation was refused to the user; 4 the user may not browse Samba shares, being outside
@@ -43,7 +45,8 @@ public:
     virtual void start() = 0;
 
     /**
-     * Runs the job to its end in a nested event loop that leaves user input queued. The job is
+     * Runs the job to its end in a nested event loop that leaves user input queued. For a job that
+     * never finishes this returns only when somebody deletes it. The job is
      * still alive when this returns, so the caller may read error(), but a job that deletes
      * itself goes at the next return to an event loop.
      */

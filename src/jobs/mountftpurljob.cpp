@@ -9,7 +9,11 @@
 #include "vfs/vfs.h"
 #include "vfs/vfssettings.h"
 
+#include <QPointer>
 #include <QProcess>
+
+#include <optional>
+#include <utility>
 
 namespace VeyFM {
 
@@ -28,11 +32,21 @@ public:
     bool accessDenied = false;
     bool restartRequested = false;
     bool cancelled = false;
+
+    // What the tool has done and nobody has looked at. An authenticator may run an event loop, so
+    // the tool may speak on, and end, while a question is open: that waits for the answer.
+    bool isHandling = false;
+    QByteArrayList output; // A read each.
+    int outputSize = 0;
+    std::optional<int> exitCode;
 };
 
 namespace {
 
 const QLatin1Char slash('/');
+
+constexpr int mostOutput = 65536; // As much as a pipe holds.
+constexpr int patienceMs = 500;
 
 } // namespace
 
@@ -42,7 +56,19 @@ MountFtpURLJob::MountFtpURLJob(
 {
 }
 
-MountFtpURLJob::~MountFtpURLJob() = default;
+MountFtpURLJob::~MountFtpURLJob()
+{
+    Q_D(MountFtpURLJob);
+    if (d->process && d->process->state() != QProcess::NotRunning) {
+        d->process->disconnect(this);
+        d->process->terminate();
+        if (!d->process->waitForFinished(patienceMs)) {
+            d->process->kill();
+            d->process->waitForFinished();
+        }
+        d->mount.removeMountDirectory();
+    }
+}
 
 QString MountFtpURLJob::url() const
 {
@@ -111,6 +137,7 @@ void MountFtpURLJob::run()
 
     if (!d->process) {
         d->process = new QProcess(this);
+        d->process->setStandardOutputFile(QProcess::nullDevice()); // It is not read.
         connect(
             d->process, &QProcess::readyReadStandardError, this,
             &MountFtpURLJob::readStandardError);
@@ -122,18 +149,62 @@ void MountFtpURLJob::run()
 void MountFtpURLJob::readStandardError()
 {
     Q_D(MountFtpURLJob);
-    const QString text = QString::fromLocal8Bit(d->process->readAllStandardError().constData());
+    d->output.append(d->process->readAllStandardError());
+    d->outputSize += d->output.last().size();
+    while (d->outputSize > mostOutput) {
+        d->outputSize -= d->output.takeFirst().size();
+    }
+    handleEvents();
+}
+
+void MountFtpURLJob::processFinished(int exitCode)
+{
+    Q_D(MountFtpURLJob);
+    d->exitCode = exitCode;
+    handleEvents();
+}
+
+// In their order, and each to its end before the next.
+void MountFtpURLJob::handleEvents()
+{
+    Q_D(MountFtpURLJob);
+    if (d->isHandling) {
+        return;
+    }
+    d->isHandling = true;
+    const QPointer<MountFtpURLJob> alive(this);
+    while (alive && (!d->output.isEmpty() || d->exitCode)) {
+        if (!d->output.isEmpty()) {
+            const QByteArray output = d->output.takeFirst();
+            d->outputSize -= output.size();
+            handleOutput(output);
+        } else {
+            const int exitCode = *std::exchange(d->exitCode, std::nullopt);
+            handleEnd(exitCode);
+        }
+    }
+    if (alive) {
+        d->isHandling = false;
+    }
+}
+
+void MountFtpURLJob::handleOutput(const QByteArray& output)
+{
+    Q_D(MountFtpURLJob);
+    const QString text = QString::fromLocal8Bit(output.constData()); // Up to a NUL byte.
     if (!text.contains(QLatin1String("Enter host password for user"))) {
         if (text.contains(QLatin1String("Access denied"))) {
             d->accessDenied = true;
-            d->mount.credentialsRejected();
+            d->mount.credentialsRejected(this);
         }
         return;
     }
     QString password;
     // The title says so on the very first question too.
     switch (d->mount.requestPassword(
-        tr("Access denied"), tr("Enter host password for user:"), &password)) {
+        this, tr("Access denied"), tr("Enter host password for user:"), &password)) {
+    case FuseMount::JobDeleted:
+        break;
     case FuseMount::Cancelled:
         d->cancelled = true;
         d->process->terminate();
@@ -144,12 +215,14 @@ void MountFtpURLJob::readStandardError()
         d->process->terminate();
         break;
     case FuseMount::Answered:
-        d->process->write(password.toLocal8Bit() + '\n');
+        if (d->process->state() != QProcess::NotRunning) { // As after an end amid the question.
+            d->process->write(password.toLocal8Bit() + '\n');
+        }
         break;
     }
 }
 
-void MountFtpURLJob::processFinished(int exitCode)
+void MountFtpURLJob::handleEnd(int exitCode)
 {
     Q_D(MountFtpURLJob);
     if (d->cancelled) {
@@ -171,7 +244,10 @@ void MountFtpURLJob::processFinished(int exitCode)
         // authenticator that remembers asks its user once.
         QString password;
         const FuseMount::Answer answer = d->mount.requestPassword(
-            tr("Access denied"), tr("Enter host password for user:"), &password);
+            this, tr("Access denied"), tr("Enter host password for user:"), &password);
+        if (answer == FuseMount::JobDeleted) {
+            return;
+        }
         if (answer == FuseMount::Cancelled) {
             d->mount.removeMountDirectory();
             finishedWithError(2, tr("Accessing ftp resource was cancelled"));
@@ -187,8 +263,9 @@ void MountFtpURLJob::processFinished(int exitCode)
     }
     d->localPath = d->mount.mountPath + slash + MountPaths::mountRootRelativePath(d->mount.url);
     d->mount.registerMount();
-    d->mount.authenticator->credentialsAccepted();
-    finishedOk();
+    if (d->mount.credentialsAccepted(this)) {
+        finishedOk();
+    }
 }
 
 } // namespace VeyFM

@@ -33,7 +33,7 @@ public:
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountFtpURLJob() override;
 
-    QString url() const;       ///< The URL, with a user name that was changed on the way.
+    QString url() const;       ///< As Qt writes it, with a user name that was changed on the way.
     QString localPath() const; ///< The result, empty until success.
 
     void start() override;
@@ -48,6 +48,9 @@ private:
     void updateMountPath();
     void run();
     bool checkAlreadyMounted();
+    void handleEvents();
+    void handleOutput(const QByteArray& output);
+    void handleEnd(int exitCode);
 };
 
 } // namespace VeyFM

@@ -20,8 +20,8 @@ namespace VeyFM {
  * There is no bound on that wait: a service that never announces the mount leaves the job
  * running, and so does a user who gives up an SFTP login at its first question.
  *
- * Ends with code 2 for a user outside the "fuse" group, with code 1 when the URL makes no place,
- * and with the code of MountURLJob.
+ * Ends with code 2 for a user outside the "fuse" group, with code 1 when the URL makes no place
+ * (one of the scheme "smb" never does: see UpdateSmbEntryJob), and with the code of MountURLJob.
  */
 class VEYFMVFS_EXPORT MountFuseEntryJob : public Job
 {
@@ -33,7 +33,13 @@ public:
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountFuseEntryJob() override;
 
-    /// The path of the URL's entry, for VFS::entry(); empty until success.
+    /**
+     * The path of the URL's entry, for VFS::entry(); empty until success.
+     *
+     * It leads there for a mount that was found, and for a URL of the root of a host. The place
+     * of a mount that was made for another URL stands for the whole URL already, and this path
+     * has that of the URL once more behind it: take the entry of VFS::fuseMountAdded() then.
+     */
     QString path() const;
 
     void start() override;

@@ -29,7 +29,8 @@ public:
 
     FuseMount mount;
     QString localPath;
-    std::unique_ptr<VeySu::PtyProcess> process; // Made by the first run, and used again.
+    // Made by the first run, and used again. Goes, with the tool, before the directory may.
+    std::unique_ptr<VeySu::PtyProcess> process;
     // Each is consumed by the end of the tool.
     bool accessDenied = false;
     bool restartRequested = false;
@@ -146,7 +147,8 @@ bool MountSFtpURLJob::runOnce()
     return converseSshfs();
 }
 
-// Answers the tool until it ends. True when it has to run again.
+// Answers the tool until it ends. True when it has to run again; like all here that ask, false
+// when the job has been deleted meanwhile, and then nothing may be touched.
 bool MountSFtpURLJob::converseSshfs()
 {
     Q_D(MountSFtpURLJob);
@@ -170,18 +172,22 @@ bool MountSFtpURLJob::converseSshfs()
                 d->cancelled = true;
             } else {
                 d->accessDenied = true;
-                d->mount.credentialsRejected();
+                if (!d->mount.credentialsRejected(this)) {
+                    return false;
+                }
             }
             break;
         } else if (output.contains("yes/no")) {
-            askHostKeyQuestion(output);
+            if (!askHostKeyQuestion(output)) {
+                return false;
+            }
             questionAnswered = true;
         }
     }
     return processFinished(d->process->waitForChild());
 }
 
-void MountSFtpURLJob::askHostKeyQuestion(const QByteArray& output)
+bool MountSFtpURLJob::askHostKeyQuestion(const QByteArray& output)
 {
     Q_D(MountSFtpURLJob);
     QString text = QString::fromLocal8Bit(output);
@@ -196,8 +202,12 @@ void MountSFtpURLJob::askHostKeyQuestion(const QByteArray& output)
                   "Are you sure you want to continue connecting?")
                    .arg(question.cap(1), question.cap(2));
     }
-    const bool yes = d->mount.authenticator->askQuestion(tr("Question"), text);
+    bool yes = false;
+    if (!d->mount.askQuestion(this, tr("Question"), text, &yes)) {
+        return false;
+    }
     typeLine(d->process->fd(), yes ? "yes" : "no");
+    return true;
 }
 
 // False when the job has ended.
@@ -207,7 +217,9 @@ bool MountSFtpURLJob::answerPasswordPrompt()
     QString password;
     // The title says so on the very first question too.
     switch (d->mount.requestPassword(
-        tr("Access denied"), tr("Enter host password for user:"), &password)) {
+        this, tr("Access denied"), tr("Enter host password for user:"), &password)) {
+    case FuseMount::JobDeleted:
+        return false;
     case FuseMount::Cancelled:
         d->cancelled = true;
         typeLine(d->process->fd(), QByteArray());
@@ -248,7 +260,10 @@ bool MountSFtpURLJob::processFinished(int status)
         // authenticator that remembers asks its user once.
         QString password;
         const FuseMount::Answer answer = d->mount.requestPassword(
-            tr("Access denied"), tr("Enter host password for user:"), &password);
+            this, tr("Access denied"), tr("Enter host password for user:"), &password);
+        if (answer == FuseMount::JobDeleted) {
+            return false;
+        }
         if (answer == FuseMount::Cancelled) {
             d->mount.removeMountDirectory();
             finishedWithError(2, tr("Accessing sftp resource was cancelled"));
@@ -263,8 +278,9 @@ bool MountSFtpURLJob::processFinished(int status)
     }
     d->localPath = d->mount.mountPath + slash + MountPaths::mountRootRelativePath(d->mount.url);
     d->mount.registerMount();
-    d->mount.authenticator->credentialsAccepted();
-    finishedOk();
+    if (d->mount.credentialsAccepted(this)) {
+        finishedOk();
+    }
     return false;
 }
 

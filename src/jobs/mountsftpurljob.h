@@ -26,7 +26,8 @@ class MountSFtpURLJobPrivate;
  * Ends with code 5 for another scheme, for a host or user that no tool may be given, and when the
  * tool fails; with code 2 when the user gives up after a refusal. A user who gives up at a
  * password prompt, or refuses the key of a host, leaves the job unfinished: start() returns and
- * finished() never comes.
+ * finished() never comes. So does a login that is refused in the run in which the key of the host
+ * was confirmed.
  */
 class VEYFMVFS_EXPORT MountSFtpURLJob : public Job
 {
@@ -38,7 +39,7 @@ public:
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountSFtpURLJob() override;
 
-    QString url() const;       ///< The URL, with a user name that was changed on the way.
+    QString url() const;       ///< As Qt writes it, with a user name that was changed on the way.
     QString localPath() const; ///< The result, empty until success.
 
     void start() override;
@@ -52,7 +53,7 @@ private:
     bool runOnce();
     bool converseSshfs();
     bool processFinished(int status);
-    void askHostKeyQuestion(const QByteArray& output);
+    bool askHostKeyQuestion(const QByteArray& output);
     bool answerPasswordPrompt();
 };
 

@@ -25,7 +25,7 @@ public:
         QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent = nullptr);
     ~MountURLJob() override;
 
-    QString url() const;       ///< The URL, with a user name that was changed on the way.
+    QString url() const;       ///< As Qt writes it, with a user name that was changed on the way.
     QString localPath() const; ///< The result, empty until success.
 
     void start() override;

@@ -14,7 +14,7 @@ namespace VeyFM {
 
 /**
  * Makes sure that a network bookmark has a local path, and mounts its URL if it has none. Ends
- * when the tree has the new local path; there is no bound on that wait.
+ * with the first news of a bookmark, whichever that is; there is no bound on that wait.
  *
  * Ends with code 5 when the entry is no bookmark, and with the code of MountURLJob.
  */

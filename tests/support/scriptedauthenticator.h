@@ -90,6 +90,9 @@ public:
     bool askQuestion(const QString& title, const QString& text) override
     {
         calls.append(QLatin1String("question ") + title + QLatin1Char('|') + text);
+        if (duringQuestion) {
+            duringQuestion();
+        }
         if (questionAnswers.isEmpty()) {
             calls.append(QStringLiteral("unexpected"));
             return false;
@@ -99,6 +102,7 @@ public:
 
     QList<Answer> answers;
     QList<bool> questionAnswers;
+    std::function<void()> duringQuestion; ///< Runs while the job waits.
     QStringList calls;
 };
 
