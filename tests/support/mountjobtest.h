@@ -50,6 +50,23 @@ protected:
         return job;
     }
 
+    /// Runs a job to its end, which comes once.
+    static void finish(VeyFM::Job* job)
+    {
+        QSignalSpy finished(job, &VeyFM::Job::finished);
+        job->start();
+        QVERIFY(finished.count() == 1 || finished.wait(20000));
+        QCOMPARE(finished.count(), 1);
+    }
+
+    /// The same for a job that ends inside start().
+    static void startToEnd(VeyFM::Job* job)
+    {
+        QSignalSpy finished(job, &VeyFM::Job::finished);
+        job->start();
+        QCOMPARE(finished.count(), 1);
+    }
+
     void setFuseMounts(const QJsonObject& mounts)
     {
         service->setValue(u"FuseMountsManager.mounts"_s, mounts);
@@ -76,6 +93,11 @@ protected:
     QString mountDir(const QString& relative) const
     {
         return scene.home() + u"/.vey-fm-vfs"_s + relative;
+    }
+
+    bool isMountDir(const QString& relative) const
+    {
+        return QFileInfo(mountDir(relative)).isDir();
     }
 
     VfsScene scene;
