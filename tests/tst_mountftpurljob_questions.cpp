@@ -47,6 +47,9 @@ private Q_SLOTS:
     void ignoredOutput();
     void givenUpAtThePrompt();
     void givenUpJobTakesItsToolAlong();
+    void filesInTheDirectorySurvive_data();
+    void filesInTheDirectorySurvive();
+    void filesSurviveADeletedJob();
     void changedUserMovesTheDirectory();
     void changedUserIsMountedAlready_data();
     void changedUserIsMountedAlready();
@@ -292,6 +295,56 @@ void MountFtpURLJobQuestionsTest::givenUpJobTakesItsToolAlong()
     QTRY_VERIFY(!job);
     QVERIFY(!process);
     QCOMPARE(auth->calls, QStringList(question(u"bob"_s)));
+}
+
+void MountFtpURLJobQuestionsTest::filesInTheDirectorySurvive_data()
+{
+    QTest::addColumn<QList<QByteArrayList>>("runs");
+    QTest::addColumn<QList<Auth::Answer>>("answers");
+    QTest::addColumn<int>("code");
+    using Runs = QList<QByteArrayList>;
+    using Answers = QList<Auth::Answer>;
+    const auto cancel = Auth::cancel();
+    QTest::newRow("failed") << Runs{{"exit 1"}} << Answers{} << 5;
+    QTest::newRow("given up") << Runs{waits} << Answers{cancel} << 2;
+    QTest::newRow("given up after a refusal") << Runs{{refusal, "exit 1"}} << Answers{cancel} << 2;
+    QTest::newRow("changed user") << Runs{waits, {}} << Answers{Auth::changeUser(u"bob"_s)} << 0;
+    QTest::newRow("changed to an unsafe user")
+        << Runs{waits} << Answers{Auth::changeUser(u"../bob"_s)} << 5;
+}
+
+// As when the directory is still the root of a mount: they would be those of the server.
+void MountFtpURLJobQuestionsTest::filesInTheDirectorySurvive()
+{
+    QFETCH(QList<QByteArrayList>, runs);
+    QFETCH(QList<Auth::Answer>, answers);
+    QFETCH(int, code);
+    const QString file = makeFileInMountDir(u"/ftp/ann@host"_s);
+    for (const QByteArrayList& run : runs) {
+        tool->expect(run);
+    }
+    auth->answers = answers;
+    const auto job = makeJob<MountFtpURLJob>(u"ftp://ann@host"_s);
+    finish(job.get());
+    QCOMPARE(job->error(), code);
+    // The directory goes with the tool, which may end behind the job.
+    QTRY_COMPARE(job->findChild<QProcess*>()->state(), QProcess::NotRunning);
+    QVERIFY(QFileInfo::exists(file));
+}
+
+void MountFtpURLJobQuestionsTest::filesSurviveADeletedJob()
+{
+    const QString file = makeFileInMountDir(u"/ftp/ann@host"_s);
+    tool->expect(waits);
+    auto job = makeJob<MountFtpURLJob>(u"ftp://ann@host"_s);
+    Auth::Answer answer = Auth::cancel();
+    answer.before = [&job] {
+        job.reset();
+    };
+    auth->answers = {answer};
+    job->start();
+    QTRY_VERIFY(!job);
+    QVERIFY(QFileInfo::exists(file));
 }
 
 void MountFtpURLJobQuestionsTest::changedUserMovesTheDirectory()

@@ -62,6 +62,9 @@ private Q_SLOTS:
     void hostKeyText();
     void terminalNotReady_data();
     void terminalNotReady();
+    void filesInTheDirectorySurvive_data();
+    void filesInTheDirectorySurvive();
+    void filesSurviveADeletedJob();
     void changedUserMovesTheDirectory();
     void changedUserIsMountedAlready_data();
     void changedUserIsMountedAlready();
@@ -351,6 +354,60 @@ void MountSFtpURLJobQuestionsTest::terminalNotReady()
     // The tool is left alone, so its directory stays.
     QVERIFY(isMountDir(u"/sftp/host"_s));
     QCOMPARE(recordedMounts(), QStringList());
+}
+
+void MountSFtpURLJobQuestionsTest::filesInTheDirectorySurvive_data()
+{
+    QTest::addColumn<QList<QByteArrayList>>("runs");
+    QTest::addColumn<QList<Auth::Answer>>("answers");
+    QTest::addColumn<int>("ends");
+    QTest::addColumn<int>("code");
+    using Runs = QList<QByteArrayList>;
+    using Answers = QList<Auth::Answer>;
+    const auto cancel = Auth::cancel();
+    QTest::newRow("failed") << Runs{{"exit 1"}} << Answers{} << 1 << 5;
+    QTest::newRow("given up") << Runs{fails} << Answers{cancel} << 0 << 0;
+    QTest::newRow("given up after a refusal")
+        << Runs{{refusal, "exit 1"}} << Answers{cancel} << 1 << 2;
+    QTest::newRow("changed user") << Runs{fails, {}} << Answers{Auth::changeUser(u"bob"_s)} << 1
+                                  << 0;
+    QTest::newRow("changed to an unsafe user")
+        << Runs{fails} << Answers{Auth::changeUser(u"../bob"_s)} << 1 << 5;
+}
+
+// As when the directory is still the root of a mount: they would be those of the server.
+void MountSFtpURLJobQuestionsTest::filesInTheDirectorySurvive()
+{
+    QFETCH(QList<QByteArrayList>, runs);
+    QFETCH(QList<Auth::Answer>, answers);
+    QFETCH(int, ends);
+    QFETCH(int, code);
+    const QString file = makeFileInMountDir(u"/sftp/ann@host"_s);
+    for (const QByteArrayList& run : runs) {
+        tool->expect(run);
+    }
+    auth->answers = answers;
+    const auto job = makeJob<MountSFtpURLJob>(u"sftp://ann@host"_s);
+    QSignalSpy finished(job.get(), &Job::finished);
+    job->start();
+    QCOMPARE(finished.count(), ends);
+    QCOMPARE(job->error(), code);
+    QVERIFY(QFileInfo::exists(file));
+}
+
+void MountSFtpURLJobQuestionsTest::filesSurviveADeletedJob()
+{
+    const QString file = makeFileInMountDir(u"/sftp/ann@host"_s);
+    tool->expect(fails);
+    auto job = makeJob<MountSFtpURLJob>(u"sftp://ann@host"_s);
+    Auth::Answer answer = Auth::cancel();
+    answer.before = [&job] {
+        job.reset();
+    };
+    auth->answers = {answer};
+    job->start();
+    QTRY_VERIFY(!job);
+    QVERIFY(QFileInfo::exists(file));
 }
 
 void MountSFtpURLJobQuestionsTest::changedUserMovesTheDirectory()

@@ -100,6 +100,16 @@ protected:
         return QFileInfo(mountDir(relative)).isDir();
     }
 
+    /// Makes a directory as mounts have them, with a file in it, whose path it returns.
+    QString makeFileInMountDir(const QString& relative) const
+    {
+        QFile file(mountDir(relative) + u"/file"_s);
+        if (!QDir().mkpath(mountDir(relative)) || !file.open(QIODevice::WriteOnly)) {
+            qFatal("can't write %s", qPrintable(file.fileName()));
+        }
+        return file.fileName();
+    }
+
     VfsScene scene;
     std::unique_ptr<StandIn> tool;
     QSharedPointer<ScriptedAuthenticator> auth;
