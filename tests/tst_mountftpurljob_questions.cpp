@@ -10,6 +10,7 @@
 using namespace VeyFM;
 
 Q_DECLARE_METATYPE(QList<QByteArrayList>)
+Q_DECLARE_METATYPE(ScriptedAuthenticator::Answer)
 Q_DECLARE_METATYPE(QList<ScriptedAuthenticator::Answer>)
 
 namespace {
@@ -19,6 +20,7 @@ const QByteArray refusal = "err Error connecting to ftp: Access denied: 530\\n";
 const QByteArrayList mounts = {prompt, "read"};
 const QByteArrayList refuses = {prompt, "read", refusal, "exit 1"};
 const QByteArrayList waits = {prompt, "hang"};
+const QByteArrayList refusesAndWaits = {refusal, "drained", prompt, "hang"};
 
 QString question(const QString& user, const QString& server = QStringLiteral("host"))
 {
@@ -45,8 +47,12 @@ private Q_SLOTS:
     void conversationFails();
     void ignoredOutput_data();
     void ignoredOutput();
+    void givenUpAtThePrompt_data();
     void givenUpAtThePrompt();
     void givenUpJobTakesItsToolAlong();
+    void toolIsAskedToEnd_data();
+    void toolIsAskedToEnd();
+    void isRecordedBeforeItIsAccepted();
     void filesInTheDirectorySurvive_data();
     void filesInTheDirectorySurvive();
     void filesSurviveADeletedJob();
@@ -153,6 +159,12 @@ void MountFtpURLJobQuestionsTest::conversation_data()
         << Answers{right, Auth::changeUser(u"bob"_s, u"lost"_s), right}
         << QStringList{question(u"ann"_s), u"rejected ann"_s, question(u"ann"_s), askBob, u"accepted"_s}
         << bob;
+    // The changed name comes first. The refusal is asked about when the new user's run has ended.
+    QTest::newRow("refused, then changed at the prompt")
+        << u"ftp://ann@host"_s << Runs{refusesAndWaits, mounts, mounts}
+        << Answers{Auth::changeUser(u"bob"_s), right, right, right}
+        << QStringList{u"rejected ann"_s, question(u"ann"_s), askBob, askBob, askBob, u"accepted"_s}
+        << bob;
     QTest::newRow("changed to nobody")
         << bob << Runs{waits, mounts} << Answers{Auth::changeUser(u""_s), right}
         << QStringList{askBob, question(u""_s), u"accepted"_s} << u"ftp://@host"_s;
@@ -160,6 +172,14 @@ void MountFtpURLJobQuestionsTest::conversation_data()
     QTest::newRow("name without the flag")
         << bob << Runs{mounts} << Answers{Auth::password(u"right"_s, u"ann"_s)}
         << QStringList{askBob, u"accepted"_s} << bob;
+    // Each run says anew what its questions are about.
+    Auth::Answer spoils = Auth::password(u"lost"_s);
+    spoils.before = [this] {
+        auth->setResource(u"x"_s, u"x"_s, u"x"_s, u"x"_s);
+    };
+    QTest::newRow("spoilt resource")
+        << bob << Runs{refuses, mounts} << Answers{Auth::password(u"wrong"_s), spoils, right}
+        << QStringList{askBob, rejected, askBob, askBob, u"accepted"_s} << bob;
 }
 
 void MountFtpURLJobQuestionsTest::conversation()
@@ -264,10 +284,30 @@ void MountFtpURLJobQuestionsTest::ignoredOutput()
     QCOMPARE(job->error(), 0);
 }
 
+void MountFtpURLJobQuestionsTest::givenUpAtThePrompt_data()
+{
+    QTest::addColumn<QByteArrayList>("run");
+    QTest::addColumn<QList<Auth::Answer>>("answers");
+    QTest::addColumn<QStringList>("calls");
+    using Answers = QList<Auth::Answer>;
+    const QString askBob = question(u"bob"_s);
+    QTest::newRow("at once") << waits << Answers{Auth::cancel()} << QStringList{askBob};
+    // Nobody asks again, or starts again, for a user who has given up.
+    QTest::newRow("behind a refusal")
+        << refusesAndWaits << Answers{Auth::cancel()} << QStringList{u"rejected bob"_s, askBob};
+    QTest::newRow("behind a changed name")
+        << QByteArrayList({"block 15", prompt, "await 15", prompt, "await 15"})
+        << Answers{Auth::changeUser(u"ann"_s), Auth::cancel()}
+        << QStringList{askBob, question(u"ann"_s)};
+}
+
 void MountFtpURLJobQuestionsTest::givenUpAtThePrompt()
 {
-    tool->expect(waits);
-    auth->answers = {Auth::cancel()};
+    QFETCH(QByteArrayList, run);
+    QFETCH(QList<Auth::Answer>, answers);
+    QFETCH(QStringList, calls);
+    tool->expect(run);
+    auth->answers = answers;
     const auto job = makeJob<MountFtpURLJob>(u"ftp://bob@host"_s);
     QSignalSpy finished(job.get(), &Job::finished);
     bool running = false;
@@ -280,7 +320,8 @@ void MountFtpURLJobQuestionsTest::givenUpAtThePrompt()
     QCOMPARE(job->errorString(), u"Accessing ftp resource was cancelled"_s);
     QTRY_VERIFY(!isMountDir(u"/ftp/bob@host"_s));
     QCOMPARE(finished.count(), 1);
-    QCOMPARE(auth->calls, QStringList(question(u"bob"_s)));
+    QCOMPARE(job->error(), 2);
+    QCOMPARE(auth->calls, calls);
     QCOMPARE(recordedMounts(), QStringList());
 }
 
@@ -295,6 +336,49 @@ void MountFtpURLJobQuestionsTest::givenUpJobTakesItsToolAlong()
     QTRY_VERIFY(!job);
     QVERIFY(!process);
     QCOMPARE(auth->calls, QStringList(question(u"bob"_s)));
+}
+
+void MountFtpURLJobQuestionsTest::toolIsAskedToEnd_data()
+{
+    QTest::addColumn<Auth::Answer>("answer");
+    QTest::addColumn<bool>("deleted");
+    QTest::newRow("given up") << Auth::cancel() << false;
+    QTest::newRow("changed user") << Auth::changeUser(u"mounted"_s) << false;
+    QTest::newRow("deleted job") << Auth::cancel() << true;
+}
+
+// And not killed: it may have something to clean up.
+void MountFtpURLJobQuestionsTest::toolIsAskedToEnd()
+{
+    QFETCH(Auth::Answer, answer);
+    QFETCH(bool, deleted);
+    tool->expect({"block 15", prompt, "await 15"});
+    setFuseMounts({{u"ftp://mounted@host/"_s, u"/mnt"_s}});
+    auto job = makeJob<MountFtpURLJob>(u"ftp://bob@host"_s);
+    answer.before = [&] {
+        if (deleted) {
+            job.reset();
+        }
+    };
+    auth->answers = {answer};
+    job->start();
+    QTRY_COMPARE(tool->receivedSignals(1), QByteArray("15\n"));
+}
+
+void MountFtpURLJobQuestionsTest::isRecordedBeforeItIsAccepted()
+{
+    tool->expect({});
+    const auto job = makeJob<MountFtpURLJob>(u"ftp://host"_s);
+    QSignalSpy finished(job.get(), &Job::finished);
+    QStringList recorded;
+    int endsWhenAccepted = -1;
+    auth->whenAccepted = [&] {
+        recorded = recordedMounts();
+        endsWhenAccepted = finished.count();
+    };
+    finish(job.get());
+    QCOMPARE(recorded.size(), 1);
+    QCOMPARE(endsWhenAccepted, 0);
 }
 
 void MountFtpURLJobQuestionsTest::filesInTheDirectorySurvive_data()
@@ -381,6 +465,7 @@ void MountFtpURLJobQuestionsTest::changedUserIsMountedAlready_data()
     QTest::addColumn<bool>("refused");
     QTest::newRow("at the prompt") << waits << false;
     QTest::newRow("after a refusal") << QByteArrayList({refusal, "exit 1"}) << true;
+    QTest::newRow("at the prompt behind a refusal") << refusesAndWaits << true;
 }
 
 void MountFtpURLJobQuestionsTest::changedUserIsMountedAlready()

@@ -27,6 +27,8 @@ QByteArray prints(QByteArray text)
     return "out " + text.replace('\n', "\\n");
 }
 
+const QByteArrayList keyQuestion = {prints(rsaQuestion), "read"};
+
 QString question(const QString& user)
 {
     return QStringLiteral("retry [sftp  host ] Access denied|Enter host password for user:|") +
@@ -37,6 +39,18 @@ const QString askedForKey = QStringLiteral(
     "question Question|The authenticity of host 'h (10.0.0.1)' can't be established.\n"
     "RSA key fingerprint is SHA256:ab/+cd.\n"
     "Are you sure you want to continue connecting?");
+
+bool isRunning(qint64 process)
+{
+    QFile status(QStringLiteral("/proc/%1/stat").arg(process));
+    if (process == 0 || !status.open(QIODevice::ReadOnly)) {
+        return false;
+    }
+    // The state stands behind the name, which is in brackets. One that has ended and was not
+    // waited for is a zombie.
+    const QByteArray line = status.readAll();
+    return line.mid(line.lastIndexOf(')') + 2, 1) != "Z";
+}
 
 } // namespace
 
@@ -56,12 +70,14 @@ private Q_SLOTS:
     void conversation();
     void conversationFails_data();
     void conversationFails();
+    void keyQuestionCountsForItsRunAlone();
     void silentEnds_data();
     void silentEnds();
     void hostKeyText_data();
     void hostKeyText();
     void terminalNotReady_data();
     void terminalNotReady();
+    void isRecordedBeforeItIsAccepted();
     void filesInTheDirectorySurvive_data();
     void filesInTheDirectorySurvive();
     void filesSurviveADeletedJob();
@@ -129,7 +145,6 @@ void MountSFtpURLJobQuestionsTest::conversation_data()
     const QString rejected = u"rejected bob"_s;
     const QString accepted = u"accepted"_s;
     const auto right = Auth::password(u"right"_s);
-    const QByteArrayList keyQuestion = {prints(rsaQuestion), "read"};
 
     QTest::newRow("key with yes, then the password")
         << bob << Runs{keyQuestion + asks} << Answers{right}
@@ -172,6 +187,14 @@ void MountSFtpURLJobQuestionsTest::conversation_data()
     QTest::newRow("name without the flag")
         << bob << Runs{mounts} << Answers{Auth::password(u"right"_s, u"ann"_s)}
         << QStringList{askBob, accepted} << QByteArray("right\n");
+    // Each run says anew what its questions are about.
+    Auth::Answer spoils = Auth::password(u"lost"_s);
+    spoils.before = [this] {
+        auth->setResource(u"x"_s, u"x"_s, u"x"_s, u"x"_s);
+    };
+    QTest::newRow("spoilt resource")
+        << bob << Runs{refuses, mounts} << Answers{Auth::password(u"wrong"_s), spoils, right}
+        << QStringList{askBob, rejected, askBob, askBob, accepted} << QByteArray("right\n");
 }
 
 void MountSFtpURLJobQuestionsTest::conversation()
@@ -246,6 +269,25 @@ void MountSFtpURLJobQuestionsTest::conversationFails()
     QCOMPARE(recordedMounts(), QStringList());
 }
 
+void MountSFtpURLJobQuestionsTest::keyQuestionCountsForItsRunAlone()
+{
+    tool->expect(keyQuestion + fails);
+    tool->expect(refuses);
+    tool->expect(mounts);
+    auth->questionAnswers = {true};
+    const auto answer = Auth::password(u"x"_s);
+    auth->answers = {Auth::changeUser(u"bob"_s), answer, answer, answer};
+    const auto job = makeJob<MountSFtpURLJob>(u"sftp://ann@host"_s);
+    startToEnd(job.get());
+    const QString askBob = question(u"bob"_s);
+    QCOMPARE(
+        auth->calls, QStringList(
+                         {askedForKey, question(u"ann"_s), askBob, u"rejected bob"_s, askBob,
+                          askBob, u"accepted"_s}));
+    QCOMPARE(job->error(), 0);
+    QCOMPARE(job->url(), u"sftp://bob@host"_s);
+}
+
 void MountSFtpURLJobQuestionsTest::silentEnds_data()
 {
     QTest::addColumn<QByteArrayList>("run");
@@ -255,7 +297,6 @@ void MountSFtpURLJobQuestionsTest::silentEnds_data()
     QTest::addColumn<QByteArray>("input");
     using Answers = QList<Auth::Answer>;
     const QString askBob = question(u"bob"_s);
-    const QByteArrayList keyQuestion = {prints(rsaQuestion), "read"};
     QTest::newRow("given up at the prompt")
         << fails << Answers{Auth::cancel()} << false << QStringList{askBob} << QByteArray("\n");
     QTest::newRow("given up, but it mounts")
@@ -337,23 +378,45 @@ void MountSFtpURLJobQuestionsTest::hostKeyText()
 void MountSFtpURLJobQuestionsTest::terminalNotReady_data()
 {
     QTest::addColumn<QByteArrayList>("run");
-    QTest::newRow("ended") << QByteArrayList({"out x@host's password: "});
-    QTest::newRow("echoes") << QByteArrayList({"out x@host's password: ", "hang"});
+    QTest::addColumn<bool>("runs");
+    QTest::newRow("ended") << QByteArrayList({"out x@host's password: "}) << false;
+    QTest::newRow("echoes") << QByteArrayList({"out x@host's password: ", "hang"}) << true;
 }
 
 void MountSFtpURLJobQuestionsTest::terminalNotReady()
 {
     QFETCH(QByteArrayList, run);
+    QFETCH(bool, runs);
     tool->expect(run);
     auth->answers = {Auth::password(u"secret"_s)};
     const auto job = makeJob<MountSFtpURLJob>(u"sftp://host"_s);
+    bool runsAtTheEnd = false;
+    connect(job.get(), &Job::finished, this, [&] { runsAtTheEnd = isRunning(tool->processId(1)); });
     startToEnd(job.get());
+    QCOMPARE(runsAtTheEnd, runs);
+    QCOMPARE(isRunning(tool->processId(1)), runs);
     QCOMPARE(job->error(), 5);
     QCOMPARE(job->errorString(), u"Can't pass password to sshfs"_s);
     QCOMPARE(auth->calls, QStringList(question(u""_s)));
     // The tool is left alone, so its directory stays.
     QVERIFY(isMountDir(u"/sftp/host"_s));
     QCOMPARE(recordedMounts(), QStringList());
+}
+
+void MountSFtpURLJobQuestionsTest::isRecordedBeforeItIsAccepted()
+{
+    tool->expect({});
+    const auto job = makeJob<MountSFtpURLJob>(u"sftp://host"_s);
+    QSignalSpy finished(job.get(), &Job::finished);
+    QStringList recorded;
+    int endsWhenAccepted = -1;
+    auth->whenAccepted = [&] {
+        recorded = recordedMounts();
+        endsWhenAccepted = finished.count();
+    };
+    startToEnd(job.get());
+    QCOMPARE(recorded.size(), 1);
+    QCOMPARE(endsWhenAccepted, 0);
 }
 
 void MountSFtpURLJobQuestionsTest::filesInTheDirectorySurvive_data()

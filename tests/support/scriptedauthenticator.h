@@ -85,6 +85,9 @@ public:
     void credentialsAccepted() override
     {
         calls.append(QStringLiteral("accepted"));
+        if (whenAccepted) {
+            whenAccepted();
+        }
     }
 
     bool askQuestion(const QString& title, const QString& text) override
@@ -104,6 +107,7 @@ public:
     QList<bool> questionAnswers;
     std::function<void()> duringQuestion; ///< Runs while the job waits.
     QStringList calls;
+    std::function<void()> whenAccepted; ///< Runs inside credentialsAccepted().
 };
 
 #endif

@@ -106,6 +106,28 @@ void waitForReader()
     }
 }
 
+sigset_t only(int signal)
+{
+    sigset_t set;
+    sigemptyset(&set);
+    sigaddset(&set, signal);
+    return set;
+}
+
+void blockSignal(int signal)
+{
+    const sigset_t set = only(signal);
+    sigprocmask(SIG_BLOCK, &set, nullptr);
+}
+
+void waitForSignal(int signal)
+{
+    const sigset_t set = only(signal);
+    int received = 0;
+    sigwait(&set, &received);
+    append(".signals", std::to_string(received) + '\n');
+}
+
 void play(const std::string& line)
 {
     const size_t blank = line.find(' ');
@@ -121,6 +143,10 @@ void play(const std::string& line)
         setEcho(rest == "on");
     } else if (verb == "drained") {
         waitForReader();
+    } else if (verb == "block") {
+        blockSignal(std::atoi(rest.c_str()));
+    } else if (verb == "await") {
+        waitForSignal(std::atoi(rest.c_str()));
     } else if (verb == "hang") {
         pause();
     } else if (verb == "kill") {

@@ -19,6 +19,8 @@
  *   read                 takes a line from standard input
  *   echo on, echo off    switches the echo of the terminal
  *   drained              waits until all that it printed on standard error has been read
+ *   block N              keeps a signal from ending it
+ *   await N              waits for a signal that it blocks
  *   hang                 waits for a signal
  *   kill N, exit N       ends
  *
@@ -92,6 +94,12 @@ public:
     QByteArray input(int run) const
     {
         return read(run, "input");
+    }
+
+    /// The signals that a run has awaited and got, a line each.
+    QByteArray receivedSignals(int run) const
+    {
+        return read(run, "signals");
     }
 
     /// The command line as every user of the system could see it.
