@@ -4,7 +4,6 @@
 #include "core/fuse.h"
 #include "jobs/checksmbshareauthjob.h"
 #include "support/outsidegroup.h"
-#include "support/rerun.h"
 #include "support/scriptedauthenticator.h"
 #include "support/servicescene.h"
 #include "support/standin.h"
@@ -408,47 +407,20 @@ void CheckSmbShareAuthJobTest::execNeverRunsItsLoop()
 
 void CheckSmbShareAuthJobTest::outsideTheGroup()
 {
-    QVERIFY(rerunPasses(outsideGroupArgument));
-}
-
-/// The same for a user who is not in the group "fuse".
-class OutsideGroupTest : public QObject
-{
-    Q_OBJECT
-
-private Q_SLOTS:
-    void isTurnedAway()
+    const auto job = makeJob();
+    QSignalSpy finished(job.get(), &Job::finished);
     {
+        const OutsideGroup outside;
         if (Fuse::isInFuseGroup()) {
             QSKIP("can't leave the group \"fuse\"");
         }
-        const StandIn smbclient("smbclient");
-        const auto auth = QSharedPointer<ScriptedAuthenticator>::create();
-        CheckSmbShareAuthJob job(auth, u"share"_s, host, QString());
-        job.setDeleteOnFinish(false);
-        QSignalSpy finished(&job, &Job::finished);
-        job.start();
-        QCOMPARE(finished.count(), 1);
-        QCOMPARE(job.error(), 4);
-        QCOMPARE(
-            job.errorString(), u"You must be in 'fuse' group in order to browse samba shares!"_s);
-        QCOMPARE(smbclient.runs(), 0);
-        QCOMPARE(auth->calls, QStringList());
+        job->start();
     }
-};
-
-int main(int argc, char** argv)
-{
-    const bool outside = isRerun(argc, argv, outsideGroupArgument);
-    if (outside) {
-        leaveGroups();
-    }
-    QCoreApplication app(argc, argv);
-    if (outside) {
-        return runTests<OutsideGroupTest>(argv);
-    }
-    CheckSmbShareAuthJobTest test;
-    return QTest::qExec(&test, argc, argv);
+    QCOMPARE(finished.count(), 1);
+    QCOMPARE(job->error(), 4);
+    QCOMPARE(job->errorString(), u"You must be in 'fuse' group in order to browse samba shares!"_s);
+    QCOMPARE(m_auth->calls, QStringList());
 }
 
+QTEST_GUILESS_MAIN(CheckSmbShareAuthJobTest)
 #include "tst_checksmbshareauthjob.moc"

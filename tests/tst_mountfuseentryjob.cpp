@@ -6,7 +6,6 @@
 #include "jobs/mounturljob.h"
 #include "support/mountjobtest.h"
 #include "support/outsidegroup.h"
-#include "support/rerun.h"
 
 using namespace VeyFM;
 
@@ -40,6 +39,7 @@ private Q_SLOTS:
     void smbMakesNoEntry();
     void errorsPassThrough_data();
     void errorsPassThrough();
+    void outsideTheGroup_data();
     void outsideTheGroup();
     void cleanupTestCase();
 
@@ -304,9 +304,41 @@ void MountFuseEntryJobTest::errorsPassThrough()
     QCOMPARE(registrations(), QStringList());
 }
 
+void MountFuseEntryJobTest::outsideTheGroup_data()
+{
+    QTest::addColumn<QString>("url");
+    QTest::addColumn<QString>("scheme");
+    QTest::newRow("sftp") << u"sftp://host/a"_s << u"sftp"_s;
+    // With another code than that of a job that looks at the share.
+    QTest::newRow("smb") << u"smb://host/share"_s << u"smb"_s;
+    QTest::newRow("none") << u"host"_s << QString();
+    // Nobody looks whether it is there already.
+    QTest::newRow("mounted") << u"sftp://mounted/a"_s << u"sftp"_s;
+}
+
 void MountFuseEntryJobTest::outsideTheGroup()
 {
-    QVERIFY(rerunPasses(outsideGroupArgument));
+    QFETCH(QString, url);
+    QFETCH(QString, scheme);
+    setNetworkMounts(
+        {{u"sftp://mounted/"_s, QJsonArray{u"SFTP/m"_s, u"/mnt"_s, int(TypeSFtpSharePlace)}}});
+    const auto job = makeJob<MountFuseEntryJob>(url);
+    QSignalSpy finished(job.get(), &Job::finished);
+    {
+        const OutsideGroup outside;
+        if (Fuse::isInFuseGroup()) {
+            QSKIP("can't leave the group \"fuse\"");
+        }
+        job->start();
+    }
+    QCOMPARE(finished.count(), 1);
+    QCOMPARE(job->error(), 2);
+    QCOMPARE(
+        job->errorString(),
+        u"You must be in 'fuse' group in order to view urls with protocol '%1'!"_s.arg(scheme));
+    QVERIFY(job->path().isEmpty());
+    QCOMPARE(auth->calls, QStringList());
+    QCOMPARE(service->takeCalls(), QStringList());
 }
 
 void MountFuseEntryJobTest::cleanupTestCase()
@@ -314,56 +346,5 @@ void MountFuseEntryJobTest::cleanupTestCase()
     QCOMPARE(service->violations(), QStringList());
 }
 
-/// The same for a user who is not in the group "fuse".
-class OutsideGroupTest : public QObject
-{
-    Q_OBJECT
-
-private Q_SLOTS:
-    void isTurnedAway_data()
-    {
-        QTest::addColumn<QString>("url");
-        QTest::addColumn<QString>("scheme");
-        QTest::newRow("sftp") << u"sftp://host"_s << u"sftp"_s;
-        // With another code than that of a job that looks at the share.
-        QTest::newRow("smb") << u"smb://host/share"_s << u"smb"_s;
-        QTest::newRow("none") << u"host"_s << QString();
-    }
-
-    void isTurnedAway()
-    {
-        QFETCH(QString, url);
-        QFETCH(QString, scheme);
-        if (Fuse::isInFuseGroup()) {
-            QSKIP("can't leave the group \"fuse\"");
-        }
-        const auto auth = QSharedPointer<ScriptedAuthenticator>::create();
-        MountFuseEntryJob job(auth, url);
-        job.setDeleteOnFinish(false);
-        QSignalSpy finished(&job, &Job::finished);
-        job.start();
-        QCOMPARE(finished.count(), 1);
-        QCOMPARE(job.error(), 2);
-        QCOMPARE(
-            job.errorString(),
-            u"You must be in 'fuse' group in order to view urls with protocol '%1'!"_s.arg(scheme));
-        QVERIFY(job.path().isEmpty());
-        QCOMPARE(auth->calls, QStringList());
-    }
-};
-
-int main(int argc, char** argv)
-{
-    const bool outside = isRerun(argc, argv, outsideGroupArgument);
-    if (outside) {
-        leaveGroups();
-    }
-    QCoreApplication app(argc, argv);
-    if (outside) {
-        return runTests<OutsideGroupTest>(argv);
-    }
-    MountFuseEntryJobTest test;
-    return QTest::qExec(&test, argc, argv);
-}
-
+QTEST_GUILESS_MAIN(MountFuseEntryJobTest)
 #include "tst_mountfuseentryjob.moc"

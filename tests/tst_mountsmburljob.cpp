@@ -5,7 +5,6 @@
 #include "jobs/mountsmburljob.h"
 #include "support/mountjobtest.h"
 #include "support/outsidegroup.h"
-#include "support/rerun.h"
 
 using namespace VeyFM;
 
@@ -200,7 +199,16 @@ void MountSmbURLJobTest::checkIsAChildThatGoes()
 
 void MountSmbURLJobTest::outsideTheGroup()
 {
-    QVERIFY(rerunPasses(outsideGroupArgument));
+    const auto job = makeJob<MountSmbURLJob>(u"smb://LOCALHOST/share"_s);
+    {
+        const OutsideGroup outside;
+        if (Fuse::isInFuseGroup()) {
+            QSKIP("can't leave the group \"fuse\"");
+        }
+        job->start();
+    }
+    QCOMPARE(job->error(), 4);
+    QCOMPARE(job->errorString(), u"You must be in 'fuse' group in order to browse samba shares!"_s);
 }
 
 void MountSmbURLJobTest::cleanupTestCase()
@@ -208,39 +216,5 @@ void MountSmbURLJobTest::cleanupTestCase()
     QCOMPARE(service->violations(), QStringList());
 }
 
-/// The same for a user who is not in the group "fuse".
-class OutsideGroupTest : public QObject
-{
-    Q_OBJECT
-
-private Q_SLOTS:
-    void codeOfTheCheckPassesThrough()
-    {
-        if (Fuse::isInFuseGroup()) {
-            QSKIP("can't leave the group \"fuse\"");
-        }
-        MountSmbURLJob job(
-            QSharedPointer<ScriptedAuthenticator>::create(), u"smb://LOCALHOST/share"_s);
-        job.setDeleteOnFinish(false);
-        job.start();
-        QCOMPARE(job.error(), 4);
-        QCOMPARE(
-            job.errorString(), u"You must be in 'fuse' group in order to browse samba shares!"_s);
-    }
-};
-
-int main(int argc, char** argv)
-{
-    const bool outside = isRerun(argc, argv, outsideGroupArgument);
-    if (outside) {
-        leaveGroups();
-    }
-    QCoreApplication app(argc, argv);
-    if (outside) {
-        return runTests<OutsideGroupTest>(argv);
-    }
-    MountSmbURLJobTest test;
-    return QTest::qExec(&test, argc, argv);
-}
-
+QTEST_GUILESS_MAIN(MountSmbURLJobTest)
 #include "tst_mountsmburljob.moc"

@@ -4,21 +4,54 @@
 #ifndef VEYFM_TESTS_OUTSIDEGROUP_H
 #define VEYFM_TESTS_OUTSIDEGROUP_H
 
+#include <QtGlobal>
+
+#include <cerrno>
+#include <cstring>
 #include <grp.h>
 #include <unistd.h>
+#include <vector>
 
-/// For rerunPasses(): the tests of a user who is not in the group "fuse".
-constexpr const char* outsideGroupArgument = "outside-group";
-
-/// Goes on as a user without groups, where the test runs as root. Before anything has threads;
-/// whether it worked shows in Fuse::isInFuseGroup().
-inline void leaveGroups()
+/**
+ * Goes on as a user without groups for as long as the object lives, where the test runs as root.
+ * Connections that are open stay so. Whether it worked shows in Fuse::isInFuseGroup(), which asks
+ * for the real user.
+ */
+class OutsideGroup
 {
-    constexpr unsigned nobody = 65534;
-    if (geteuid() == 0 &&
-        (setgroups(0, nullptr) != 0 || setgid(nobody) != 0 || setuid(nobody) != 0)) {
-        _exit(1);
+public:
+    OutsideGroup()
+    {
+        constexpr uid_t nobody = 65534;
+        if (m_wasRoot) {
+            m_groups.resize(size_t(verified(getgroups(0, nullptr))));
+            verified(getgroups(int(m_groups.size()), m_groups.data()));
+            verified(setgroups(0, nullptr));
+            verified(setresuid(nobody, nobody, 0));
+        }
     }
-}
+    ~OutsideGroup()
+    {
+        if (m_wasRoot) {
+            verified(setresuid(0, 0, 0));
+            verified(setgroups(m_groups.size(), m_groups.data()));
+        }
+    }
+    OutsideGroup(const OutsideGroup&) = delete;
+    OutsideGroup& operator=(const OutsideGroup&) = delete;
+
+private:
+    // Nothing may go on with half of the rights.
+    static int verified(int result)
+    {
+        if (result < 0) {
+            qFatal("can't leave groups: %s", std::strerror(errno));
+        }
+        return result;
+    }
+
+    const bool m_wasRoot = geteuid() == 0;
+    std::vector<gid_t> m_groups;
+};
 
 #endif
