@@ -197,7 +197,11 @@ void MountFuseEntryJobTest::changedUserIsWhatItWaitsFor()
     const auto job = makeJob<MountFuseEntryJob>(u"sftp://four/a"_s);
     QSignalSpy finished(job.get(), &Job::finished);
     job->start();
-    QVERIFY(registrations().value(0).startsWith(addMount + u"[\"sftp://bob@four/a\","_s));
+    QCOMPARE(
+        registrations(),
+        QStringList(
+            addMount + u"[\"sftp://bob@four/a\",[\"SFTP/bob@four\",\"%1\",4003]]"_s.arg(
+                           mountDir(u"/sftp/bob@four//a"_s))));
     QSignalSpy told(vfs, &VFS::fuseMountAdded);
     announce(u"sftp://four/a"_s, u"SFTP/four"_s);
     QVERIFY(told.wait(20000));
@@ -285,21 +289,33 @@ void MountFuseEntryJobTest::smbMakesNoEntry()
 void MountFuseEntryJobTest::errorsPassThrough_data()
 {
     QTest::addColumn<QString>("url");
+    QTest::addColumn<bool>("refused");
+    QTest::addColumn<int>("code");
     QTest::addColumn<QString>("error");
-    QTest::newRow("scheme") << u"http://host"_s << u"This network protocol is not supported"_s;
-    QTest::newRow("upper case") << u"SFTP://host"_s << u"This network protocol is not supported"_s;
-    QTest::newRow("no tool may have it") << u"sftp:///a"_s << u"Mounting sftp resource failed"_s;
+    const QString unsupported = u"This network protocol is not supported"_s;
+    QTest::newRow("scheme") << u"http://host"_s << false << 5 << unsupported;
+    QTest::newRow("upper case") << u"SFTP://host"_s << false << 5 << unsupported;
+    QTest::newRow("no tool may have it")
+        << u"sftp:///a"_s << false << 5 << u"Mounting sftp resource failed"_s;
+    QTest::newRow("given up") << u"sftp://host"_s << true << 2
+                              << u"Accessing sftp resource was cancelled"_s;
 }
 
 void MountFuseEntryJobTest::errorsPassThrough()
 {
     QFETCH(QString, url);
+    QFETCH(bool, refused);
+    QFETCH(int, code);
     QFETCH(QString, error);
+    if (refused) {
+        tool->expect({"out Connection reset by peer", "exit 1"});
+        auth->answers = {Auth::cancel()};
+    }
     const auto job = makeJob<MountFuseEntryJob>(url);
     QSignalSpy finished(job.get(), &Job::finished);
     job->start();
     QCOMPARE(finished.count(), 1);
-    QCOMPARE(job->error(), 5);
+    QCOMPARE(job->error(), code);
     QCOMPARE(job->errorString(), error);
     QCOMPARE(registrations(), QStringList());
 }

@@ -7,6 +7,7 @@
 #include "jobs/mountsmburljob.h"
 #include "jobs/mounturljob.h"
 #include "support/mountjobtest.h"
+#include "support/outsidegroup.h"
 
 using namespace VeyFM;
 
@@ -35,6 +36,7 @@ private Q_SLOTS:
     void changedUserShows();
     void errorsPassThrough_data();
     void errorsPassThrough();
+    void smbOutsideTheGroup();
     void silenceOfSftpPassesThrough();
     void cleanupTestCase();
 };
@@ -194,6 +196,24 @@ void MountURLJobTest::errorsPassThrough()
     QCOMPARE(job->error(), code);
     QCOMPARE(job->errorString(), error);
     QCOMPARE(job->url(), url);
+    QVERIFY(job->localPath().isEmpty());
+}
+
+void MountURLJobTest::smbOutsideTheGroup()
+{
+    startScene("smbclient");
+    const auto job = makeJob<MountURLJob>(u"smb://localhost/share"_s);
+    QSignalSpy finished(job.get(), &Job::finished);
+    {
+        const OutsideGroup outside;
+        if (Fuse::isInFuseGroup()) {
+            QSKIP("can't leave the group \"fuse\"");
+        }
+        job->start();
+    }
+    QCOMPARE(finished.count(), 1);
+    QCOMPARE(job->error(), 4);
+    QCOMPARE(job->errorString(), u"You must be in 'fuse' group in order to browse samba shares!"_s);
     QVERIFY(job->localPath().isEmpty());
 }
 

@@ -6,7 +6,10 @@
 #include "jobs/mounturljob.h"
 #include "jobs/updatenetworkplacejob.h"
 #include "jobs/updatesmbentryjob.h"
+#include "service/smbbrowserproxy.h"
 #include "support/mountjobtest.h"
+#include "support/outsidegroup.h"
+#include "support/rerun.h"
 
 using namespace VeyFM;
 
@@ -14,6 +17,11 @@ namespace {
 
 const QByteArrayList listed = {"out Total number of bytes: 12\\n"};
 const QByteArrayList denied = {"out NT_STATUS_ACCESS_DENIED\\n", "exit 1"};
+
+constexpr const char* unreadNetworkArgument = "unread-network";
+
+const QString outsideTheGroup =
+    QStringLiteral("You must be in 'fuse' group in order to browse samba shares!");
 
 } // namespace
 
@@ -32,18 +40,24 @@ private Q_SLOTS:
     void bookmarkIsMounted();
     void bookmarkEndsOnAnyNews();
     void bookmarkEndsAgainOnMoreNews();
+    void bookmarkThatChangesMeanwhile();
+    void bookmarkErrorsPassThrough_data();
     void bookmarkErrorsPassThrough();
+    void bookmarkOutsideTheGroup();
     void bookmarkWithoutAnAnswerWaits();
     void noSambaEntry_data();
     void noSambaEntry();
     void rescans_data();
     void rescans();
+    void rescanEndsOnWhatIsKnown_data();
     void rescanEndsOnWhatIsKnown();
+    void rescanOfAnUnreadNetwork();
     void rescanWithoutAnAnswerWaits();
     void shareWithALocalPath();
     void shareIsAttached_data();
     void shareIsAttached();
     void shareErrorsPassThrough();
+    void shareOutsideTheGroup();
     void cleanupTestCase();
 
 private:
@@ -71,6 +85,19 @@ private:
         service->emitSignal(u"SmbBrowser"_s, signal, arguments);
     }
 
+    /// Runs whenever the browser tells of a scan.
+    template <typename Function>
+    void onScanNews(QObject* receiver, Function function)
+    {
+        const SmbBrowserProxy* const browser = vfs->smbBrowser();
+        connect(browser, &SmbBrowserProxy::workgroupsNotChanged, receiver, function);
+        connect(browser, &SmbBrowserProxy::workgroupsChanged, receiver, function);
+        connect(browser, &SmbBrowserProxy::workgroupNotUpdated, receiver, function);
+        connect(browser, &SmbBrowserProxy::workgroupUpdated, receiver, function);
+        connect(browser, &SmbBrowserProxy::hostNotUpdated, receiver, function);
+        connect(browser, &SmbBrowserProxy::hostUpdated, receiver, function);
+    }
+
     void emitBookmark(const QJsonArray& record)
     {
         service->emitSignal(u"NetworkPlacesManager"_s, u"networkPlaceUpdated"_s, arguments(record));
@@ -85,7 +112,8 @@ void UpdateJobsTest::initTestCase()
     const QByteArray script = R"({"echo": false, "values": {
         "NetworkPlacesManager.networkPlaces": [
             ["Mounted", "sftp://m", "/mnt/m"], ["Ftp", "ftp://host/a", ""],
-            ["Sftp", "sftp://host/a", ""], ["Web", "http://host", ""]],
+            ["Sftp", "sftp://host/a", ""], ["Web", "http://host", ""],
+            ["Changes", "ftp://host/old", ""], ["Smb", "smb://localhost/pub", ""]],
         "SmbBrowser.workgroups": ["WG", "Other"],
         "SmbBrowser.hosts": [],
         "SmbBrowser.hosts WG": ["localhost", "h2"],
@@ -202,15 +230,76 @@ void UpdateJobsTest::bookmarkEndsAgainOnMoreNews()
     QTRY_COMPARE(finished.count(), 2);
 }
 
+void UpdateJobsTest::bookmarkThatChangesMeanwhile()
+{
+    startScene("curlftpfs");
+    tool->expect({"err Enter host password for user 'x': ", "read"});
+    Auth::Answer answer = Auth::password(u"x"_s);
+    answer.before = [this] {
+        emitBookmark({u"Changes"_s, u"ftp://host/new"_s, QString()});
+        log->takeAll(service);
+    };
+    auth->answers = {answer};
+    const auto job = makePlaceJob(place(u"Network/Changes"_s));
+    QSignalSpy finished(job.get(), &Job::finished);
+    job->start();
+    QSignalSpy mounted(job->findChild<MountURLJob*>(), &Job::finished);
+    QVERIFY(mounted.wait(20000));
+    // The new URL, though the old one is what was mounted.
+    QCOMPARE(
+        calls(u"NetworkPlacesManager"_s),
+        QStringList(
+            u"NetworkPlacesManager.updateNetworkPlace[[\"Changes\",\"ftp://host/new\",\"%1\"]]"_s
+                .arg(mountDir(u"/ftp/host//old"_s))));
+    QCOMPARE(finished.count(), 0);
+}
+
+void UpdateJobsTest::bookmarkErrorsPassThrough_data()
+{
+    QTest::addColumn<QString>("path");
+    QTest::addColumn<QList<QByteArrayList>>("runs");
+    QTest::addColumn<int>("code");
+    QTest::addColumn<QString>("error");
+    using Runs = QList<QByteArrayList>;
+    QTest::newRow("scheme") << u"Network/Web"_s << Runs{} << 5
+                            << u"This network protocol is not supported"_s;
+    QTest::newRow("given up") << u"Network/Smb"_s << Runs{{"exit 1"}, denied} << 2
+                              << u"Login cancelled"_s;
+}
+
 void UpdateJobsTest::bookmarkErrorsPassThrough()
 {
-    const auto job = makePlaceJob(place(u"Network/Web"_s));
+    QFETCH(QString, path);
+    QFETCH(QList<QByteArrayList>, runs);
+    QFETCH(int, code);
+    QFETCH(QString, error);
+    for (const QByteArrayList& run : runs) {
+        tool->expect(run);
+        auth->answers.append(Auth::cancel());
+    }
+    const auto job = makePlaceJob(place(path));
     QSignalSpy finished(job.get(), &Job::finished);
     job->start();
     QCOMPARE(finished.count(), 1);
-    QCOMPARE(job->error(), 5);
-    QCOMPARE(job->errorString(), u"This network protocol is not supported"_s);
+    QCOMPARE(job->error(), code);
+    QCOMPARE(job->errorString(), error);
     QCOMPARE(service->takeCalls(), QStringList());
+}
+
+void UpdateJobsTest::bookmarkOutsideTheGroup()
+{
+    const auto job = makePlaceJob(place(u"Network/Smb"_s));
+    QSignalSpy finished(job.get(), &Job::finished);
+    {
+        const OutsideGroup outside;
+        if (Fuse::isInFuseGroup()) {
+            QSKIP("can't leave the group \"fuse\"");
+        }
+        job->start();
+    }
+    QCOMPARE(finished.count(), 1);
+    QCOMPARE(job->error(), 4);
+    QCOMPARE(job->errorString(), outsideTheGroup);
 }
 
 void UpdateJobsTest::bookmarkWithoutAnAnswerWaits()
@@ -297,26 +386,47 @@ void UpdateJobsTest::rescans()
     log->takeAll(service);
     QCoreApplication::processEvents();
     QCOMPARE(finished.count(), 0);
+    // Connected behind the job, and still told before it ends.
+    int endsWhenTold = -1;
+    QObject receiver;
+    onScanNews(&receiver, [&] { endsWhenTold = finished.count(); });
     emitSmb(signal, arguments);
     QVERIFY(finished.wait(20000));
+    QCOMPARE(endsWhenTold, 0);
     QCOMPARE(finished.count(), 1);
     QCOMPARE(job->error(), 0);
     QCOMPARE(tool->runs(), 0);
 }
 
+void UpdateJobsTest::rescanEndsOnWhatIsKnown_data()
+{
+    QTest::addColumn<QString>("path");
+    QTest::newRow("workgroup") << u"Samba/New"_s;
+    QTest::newRow("host") << u"Samba/Other/n1"_s;
+}
+
 void UpdateJobsTest::rescanEndsOnWhatIsKnown()
 {
-    // A workgroup whose hosts nobody has read yet: they are told from inside the request.
-    service->setValue(u"SmbBrowser.hosts New"_s, array(R"(["n1"])"));
+    QFETCH(QString, path);
+    // What is below them nobody has read yet: it is told from inside the request.
     service->setValue(u"SmbBrowser.workgroups"_s, array(R"(["New", "Other", "WG"])"));
+    service->setValue(u"SmbBrowser.hosts New"_s, array(R"(["n1"])"));
+    service->setValue(u"SmbBrowser.hosts Other"_s, array(R"(["n1"])"));
+    service->setValue(u"SmbBrowser.shares n1 Other"_s, object(R"({"pub": ""})"));
     emitSmb(u"rescanFinished"_s, {true});
-    QTRY_VERIFY(!place(u"Samba/New"_s).isNull());
-    const auto job = makeSmbJob(place(u"Samba/New"_s));
+    emitSmb(u"rescanWorkgroupFinished"_s, {u"Other"_s, true});
+    QTRY_VERIFY(!place(path).isNull());
+    const auto job = makeSmbJob(place(path));
     QSignalSpy finished(job.get(), &Job::finished);
     job->start();
     QCOMPARE(finished.count(), 0);
     QVERIFY(finished.wait(20000));
     QCOMPARE(job->error(), 0);
+}
+
+void UpdateJobsTest::rescanOfAnUnreadNetwork()
+{
+    QVERIFY(rerunPasses(unreadNetworkArgument));
 }
 
 void UpdateJobsTest::rescanWithoutAnAnswerWaits()
@@ -395,10 +505,61 @@ void UpdateJobsTest::shareErrorsPassThrough()
     QCOMPARE(auth->object(), u"pub"_s);
 }
 
+void UpdateJobsTest::shareOutsideTheGroup()
+{
+    const auto job = makeSmbJob(place(u"Samba/WG/localhost/pub"_s));
+    QSignalSpy finished(job.get(), &Job::finished);
+    {
+        const OutsideGroup outside;
+        if (Fuse::isInFuseGroup()) {
+            QSKIP("can't leave the group \"fuse\"");
+        }
+        job->start();
+    }
+    QCOMPARE(finished.count(), 1);
+    QCOMPARE(job->error(), 4);
+    QCOMPARE(job->errorString(), outsideTheGroup);
+    QCOMPARE(service->takeCalls(), QStringList());
+}
+
 void UpdateJobsTest::cleanupTestCase()
 {
     QCOMPARE(service->violations(), QStringList());
 }
 
-QTEST_GUILESS_MAIN(UpdateJobsTest)
+/// A network that nobody has read yet, of which there is one in a process.
+class UnreadNetworkTest : public VfsTest
+{
+    Q_OBJECT
+
+private Q_SLOTS:
+    void rescanEndsOnWhatIsKnown()
+    {
+        const QByteArray script = R"({"echo": false, "values": {"SmbBrowser.workgroups": ["WG"]}})";
+        QVERIFY2(startVfs(script), qPrintable(service.errorString()));
+        UpdateSmbEntryJob job(
+            QSharedPointer<ScriptedAuthenticator>::create(), vfs->sambaNetworkEntry());
+        job.setDeleteOnFinish(false);
+        QSignalSpy finished(&job, &Job::finished);
+        job.start();
+        QCOMPARE(finished.count(), 0);
+        QVERIFY(finished.wait(20000));
+        QCOMPARE(job.error(), 0);
+    }
+
+private:
+    const VfsScene m_scene;
+};
+
+int main(int argc, char** argv)
+{
+    const bool unread = isRerun(argc, argv, unreadNetworkArgument);
+    QCoreApplication app(argc, argv);
+    if (unread) {
+        return runTests<UnreadNetworkTest>(argv);
+    }
+    UpdateJobsTest test;
+    return QTest::qExec(&test, argc, argv);
+}
+
 #include "tst_updatejobs.moc"
