@@ -204,6 +204,7 @@ void MountFtpURLJobTest::unsafeUrls_data()
     QTest::newRow("nothing") << u"ftp:"_s;
     QTest::newRow("user alone") << u"ftp://bob@/a"_s;
     QTest::newRow("host is an option") << u"ftp://-oallow_other/a"_s;
+    QTest::newRow("no port") << u"ftp://host:99999/a"_s;
     QTest::newRow("host goes up") << u"ftp://../a"_s;
     QTest::newRow("encoded host goes up") << u"ftp://%2e%2e/a"_s;
     QTest::newRow("slash in the host") << u"ftp://a%2fb/a"_s;

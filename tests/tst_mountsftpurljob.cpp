@@ -170,6 +170,8 @@ void MountSFtpURLJobTest::unsafeUrls_data()
     QTest::newRow("host is a flag") << u"sftp://bob@-f/a"_s;
     QTest::newRow("user is an option") << u"sftp://-oProxyCommand=x@host/a"_s;
     QTest::newRow("encoded option") << u"sftp://%2doProxyCommand=x@host/a"_s;
+    QTest::newRow("option in brackets") << u"sftp://%5B-oProxyCommand=x%5D@host/a"_s;
+    QTest::newRow("no port") << u"sftp://host:99999/a"_s;
     QTest::newRow("host goes up") << u"sftp://../a"_s;
     QTest::newRow("slash in the user") << u"sftp://..%2f..%2fbob@host/a"_s;
     QTest::newRow("newline in the user") << u"sftp://bob%0aann@host/a"_s;

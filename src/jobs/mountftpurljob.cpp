@@ -46,7 +46,7 @@ namespace {
 const QLatin1Char slash('/');
 
 constexpr int mostOutput = 65536; // As much as a pipe holds.
-constexpr int patienceMs = 500;
+constexpr int patienceMs = 1000;
 
 } // namespace
 
