@@ -1,0 +1,63 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TOOL_MOUNTINFO_H
+#define VEYFM_TOOL_MOUNTINFO_H
+
+#include <QByteArray>
+#include <QString>
+#include <QVector>
+
+namespace VeyFM {
+namespace Tool {
+
+/// A mount as the kernel lists it.
+struct KernelMount
+{
+    QString directory; ///< Absolute, and without links.
+    QString type;      ///< The file system, such as "ext4" or "fuse.sshfs".
+    QString source;    ///< What the program that mounted it says, such as "user@host:/".
+
+    bool isFuse() const;
+};
+
+/**
+ * What is mounted, without a look at the mounts themselves: one whose server has gone makes every
+ * look at it hang.
+ *
+ * Directories are compared as texts, after kernelPath().
+ */
+class MountInfo
+{
+public:
+    /// The mounts that this process sees.
+    static MountInfo read();
+
+    /// Mounts from the text of a mountinfo file, as proc(5) describes it. Lines that are none are
+    /// passed over.
+    explicit MountInfo(const QByteArray& text);
+
+    /// Why read() came back with nothing, or empty.
+    QString why() const;
+
+    /// In the order of the kernel: of two at one directory the later hides the earlier.
+    QVector<KernelMount> mounts() const;
+
+    /// Whether something is mounted on exactly this directory.
+    bool isMountPoint(const QString& directory) const;
+
+private:
+    QVector<KernelMount> m_mounts;
+    QString m_why;
+};
+
+/**
+ * The directory as the kernel names it: without links from the top down to @p root, where it lies
+ * below that, and tidied up. Nothing below @p root is looked at.
+ */
+QString kernelPath(const QString& directory, const QString& root);
+
+} // namespace Tool
+} // namespace VeyFM
+
+#endif
