@@ -2,7 +2,9 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "commandline.h"
+#include "core/smburl.h"
 #include "describe.h"
+#include "mounturl.h"
 #include "report.h"
 #include "service.h"
 #include "service/networkplacesmanagerproxy.h"
@@ -70,28 +72,38 @@ int runList(Invocation& invocation)
     return Done;
 }
 
-QString whyNoUrl(const QString& text, const QUrl& url)
+/// A bookmark is less than a mount: its URL may have a port, say, that a mount would drop.
+QString whyNoUrl(const QString& text)
 {
+    if (whyNotMountable(text).isEmpty())
+        return QString();
+    const QUrl url(text, QUrl::StrictMode);
     const QStringList schemes = {
         QStringLiteral("smb"), QStringLiteral("ftp"), QStringLiteral("sftp")};
     if (!url.isValid() || !schemes.contains(url.scheme()) || url.host().isEmpty())
         return QStringLiteral("not a URL of a network resource: smb, ftp or sftp, and a host");
-    if (!url.password().isEmpty())
+    if (shownUrl(text) != text)
         return QStringLiteral("a bookmark is no place for a password");
     return text.contains(QChar(QChar::Null)) ? QStringLiteral("not a URL") : QString();
+}
+
+/// QUrl knows no workgroups.
+QString hostOf(const QString& url)
+{
+    const QString host = QUrl(url).host();
+    return host.isEmpty() ? SmbUrl(url).host() : host;
 }
 
 int runAdd(Invocation& invocation)
 {
     NetworkPlacesManagerProxy* manager = VFS::ptr()->networkPlacesManager();
     const QString text = invocation.operands().constFirst();
-    const QUrl url(text, QUrl::StrictMode);
-    const QString why = whyNoUrl(text, url);
+    const QString why = whyNoUrl(text);
     if (!why.isEmpty()) {
-        report(url.password().isEmpty() ? text : url.toString(QUrl::RemovePassword), why);
+        report(shownUrl(text), why);
         return Failed;
     }
-    const QString name = invocation.operands().value(1, url.host());
+    const QString name = invocation.operands().value(1, hostOf(text));
     if (name.isEmpty() || name.contains(slash) || name == QLatin1String(".") ||
         name == QLatin1String("..")) {
         report(name, QStringLiteral("no name for a place: give another behind the URL"));
