@@ -1,0 +1,123 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "descendants.h"
+
+#include <QByteArray>
+#include <QDir>
+#include <QFile>
+
+#include <vector>
+
+#include <signal.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+constexpr std::chrono::seconds patience(1);
+
+/// The parent of a process that runs, or 0.
+pid_t parentOf(const QString& pid)
+{
+    QFile file(QStringLiteral("/proc/%1/stat").arg(pid));
+    if (!file.open(QIODevice::ReadOnly))
+        return 0;
+    // "PID (NAME) STATE PPID ...", where the name may hold anything.
+    const QByteArray line = file.readAll();
+    const QList<QByteArray> fields = line.mid(line.lastIndexOf(')') + 2).split(' ');
+    const bool runs = fields.size() > 1 && fields.at(0) != "Z" && fields.at(0) != "X";
+    return runs ? pid_t(fields.at(1).toInt()) : 0;
+}
+
+/// Below this process, parents first.
+std::vector<pid_t> runningDescendants()
+{
+    std::multimap<pid_t, pid_t> children;
+    const QStringList names = QDir(QStringLiteral("/proc")).entryList(QDir::Dirs);
+    for (const QString& name : names) {
+        bool isNumber = false;
+        const pid_t pid = name.toInt(&isNumber);
+        if (isNumber)
+            children.emplace(parentOf(name), pid);
+    }
+    std::vector<pid_t> found;
+    const auto addChildrenOf = [&](pid_t parent) {
+        const auto range = children.equal_range(parent);
+        for (auto it = range.first; it != range.second; ++it)
+            found.push_back(it->second);
+    };
+    addChildrenOf(::getpid());
+    for (size_t i = 0; i < found.size(); ++i)
+        addChildrenOf(found[i]);
+    return found;
+}
+
+// By number: glibc 2.36 declares pidfd_open() without C linkage.
+int openHandle(pid_t pid)
+{
+    return int(::syscall(SYS_pidfd_open, pid, 0));
+}
+
+bool sendSignal(int handle, int number)
+{
+    return ::syscall(SYS_pidfd_send_signal, handle, number, nullptr, 0) == 0;
+}
+
+} // namespace
+
+bool hasRunningDescendants()
+{
+    return !runningDescendants().empty();
+}
+
+Descendants::~Descendants()
+{
+    for (const auto& [pid, seen] : m_seen)
+        ::close(seen.handle);
+}
+
+void Descendants::add(pid_t pid)
+{
+    const int handle = openHandle(pid);
+    if (handle >= 0)
+        m_seen.insert({pid, {handle, Clock::time_point()}});
+}
+
+void Descendants::end()
+{
+    const std::vector<pid_t> before = runningDescendants();
+    for (const pid_t pid : before) {
+        if (m_seen.count(pid) == 0)
+            add(pid);
+    }
+    // What is below us behind the opening, too, is what was opened.
+    const std::vector<pid_t> behind = runningDescendants();
+    const Clock::time_point now = Clock::now();
+    for (auto it = m_seen.begin(); it != m_seen.end();) {
+        Seen& seen = it->second;
+        const bool isNew = seen.asked == Clock::time_point();
+        bool isThere = true;
+        if (isNew) {
+            isThere = std::find(behind.begin(), behind.end(), it->first) != behind.end() &&
+                      sendSignal(seen.handle, SIGTERM);
+            seen.asked = now;
+        } else if (now - seen.asked >= patience) {
+            isThere = sendSignal(seen.handle, SIGKILL);
+        } else {
+            isThere = sendSignal(seen.handle, 0);
+        }
+        if (isThere) {
+            ++it;
+        } else {
+            ::close(seen.handle);
+            it = m_seen.erase(it);
+        }
+    }
+}
+
+} // namespace Tool
+} // namespace VeyFM

@@ -1,0 +1,103 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TOOL_TERMINALAUTHENTICATOR_H
+#define VEYFM_TOOL_TERMINALAUTHENTICATOR_H
+
+#include "jobs/authenticator.h"
+#include "login.h"
+#include "prompt.h"
+#include "secret.h"
+
+#include <QStringList>
+
+#include <functional>
+#include <mutex>
+
+namespace VeyFM {
+namespace Tool {
+
+/**
+ * Answers the jobs of one command with what the person at the terminal types, or with what the
+ * command line gives in place of that.
+ *
+ * After a refusal the mount jobs ask twice, and throw the first answer away. That question shows
+ * by its tool having ended, and the person is not troubled with it. There are three tries, and
+ * one for a password that is not typed. Then, and when the person gives up, every question of the
+ * job is answered with "cancelled", and whyGivenUp() says why.
+ *
+ * From the first object on the process leaves no core file.
+ */
+class TerminalAuthenticator : public Authenticator
+{
+public:
+    explicit TerminalAuthenticator(const Login& login);
+    ~TerminalAuthenticator() override;
+
+    QString requestPassword(
+        bool isRetry, const QString& title, const QString& message, QString& user,
+        bool* userChanged, bool* cancelled) override;
+    void credentialsRejected(const QString& user) override;
+    void credentialsAccepted() override;
+    bool askQuestion(const QString& title, const QString& text) override;
+
+    /// To be called before a job: forgets what was told of the one before. The tries at one
+    /// resource are counted on.
+    void beginJob();
+
+    /// Whether the job told that a login has worked.
+    bool wasAccepted() const;
+
+    /// The users that jobs were told so far to take in place of the one in the URL, the last one
+    /// last. From any thread.
+    QStringList changedUsers() const;
+
+    /// Why a question of the job had no answer, with what helps; empty when all had one.
+    QString whyGivenUp() const;
+
+    /**
+     * To be called when a job has ended without a word. Whether it is worth to start another: an
+     * SFTP job does not tell that a password was wrong if the key of the host was confirmed in
+     * the same run. The next job asks again then.
+     */
+    bool isWorthAnotherJob();
+
+    /// Called with true before somebody is asked and with false behind, in the thread of the job.
+    void setAskingHandler(std::function<void(bool)> handler);
+
+    /// Answers every question of the running job with "cancelled", from any thread.
+    void cancel();
+
+private:
+    class Asking;
+
+    QString resource() const;
+    bool isPersonAsked() const;
+    bool isUserAsked(const QString& user, bool isUsed) const;
+    QString whyNoAnswer(const QString& needed, const QString& options) const;
+    QString whyNoMoreTries(bool isUsed) const;
+    QString whyNoUserName(QString& user);
+    QString whyNoPassword(const QString& user, Secret& password);
+    void noteChangedUser(const QString& user);
+    QString giveUp(const QString& why, bool* cancelled);
+
+    const Login m_login;
+    Prompt m_prompt;
+    std::function<void(bool)> m_askingHandler;
+
+    QString m_triedResource; ///< What the next two are about.
+    int m_tries = 0;
+    bool m_wasRefused = false;
+    bool m_passwordGiven = false; ///< Since the last refusal.
+    bool m_descriptorRead = false;
+    bool m_wasAccepted = false;
+    bool m_keyConfirmed = false;
+    QString m_whyGivenUp;
+    mutable std::mutex m_changedUsersLock;
+    QStringList m_changedUsers;
+};
+
+} // namespace Tool
+} // namespace VeyFM
+
+#endif
