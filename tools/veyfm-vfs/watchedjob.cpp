@@ -1,0 +1,325 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "watchedjob.h"
+
+#include "commandline.h"
+#include "descendants.h"
+#include "jobs/job.h"
+#include "report.h"
+#include "spinner.h"
+
+#include <QCoreApplication>
+#include <QEventLoop>
+#include <QProcess>
+
+#include <algorithm>
+#include <cerrno>
+#include <fcntl.h>
+#include <poll.h>
+#include <unistd.h>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+constexpr int defaultTimeout = 60;
+constexpr uint longestTimeout = 1000000; // Seconds; poll() takes milliseconds in an int.
+constexpr std::chrono::seconds grace(5);
+constexpr std::chrono::seconds parting(2);
+constexpr int paceMilliseconds = 100;
+
+constexpr char signalByte = 's';
+constexpr char changeByte = 'c';
+constexpr char endByte = 'e';
+
+// All that the handler touches.
+volatile int handlerDescriptor = -1;
+
+void sendByte(int descriptor, char byte)
+{
+    if (::write(descriptor, &byte, 1) < 0) {
+        // The pipe is full of what wakes the reader just as well.
+    }
+}
+
+void handleSignal(int)
+{
+    const int error = errno;
+    sendByte(handlerDescriptor, signalByte);
+    errno = error;
+}
+
+/// The next byte of the pipe, or 0 when none comes in time. -1 waits for ever.
+char nextByte(int descriptor, int milliseconds)
+{
+    pollfd poll = {descriptor, POLLIN, 0};
+    int ready = 0;
+    do {
+        ready = ::poll(&poll, 1, milliseconds);
+    } while (ready < 0 && errno == EINTR);
+    char byte = 0;
+    if (ready < 1 || ::read(descriptor, &byte, 1) != 1)
+        return 0;
+    return byte;
+}
+
+bool hasRunningTool(const Job& job)
+{
+    const QList<QProcess*> tools = job.findChildren<QProcess*>();
+    return std::any_of(tools.begin(), tools.end(), [](const QProcess* tool) {
+        return tool->state() != QProcess::NotRunning;
+    });
+}
+
+} // namespace
+
+Option jobTimeoutOption()
+{
+    return {
+        {QStringLiteral("timeout")},
+        QStringLiteral("Give up after so long without progress (default: 60; 0: never)"),
+        QStringLiteral("SECONDS"),
+        {},
+        true};
+}
+
+int jobTimeout(const Invocation& invocation)
+{
+    const QString option = QStringLiteral("timeout");
+    return invocation.isSet(option)
+               ? int(std::min(invocation.value(option).toUInt(), longestTimeout))
+               : defaultTimeout;
+}
+
+JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int timeoutSeconds)
+    : m_authenticator(std::move(authenticator))
+    , m_timeoutSeconds(timeoutSeconds)
+{
+    if (::pipe2(m_pipe, O_CLOEXEC) != 0)
+        qFatal("no pipe for the watch of a job");
+    handlerDescriptor = m_pipe[1];
+    m_thread = std::thread([this] { watch(); });
+
+    struct sigaction action = {};
+    action.sa_handler = handleSignal;
+    action.sa_flags = SA_RESTART | int(SA_RESETHAND);
+    for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
+        Handled& handled = m_handled[m_handledCount];
+        handled.number = number;
+        ::sigaction(number, nullptr, &handled.before);
+        if (handled.before.sa_handler == SIG_IGN)
+            continue;
+        ::sigaction(number, &action, nullptr);
+        ++m_handledCount;
+    }
+}
+
+JobWatch::~JobWatch()
+{
+    for (int i = 0; i < m_handledCount; ++i)
+        ::sigaction(m_handled[i].number, &m_handled[i].before, nullptr);
+    sendByte(m_pipe[1], endByte);
+    m_thread.join();
+    handlerDescriptor = -1;
+    ::close(m_pipe[0]);
+    ::close(m_pipe[1]);
+    if (!m_hadToStop)
+        return;
+    // A service that hangs keeps a process at its very end too.
+    std::thread([] {
+        std::this_thread::sleep_for(parting);
+        ::_exit(Failed);
+    }).detach();
+}
+
+void JobWatch::setCutOff(const QString& what, const std::function<void()>& cleanUp)
+{
+    const std::lock_guard<std::mutex> lock(m_lock);
+    m_what = what;
+    m_cleanUp = cleanUp;
+}
+
+bool JobWatch::wasInterrupted() const
+{
+    return m_interrupted;
+}
+
+QString JobWatch::whyStopped() const
+{
+    return m_interrupted ? QStringLiteral("interrupted")
+                         : QStringLiteral("no progress within %1 s").arg(m_timeoutSeconds);
+}
+
+JobResult JobWatch::run(Job& job, const QString& doing)
+{
+    job.setDeleteOnFinish(false);
+    m_authenticator->beginJob();
+    m_timedOut = false;
+    if (m_interrupted)
+        return {JobResult::Interrupted, 0, QString()};
+    m_authenticator->setAskingHandler([this, doing](bool asking) {
+        setState(true, !asking);
+        if (!asking)
+            Spinner::begin(doing);
+    });
+    JobResult result;
+    {
+        const Waiting waiting(doing);
+        setState(true, true);
+        result = resultOf(job);
+        setState(false, false);
+    }
+    m_authenticator->setAskingHandler({});
+    // What comes too late does not count: the caller cleans up behind it.
+    if (m_interrupted)
+        result.end = JobResult::Interrupted;
+    else if (m_timedOut)
+        result.end = JobResult::TimedOut;
+    return result;
+}
+
+JobResult JobWatch::resultOf(Job& job)
+{
+    JobResult result;
+    bool ended = false;
+    QEventLoop loop;
+    QObject::connect(&job, &Job::finished, &loop, [&](Job* finished) {
+        ended = true;
+        result = {JobResult::Finished, finished->error(), finished->errorString()};
+        loop.quit();
+    });
+    {
+        const std::lock_guard<std::mutex> lock(m_lock);
+        m_loop = &loop;
+    }
+    job.start();
+    // All of an SFTP conversation happens in there.
+    const bool isSilent =
+        m_authenticator->protocol() == QLatin1String("sftp") && !m_authenticator->wasAccepted();
+    if (!ended && !isSilent) {
+        const QList<QProcess*> tools = job.findChildren<QProcess*>();
+        for (QProcess* tool : tools) {
+            const auto note = [&, tool](QProcess::ProcessError error) {
+                if (error != QProcess::FailedToStart)
+                    return;
+                ended = true;
+                result = {JobResult::NotStarted, 0, tool->errorString()};
+                loop.quit();
+            };
+            QObject::connect(tool, &QProcess::errorOccurred, &loop, note);
+        }
+        if (!wasStopped())
+            loop.exec();
+        // Jobs that were stopped end with their tools, and those that were given up clean up then.
+        while (hasRunningTool(job))
+            loop.processEvents(QEventLoop::WaitForMoreEvents);
+    }
+    const std::lock_guard<std::mutex> lock(m_lock);
+    m_loop = nullptr;
+    return result;
+}
+
+bool JobWatch::wasStopped() const
+{
+    return m_interrupted || m_timedOut;
+}
+
+void JobWatch::setState(bool running, bool clockRuns)
+{
+    {
+        const std::lock_guard<std::mutex> lock(m_lock);
+        m_running = running;
+        m_clockRuns = clockRuns && m_timeoutSeconds > 0;
+        m_deadline = Clock::now() + std::chrono::seconds(m_timeoutSeconds);
+    }
+    sendByte(m_pipe[1], changeByte);
+}
+
+bool JobWatch::isRunning()
+{
+    const std::lock_guard<std::mutex> lock(m_lock);
+    return m_running;
+}
+
+/// Of the job's time; -1 where nothing bounds it. When there is none left it has timed out.
+int JobWatch::millisecondsLeft()
+{
+    const std::lock_guard<std::mutex> lock(m_lock);
+    if (!m_running || !m_clockRuns)
+        return -1;
+    const auto left =
+        std::chrono::duration_cast<std::chrono::milliseconds>(m_deadline - Clock::now()).count();
+    m_timedOut = left < 0;
+    return left < 0 ? 0 : int(left) + 1;
+}
+
+void JobWatch::watch()
+{
+    while (true) {
+        const int milliseconds = millisecondsLeft();
+        if (milliseconds != 0) {
+            const char byte = nextByte(m_pipe[0], milliseconds);
+            if (byte == endByte)
+                return;
+            if (byte != signalByte)
+                continue;
+            m_interrupted = true;
+        }
+        if (!stop())
+            return;
+    }
+}
+
+/// False when the object ends.
+bool JobWatch::stop()
+{
+    m_hadToStop = true;
+    const Clock::time_point last = Clock::now() + grace;
+    Descendants tools;
+    while (true) {
+        // Again and again, since a job may start another tool, or its loop, only now.
+        const bool running = isRunning();
+        if (!running && !m_interrupted)
+            return true;
+        if (running) {
+            m_authenticator->cancel();
+            quitLoop();
+            tools.end();
+        }
+        const char byte = nextByte(m_pipe[0], paceMilliseconds);
+        if (byte == endByte)
+            return false;
+        if (byte == signalByte)
+            m_interrupted = true;
+        if (Clock::now() >= last)
+            cutOff();
+    }
+}
+
+void JobWatch::quitLoop()
+{
+    const std::lock_guard<std::mutex> lock(m_lock);
+    if (m_loop)
+        QMetaObject::invokeMethod(m_loop, &QEventLoop::quit, Qt::QueuedConnection);
+}
+
+void JobWatch::cutOff()
+{
+    Spinner::end();
+    QString what;
+    std::function<void()> cleanUp;
+    {
+        const std::lock_guard<std::mutex> lock(m_lock);
+        what = m_what;
+        cleanUp = m_cleanUp;
+    }
+    if (cleanUp)
+        cleanUp();
+    report(what, whyStopped());
+    ::_exit(Failed);
+}
+
+} // namespace Tool
+} // namespace VeyFM

@@ -1,0 +1,137 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TOOL_WATCHEDJOB_H
+#define VEYFM_TOOL_WATCHEDJOB_H
+
+#include "terminalauthenticator.h"
+
+#include <QSharedPointer>
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <mutex>
+#include <thread>
+
+#include <signal.h>
+
+class QEventLoop;
+
+namespace VeyFM {
+
+class Job;
+
+namespace Tool {
+
+class Invocation;
+
+/// How a job came to its end.
+struct JobResult
+{
+    enum End {
+        Finished,    ///< By itself, with the code and text below.
+        Silent,      ///< Without a word: it will not finish any more.
+        NotStarted,  ///< Its tool could not be started; the text says why.
+        TimedOut,    ///< It got no further in the time that it had.
+        Interrupted, ///< By a signal.
+    };
+
+    End end = Silent;
+    int code = 0; ///< Job::error().
+    QString text; ///< Job::errorString().
+
+    bool isOk() const
+    {
+        return end == Finished && code == 0;
+    }
+};
+
+/// --timeout of a verb that runs jobs under watch.
+Option jobTimeoutOption();
+
+/// Its value in seconds; 0 for no bound.
+int jobTimeout(const Invocation& invocation);
+
+/**
+ * Runs the jobs of a verb, one after the other, and sees to it that each comes to an end: jobs
+ * may by their contract stay unfinished for ever, and some block their thread.
+ *
+ * A job gets so many seconds in which neither it ends nor somebody is asked. When they are over,
+ * or on SIGINT, SIGTERM or SIGHUP, a thread of this object has the authenticator cancel every
+ * question, and ends the tools that the job has started and starts, until it comes back. One that
+ * does not is cut off after five seconds: the cleaning is done, the reason is reported, and the
+ * program exits. As long as the object lives signals end only jobs, so a verb can clean up behind
+ * them. A second signal has its default effect. Signals that are ignored when the object is made
+ * stay ignored.
+ *
+ * When a job had to be stopped, what the program does behind the end of the object may take two
+ * seconds more, and is cut off then.
+ *
+ * The signals are not blocked, and programs that are started meanwhile don't have them blocked.
+ * One object at a time, and none beside an Interrupt.
+ */
+class JobWatch
+{
+public:
+    JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int timeoutSeconds);
+    ~JobWatch();
+
+    /// What a cut off is reported of, and what is done before it, in another thread.
+    void setCutOff(const QString& what, const std::function<void()>& cleanUp = {});
+
+    /// Runs a job to its end, showing on the terminal what takes its time. The caller owns it:
+    /// it must not delete itself.
+    JobResult run(Job& job, const QString& doing);
+
+    /// Whether a signal came. The verb then ends, and says so once.
+    bool wasInterrupted() const;
+
+    /// The words for a job that timed out or was interrupted.
+    QString whyStopped() const;
+
+private:
+    Q_DISABLE_COPY(JobWatch)
+
+    using Clock = std::chrono::steady_clock;
+
+    struct Handled
+    {
+        int number;
+        struct sigaction before;
+    };
+
+    JobResult resultOf(Job& job);
+    bool wasStopped() const;
+    void setState(bool running, bool clockRuns);
+    bool isRunning();
+    int millisecondsLeft();
+    void watch();
+    bool stop();
+    void quitLoop();
+    [[noreturn]] void cutOff();
+
+    const QSharedPointer<TerminalAuthenticator> m_authenticator;
+    const int m_timeoutSeconds;
+    int m_pipe[2] = {-1, -1};
+    Handled m_handled[3] = {};
+    int m_handledCount = 0;
+    std::atomic<bool> m_interrupted{false};
+    std::atomic<bool> m_timedOut{false};
+    std::atomic<bool> m_hadToStop{false};
+
+    std::mutex m_lock; ///< For what follows.
+    bool m_running = false;
+    bool m_clockRuns = false;
+    Clock::time_point m_deadline;
+    QEventLoop* m_loop = nullptr;
+    QString m_what;
+    std::function<void()> m_cleanUp;
+
+    std::thread m_thread;
+};
+
+} // namespace Tool
+} // namespace VeyFM
+
+#endif
