@@ -170,6 +170,15 @@ void SlowDirectory::serve()
                 answerNames(header->unique, read->offset, read->size);
             }
             break;
+        case FUSE_STATFS:
+            if (m_kind == Stalled) {
+                m_waiting = header->unique;
+                ++m_progress;
+            } else {
+                const fuse_statfs_out reply = {};
+                answer(header->unique, 0, &reply, sizeof reply);
+            }
+            break;
         case FUSE_RELEASEDIR:
             answer(header->unique, 0, nullptr, 0);
             break;

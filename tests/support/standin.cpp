@@ -12,12 +12,14 @@
 #include <iterator>
 #include <string>
 #include <sys/ioctl.h>
+#include <sys/mount.h>
 #include <termios.h>
 #include <unistd.h>
 
 namespace {
 
 std::string base;
+std::string directory; // The argument that is a path.
 
 void append(const std::string& file, const std::string& bytes)
 {
@@ -128,6 +130,26 @@ void waitForSignal(int signal)
     append(".signals", std::to_string(received) + '\n');
 }
 
+void waitForEver()
+{
+    // A test that went wrong leaves nothing behind.
+    alarm(90);
+    while (true) {
+        pause();
+    }
+}
+
+// A file system that nobody serves, and that is dead as soon as this process ends.
+void mountDirectory()
+{
+    const int device = open("/dev/fuse", O_RDWR | O_CLOEXEC);
+    const std::string options = "rootmode=40000,user_id=0,group_id=0,fd=" + std::to_string(device);
+    if (device < 0 ||
+        mount("standin", directory.c_str(), "fuse", MS_NOSUID | MS_NODEV, options.c_str()) != 0) {
+        _exit(92);
+    }
+}
+
 void play(const std::string& line)
 {
     const size_t blank = line.find(' ');
@@ -148,7 +170,15 @@ void play(const std::string& line)
     } else if (verb == "await") {
         waitForSignal(std::atoi(rest.c_str()));
     } else if (verb == "hang") {
-        pause();
+        waitForEver();
+    } else if (verb == "fork") {
+        const pid_t child = fork();
+        if (child == 0) {
+            waitForEver();
+        }
+        append(".child", std::to_string(child));
+    } else if (verb == "mount") {
+        mountDirectory();
     } else if (verb == "kill") {
         raise(std::atoi(rest.c_str()));
     } else if (verb == "exit") {
@@ -175,6 +205,15 @@ int main(int argc, char** argv)
     }
     for (int i = 1; i < argc; ++i) {
         append(".args", std::string(argv[i]) + '\0');
+        if (argv[i][0] == '/' && argv[i][1] != '/') {
+            ::directory = argv[i];
+        }
+    }
+    append(".status", contents("/proc/self/status"));
+    for (int fd = STDERR_FILENO + 1; fd < 100; ++fd) {
+        if (fcntl(fd, F_GETFD) >= 0) {
+            append(".descriptors", std::to_string(fd) + '\0');
+        }
     }
     append(".env", contents("/proc/self/environ"));
     append(".cmdline", contents("/proc/self/cmdline"));

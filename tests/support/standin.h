@@ -21,7 +21,9 @@
  *   drained              waits until all that it printed on standard error has been read
  *   block N              keeps a signal from ending it
  *   await N              waits for a signal that it blocks
- *   hang                 waits for a signal
+ *   hang                 waits for a signal that ends it
+ *   fork                 starts a process that waits for a signal that ends it
+ *   mount                mounts a dead file system on the directory among its arguments
  *   kill N, exit N       ends
  *
  * At the end of the lines it exits with 0. A run that nobody expects exits with 93, and shows in
@@ -106,6 +108,30 @@ public:
     QByteArray commandLine(int run) const
     {
         return read(run, "cmdline");
+    }
+
+    /// The process that a run has started by "fork"; 0 before it has.
+    qint64 childId(int run) const
+    {
+        return read(run, "child").toLongLong();
+    }
+
+    /// The numbers of the open files that a run was given, its standard streams aside.
+    QByteArrayList descriptors(int run) const
+    {
+        return zeroTerminated(read(run, "descriptors"));
+    }
+
+    /// A line of the status that the kernel gave of a run at its beginning, as in proc(5).
+    QByteArray status(int run, const QByteArray& key) const
+    {
+        const QByteArrayList lines = read(run, "status").split('\n');
+        for (const QByteArray& line : lines) {
+            if (line.startsWith(key)) {
+                return line.mid(key.size()).trimmed();
+            }
+        }
+        return QByteArray();
     }
 
 private:

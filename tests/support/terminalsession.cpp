@@ -91,13 +91,13 @@ TerminalSession::Read TerminalSession::readOnce()
     return Read::Some;
 }
 
-bool TerminalSession::waitFor(const QByteArray& text)
+bool TerminalSession::waitFor(const QByteArray& text, int times)
 {
     QElapsedTimer timer;
     timer.start();
-    while (!m_output.contains(text)) {
+    while (m_output.count(text) < times) {
         if (timer.hasExpired(patience) || readOnce() == Read::End)
-            return m_output.contains(text);
+            return m_output.count(text) >= times;
     }
     return true;
 }
@@ -126,4 +126,9 @@ bool TerminalSession::hasEcho() const
 QByteArray TerminalSession::output() const
 {
     return m_output;
+}
+
+pid_t TerminalSession::processId() const
+{
+    return m_pid;
 }

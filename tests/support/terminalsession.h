@@ -25,8 +25,9 @@ public:
     /// Types something.
     void type(const QByteArray& keys);
 
-    /// Reads on until @p text has come; false when the program ends or takes too long.
-    bool waitFor(const QByteArray& text);
+    /// Reads on until @p text has come so many times; false when the program ends or takes too
+    /// long.
+    bool waitFor(const QByteArray& text, int times = 1);
 
     /// Reads to the end. The exit code, or -1 for a program that was killed or takes too long.
     int waitForEnd();
@@ -36,6 +37,8 @@ public:
 
     /// All that has been read.
     QByteArray output() const;
+
+    pid_t processId() const;
 
 private:
     Q_DISABLE_COPY(TerminalSession)
