@@ -60,9 +60,10 @@ void ToolCompletionTest::verbs()
 {
     QCOMPARE(complete({QStringLiteral("li")}), QByteArrayList({"list"}));
     QCOMPARE(
-        complete({QString()}), QByteArrayList(
-                                   {"list", "tree", "info", "monitor", "parent", "resolve",
-                                    "storage", "bookmark", "network", "notify", "status", "help"}));
+        complete({QString()}),
+        QByteArrayList(
+            {"list", "tree", "info", "monitor", "parent", "resolve", "storage", "bookmark",
+             "network", "mount", "notify", "status", "help"}));
     QCOMPARE(
         complete({QStringLiteral("bookmark"), QString()}),
         QByteArrayList({"list", "add", "remove"}));
@@ -70,7 +71,9 @@ void ToolCompletionTest::verbs()
         complete({QStringLiteral("help"), QStringLiteral("network"), QStringLiteral("w")}),
         QByteArrayList({"workgroups"}));
     QCOMPARE(complete({}), complete({QString()}));
-    QCOMPARE(complete({QStringLiteral("help"), QStringLiteral("mo")}), QByteArrayList({"monitor"}));
+    QCOMPARE(
+        complete({QStringLiteral("help"), QStringLiteral("mo")}),
+        QByteArrayList({"monitor", "mount"}));
     QCOMPARE(complete({QStringLiteral("--")}), QByteArrayList({"--help", "--version"}));
     QCOMPARE(complete({QStringLiteral("frobnicate"), QString()}), QByteArrayList());
 }
@@ -82,6 +85,9 @@ void ToolCompletionTest::options()
     QCOMPARE(complete({list, QStringLiteral("--so")}), QByteArrayList({"--sort="}));
     QVERIFY(complete({list, QStringLiteral("-")}).contains("--json"));
     QVERIFY(!complete({QStringLiteral("help"), QStringLiteral("-")}).contains("--json"));
+    QCOMPARE(
+        complete({QStringLiteral("mount"), QStringLiteral("--p")}),
+        QByteArrayList({"--password-fd="}));
     // Behind "--" everything is an operand.
     QCOMPARE(
         complete({list, QStringLiteral("--"), QStringLiteral("--no")}, QStringLiteral("/usr")),

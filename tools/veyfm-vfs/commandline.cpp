@@ -3,6 +3,7 @@
 
 #include "commandline.h"
 
+#include "mounturl.h"
 #include "report.h"
 #include "session.h"
 #include "verbs/verbs.h"
@@ -149,7 +150,7 @@ QString Invocation::checkValues() const
         return QStringLiteral("an operand is missing");
     if (m_verb.mostOperands >= 0 && operands().size() > m_verb.mostOperands && !asksForText) {
         return QStringLiteral("'%1' is an operand too many")
-            .arg(operands().at(m_verb.mostOperands));
+            .arg(shownUrl(operands().at(m_verb.mostOperands)));
     }
     return QString();
 }
@@ -270,6 +271,9 @@ int runCommandLine(const QStringList& words)
     }
     if (!verb->run)
         return wrongUsage(verb->name, QStringLiteral("a command is missing"));
+    const QString why = verb->whyWrong ? verb->whyWrong(invocation) : QString();
+    if (!why.isEmpty())
+        return wrongUsage(verb->name, why);
     setVerbose(invocation.isSet(QStringLiteral("verbose")));
     VFS::initialize();
     return output.finish(runVerb(invocation));

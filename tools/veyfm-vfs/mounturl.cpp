@@ -167,6 +167,13 @@ struct HostAndPort
     bool hasPort = false;
 };
 
+/// The user of a Samba URL, whom SmbUrl passes over. No character is encoded there.
+QString smbUser(const QString& authority)
+{
+    const QString login = authority.mid(authority.indexOf(QLatin1Char(';')) + 1);
+    return login.left(std::max(login.indexOf(QLatin1Char('@')), 0));
+}
+
 QString whyNotSmb(const QString& text, const QString& authority)
 {
     static const QRegularExpression escape(QStringLiteral("%[0-9A-Fa-f]{2}"));
@@ -184,9 +191,7 @@ QString whyNotSmb(const QString& text, const QString& authority)
         return why;
     if (leadsUp(url.tailPath()))
         return QStringLiteral("'..' in the path");
-    // The user, whom SmbUrl passes over.
-    const QString login = authority.mid(authority.indexOf(QLatin1Char(';')) + 1);
-    return whyNoUser(scheme, login.left(std::max(login.indexOf(QLatin1Char('@')), 0)));
+    return whyNoUser(scheme, smbUser(authority));
 }
 
 QString whyNotFuse(const QString& text, const QString& scheme, const QString& authority)
@@ -233,6 +238,20 @@ QString whyNotFuse(const QString& text, const QString& scheme, const QString& au
 }
 
 } // namespace
+
+QString schemeOf(const QString& url)
+{
+    return url.left(url.indexOf(authorityMark));
+}
+
+QString userOf(const QString& url)
+{
+    const QString scheme = schemeOf(url);
+    if (scheme != QLatin1String("smb"))
+        return QUrl(url).userName(QUrl::FullyDecoded);
+    const int start = scheme.size() + authorityMark.size();
+    return smbUser(url.mid(start, authorityEnd(url, start) - start));
+}
 
 QString whyNotMountable(const QString& url)
 {

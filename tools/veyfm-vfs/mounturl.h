@@ -14,6 +14,12 @@ namespace Tool {
 // name of an FTP user begins the next mount option, and a port is dropped. Each function returns
 // the reason for a refusal, or an empty text.
 
+/// The scheme as it is written, and the user; empty where there is none. For URLs that
+/// whyNotMountable() has nothing against. @{
+QString schemeOf(const QString& url);
+QString userOf(const QString& url);
+/// @}
+
 /// Why a URL is not mounted.
 QString whyNotMountable(const QString& url);
 

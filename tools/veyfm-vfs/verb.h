@@ -67,6 +67,8 @@ struct Verb
     bool printsData = true; ///< Whether it knows --json.
     bool hidden = false;    ///< Whether help and completion pass over it.
     QVector<Option> options = {};
+    /// What is wrong with a command line beyond what the description tells; empty for nothing.
+    QString (*whyWrong)(const Invocation& invocation) = nullptr;
     int (*run)(Invocation& invocation) = nullptr; ///< Returns an ExitCode.
     QVector<Verb> verbs = {};                     ///< In place of run().
 

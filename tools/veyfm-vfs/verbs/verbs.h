@@ -22,6 +22,7 @@ Verb helpVerb();
 Verb infoVerb();
 Verb listVerb();
 Verb monitorVerb();
+Verb mountVerb();
 Verb networkVerb();
 Verb notifyVerb();
 Verb parentVerb();

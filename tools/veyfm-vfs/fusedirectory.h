@@ -1,0 +1,49 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_TOOL_FUSEDIRECTORY_H
+#define VEYFM_TOOL_FUSEDIRECTORY_H
+
+#include <QString>
+#include <QStringList>
+#include <QUrl>
+
+namespace VeyFM {
+namespace Tool {
+
+class MountInfo;
+
+/// The directory on which the jobs mount the root of an ftp or sftp URL.
+QString fuseDirectory(const QUrl& url);
+
+/// Whether the path lies on a FUSE mount. The mount is not looked at.
+bool isOnFuseMount(const QString& path, const MountInfo& kernel);
+
+/// Why the file system of a directory is of no use, or empty. One that does not answer is given
+/// up after so many seconds.
+QString whyDead(const QString& directory, int seconds);
+
+/**
+ * What a run may have left behind below the root of the mounts: directories that it made, and
+ * mounts. What was there when the object was made is never touched.
+ */
+class FuseTrace
+{
+public:
+    /// For URLs of one scheme.
+    explicit FuseTrace(const QString& scheme);
+
+    /// Unmounts and removes those of the directories that are new. From any thread.
+    void remove(const QStringList& directories) const;
+
+private:
+    const QString m_parent;
+    QStringList m_parents; ///< Those that were not there.
+    QStringList m_names;
+    QStringList m_mounts;
+};
+
+} // namespace Tool
+} // namespace VeyFM
+
+#endif

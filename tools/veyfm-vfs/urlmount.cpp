@@ -1,0 +1,331 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "urlmount.h"
+
+#include "core/mountpaths.h"
+#include "fusedirectory.h"
+#include "jobfailure.h"
+#include "jobs/mountfuseentryjob.h"
+#include "jobs/mounturljob.h"
+#include "mountinfo.h"
+#include "mounturl.h"
+#include "report.h"
+#include "service.h"
+#include "service/fusemountsmanagerproxy.h"
+#include "service/networkmountsmanagerproxy.h"
+#include "spinner.h"
+#include "vfs/vfs.h"
+#include "vfs/vfsplacebase.h"
+#include "vfs/vfssettings.h"
+#include "watchedjob.h"
+
+#include <QDBusConnection>
+#include <QDBusMessage>
+#include <QDir>
+#include <QUrl>
+
+#include <algorithm>
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+const QLatin1Char slash('/');
+
+constexpr int longestLook = 5; // Seconds.
+
+QString whyNoRunningService()
+{
+    const QString why = whyNoService(serviceState());
+    return why.isEmpty() ? startService() : why;
+}
+
+/// Runs the jobs of one command, which share the answers of the user and the watch.
+class JobRunner
+{
+public:
+    JobRunner(const QString& scheme, const QString& shown, const Login& login, int timeoutSeconds)
+        : m_scheme(scheme)
+        , m_doing(QStringLiteral("Mounting ") + shown)
+        , m_authenticator(QSharedPointer<TerminalAuthenticator>::create(login))
+        , m_watch(m_authenticator, timeoutSeconds)
+    {
+    }
+
+    /// Runs a job for what @p url() returns, and another one as long as that is of use. Calls
+    /// @p take with the one that did well; else returns why there is none.
+    template <typename MadeJob, typename Url, typename Take>
+    QString run(const Url& url, const Take& take)
+    {
+        while (true) {
+            MadeJob job(m_authenticator, url());
+            const JobResult result = m_watch.run(job, m_doing);
+            if (result.isOk()) {
+                take(job);
+                return QString();
+            }
+            if (result.end != JobResult::Silent || !m_authenticator->isWorthAnotherJob())
+                return whyFailed(result, m_scheme, *m_authenticator, m_watch);
+        }
+    }
+
+    const TerminalAuthenticator& authenticator() const
+    {
+        return *m_authenticator;
+    }
+    JobWatch& watch()
+    {
+        return m_watch;
+    }
+
+private:
+    const QString m_scheme;
+    const QString m_doing;
+    const QSharedPointer<TerminalAuthenticator> m_authenticator;
+    JobWatch m_watch;
+};
+
+/// Mounts a URL of the schemes ftp and sftp: its root, once for all URLs of the host.
+class FuseMounter
+{
+public:
+    FuseMounter(const QUrl& url, const Login& login, int timeoutSeconds)
+        : m_patience(timeoutSeconds == 0 ? longestLook : std::min(timeoutSeconds, longestLook))
+        , m_firstUrl(url)
+        , m_url(url)
+        , m_shown(shownUrl(url.toString()))
+        , m_before(MountInfo::read())
+        , m_trace(url.scheme())
+        , m_runner(url.scheme(), m_shown, login, timeoutSeconds)
+    {
+        m_runner.watch().setCutOff(m_shown, [this] { m_trace.remove(directories()); });
+    }
+
+    UrlMount mount()
+    {
+        UrlMount result;
+        {
+            const Waiting waiting(QStringLiteral("Looking at what is mounted"));
+            m_whyAlone = VFS::ptr()->settings()->isNetworkEnabled()
+                             ? whyNoRunningService()
+                             : QStringLiteral("the network is switched off in the settings");
+            find();
+        }
+        if (!m_runner.watch().wasInterrupted())
+            result.why = work();
+        if (result.why.isEmpty() && m_runner.watch().wasInterrupted())
+            result.why = m_runner.watch().whyStopped();
+        if (!result.why.isEmpty()) {
+            cleanUp();
+            return result;
+        }
+        result.state = wasThere() ? UrlMount::Present : UrlMount::New;
+        if (result.state == UrlMount::New && !m_whyAlone.isEmpty())
+            report(m_shown, QStringLiteral("other programs don't see this mount: ") + m_whyAlone);
+        result.url = m_url.toString(QUrl::FullyEncoded);
+        result.localPath =
+            QDir::cleanPath(m_directory + slash + MountPaths::mountRootRelativePath(m_url));
+        result.placePath = placeOf(result.localPath);
+        return result;
+    }
+
+private:
+    QString rootUrl() const
+    {
+        return MountPaths::mountRootUrl(m_url);
+    }
+
+    /// Looks where the URL is mounted, or will be.
+    void find()
+    {
+        m_directory.clear();
+        m_hasPlace = false;
+        m_isRegistered = false;
+        if (m_whyAlone.isEmpty()) {
+            const QMap<QString, Entry> places = VFS::ptr()->networkMountsManager()->mounts();
+            m_hasPlace = places.contains(rootUrl());
+            m_directory = VFS::ptr()->fuseMountsManager()->mounts().value(rootUrl());
+            m_isRegistered = !m_directory.isEmpty();
+            if (!m_isRegistered)
+                m_directory = places.value(rootUrl()).localPath();
+        }
+        if (m_directory.isEmpty())
+            m_directory = fuseDirectory(m_url);
+    }
+
+    bool wasThere() const
+    {
+        return isOnFuseMount(m_directory, m_before);
+    }
+
+    /// Why the URL is not mounted in the end, or empty.
+    QString work()
+    {
+        if (wasThere()) {
+            const QString why = whyNotUsable();
+            return why.isEmpty() ? share() : why;
+        }
+        QString why = whyNoTool(m_url.scheme());
+        if (!why.isEmpty())
+            return why;
+        forgetRegistration();
+        // A place that is there would do for the job that makes one, mounted or not.
+        why = m_whyAlone.isEmpty() && !m_hasPlace ? runJob<MountFuseEntryJob>()
+                                                  : runJob<MountURLJob>();
+        if (!why.isEmpty())
+            return why;
+        // The user may have changed on the way, and what is registered for the new one is taken
+        // by the job as it stands.
+        find();
+        if (m_isRegistered && !isOnFuseMount(m_directory, MountInfo::read())) {
+            forgetRegistration();
+            why = runJob<MountURLJob>();
+            find();
+        }
+        return why.isEmpty() ? whyNotUsable() : why;
+    }
+
+    template <typename MadeJob>
+    QString runJob()
+    {
+        const auto url = [this] {
+            takeUser();
+            return rootUrl();
+        };
+        const QString why = m_runner.run<MadeJob>(url, [](const MadeJob&) {});
+        takeUser();
+        return why;
+    }
+
+    /// The user may change with each job.
+    void takeUser()
+    {
+        const QStringList users = m_runner.authenticator().changedUsers();
+        if (!users.isEmpty())
+            m_url.setUserName(users.constLast(), QUrl::DecodedMode);
+    }
+
+    /// Makes a mount known that the service knows nothing of, or has no place for.
+    QString share()
+    {
+        if (!m_whyAlone.isEmpty() || m_hasPlace)
+            return QString();
+        if (!m_isRegistered)
+            VFS::ptr()->fuseMountsManager()->addMount(rootUrl(), m_directory);
+        return runJob<MountFuseEntryJob>();
+    }
+
+    /// What is registered but not mounted is no help: a job would take it for a mount.
+    void forgetRegistration()
+    {
+        if (m_isRegistered)
+            VFS::ptr()->fuseMountsManager()->addMount(rootUrl(), QString());
+        m_isRegistered = false;
+    }
+
+    QString whyNotUsable() const
+    {
+        if (!isOnFuseMount(m_directory, MountInfo::read())) {
+            return QStringLiteral("the tool ended well, but nothing is mounted on %1")
+                .arg(m_directory);
+        }
+        if (!wasThere())
+            return QString();
+        const Waiting waiting(QStringLiteral("Looking at the mount"));
+        const QString why = whyDead(m_directory, m_patience);
+        if (why.isEmpty())
+            return QString();
+        return QStringLiteral("it was mounted before, but is dead (%2): run fusermount3 -uz '%1', "
+                              "then try again")
+            .arg(m_directory, why);
+    }
+
+    /// Directories that the jobs may have mounted on. From any thread.
+    QStringList directories() const
+    {
+        QStringList all = {fuseDirectory(m_firstUrl)};
+        const QStringList users = m_runner.authenticator().changedUsers();
+        for (const QString& user : users) {
+            QUrl url = m_firstUrl;
+            url.setUserName(user, QUrl::DecodedMode);
+            all.append(fuseDirectory(url));
+        }
+        return all;
+    }
+
+    void cleanUp()
+    {
+        m_trace.remove(directories());
+        if (wasThere() || !m_whyAlone.isEmpty() || !m_runner.authenticator().wasAccepted())
+            return;
+        // Without waiting: that it is silent may be the reason.
+        QDBusMessage message = QDBusMessage::createMethodCall(
+            serviceName(), QStringLiteral("/FuseMountsManager"),
+            QStringLiteral("org.veylabs.FileManager.FuseMountsManager"),
+            QStringLiteral("addMount"));
+        message.setArguments({rootUrl(), QString()});
+        QDBusConnection::sessionBus().send(message);
+    }
+
+    /// The place of the mount, and the path below it.
+    QString placeOf(const QString& localPath) const
+    {
+        const Entry named = VFS::ptr()->createEntryForUrl(rootUrl(), m_directory);
+        const Entry place = VFS::ptr()->placeBase()->placeEntry(named.path());
+        const QString root = QDir::cleanPath(place.localPath());
+        if (place.isNull() || !(localPath + slash).startsWith(root + slash))
+            return QString();
+        return place.path() + localPath.mid(root.size());
+    }
+
+    const int m_patience;
+    const QUrl m_firstUrl;
+    QUrl m_url; ///< With the user that was taken in the end.
+    const QString m_shown;
+    const MountInfo m_before;
+    const FuseTrace m_trace;
+    QString m_whyAlone;          ///< Why other programs don't see what is mounted, or empty.
+    QString m_directory;         ///< That of the root.
+    bool m_isRegistered = false; ///< Whether the service takes the directory for a mount.
+    bool m_hasPlace = false;
+    JobRunner m_runner; ///< Ends first, with the thread that cleans up.
+};
+
+UrlMount mountSamba(const QString& url, const Login& login, int timeoutSeconds)
+{
+    UrlMount result;
+    result.state = UrlMount::Reached;
+    result.url = url;
+    result.why = whyNoRunningService();
+    if (!result.why.isEmpty()) {
+        result.why.prepend(QStringLiteral("Samba shares are reached through the service: "));
+        return result;
+    }
+    const QString scheme = schemeOf(url);
+    result.why = whyNoTool(scheme);
+    if (!result.why.isEmpty())
+        return result;
+    JobRunner runner(scheme, shownUrl(url), login, timeoutSeconds);
+    runner.watch().setCutOff(shownUrl(url));
+    result.why = runner.run<MountURLJob>(
+        [&url] { return url; },
+        [&result](const MountURLJob& job) { result.localPath = QDir::cleanPath(job.localPath()); });
+    return result;
+}
+
+} // namespace
+
+UrlMount mountUrl(const QString& url, const Login& login, int timeoutSeconds)
+{
+    if (schemeOf(url) == QLatin1String("smb"))
+        return mountSamba(url, login, timeoutSeconds);
+    QUrl parsed(url);
+    if (!login.user.isEmpty())
+        parsed.setUserName(login.user, QUrl::DecodedMode);
+    return FuseMounter(parsed, login, timeoutSeconds).mount();
+}
+
+} // namespace Tool
+} // namespace VeyFM

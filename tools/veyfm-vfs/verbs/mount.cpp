@@ -1,0 +1,94 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "commandline.h"
+#include "describe.h"
+#include "login.h"
+#include "mounturl.h"
+#include "report.h"
+#include "urlmount.h"
+#include "verbs/verbs.h"
+#include "watchedjob.h"
+
+namespace VeyFM {
+namespace Tool {
+
+namespace {
+
+void print(Output& output, bool asJson, const UrlMount& mount)
+{
+    if (!asJson) {
+        output.writeRecord(output.name(mount.localPath));
+        return;
+    }
+    QJsonObject object = {
+        {QStringLiteral("url"), mount.url},
+        {QStringLiteral("path"), textOrNull(mount.placePath)},
+        {QStringLiteral("localPath"), mount.localPath},
+        {QStringLiteral("alreadyMounted"), mount.state != UrlMount::New}};
+    JsonArray json(output);
+    json.append(object);
+    json.end();
+}
+
+int run(Invocation& invocation)
+{
+    const QString url = invocation.operands().constFirst();
+    Login login = readLogin(invocation);
+    QString why = whyNotMountable(url);
+    if (why.isEmpty())
+        why = whyNoUser(schemeOf(url), login.user);
+    UrlMount mount;
+    if (why.isEmpty()) {
+        if (login.user.isEmpty())
+            login.user = userOf(url);
+        mount = mountUrl(url, login, jobTimeout(invocation));
+        why = mount.why;
+    }
+    if (!why.isEmpty()) {
+        report(shownUrl(url), why);
+        return Failed;
+    }
+    print(invocation.output(), invocation.json(), mount);
+    return Done;
+}
+
+QString whyWrong(const Invocation& invocation)
+{
+    const QString why = whyNoLogin(invocation);
+    if (!why.isEmpty())
+        return why;
+    const QString url = invocation.operands().constFirst();
+    const QString user = invocation.value(QStringLiteral("user"));
+    if (user.isEmpty() || !whyNotMountable(url).isEmpty())
+        return QString();
+    const QString other = userOf(url);
+    return other.isEmpty() || other == user
+               ? QString()
+               : QStringLiteral("the user is '%1' in the URL and '%2' in --user").arg(other, user);
+}
+
+} // namespace
+
+Verb mountVerb()
+{
+    Verb verb;
+    verb.name = QStringLiteral("mount");
+    verb.operands = QStringLiteral("URL");
+    verb.summary = QStringLiteral("Mount a network resource");
+    verb.details = QStringLiteral(
+        "A URL of the schemes smb, ftp and sftp. Prints the local path of what it names. "
+        "Passwords\n"
+        "and the keys of unknown hosts are asked about on the terminal. What is mounted stays so:\n"
+        "'fusermount3 -u' and the directory ends it.");
+    verb.operandKind = OperandKind::Texts;
+    verb.leastOperands = 1;
+    verb.mostOperands = 1;
+    verb.options = loginOptions() + QVector<Option>{jobTimeoutOption()};
+    verb.whyWrong = whyWrong;
+    verb.run = run;
+    return verb;
+}
+
+} // namespace Tool
+} // namespace VeyFM
