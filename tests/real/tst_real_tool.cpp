@@ -1,0 +1,273 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "real/realmounttest.h"
+#include "real/smbserver.h"
+#include "real/sshserver.h"
+#include "support/terminalsession.h"
+#include "support/toolscene.h"
+
+/// "veyfm-vfs mount" against real servers, as a person at a terminal meets it.
+class RealToolTest : public QObject
+{
+    Q_OBJECT
+
+private Q_SLOTS:
+    void init();
+    void cleanup();
+    void firstContact();
+    void keyRefused();
+    void wrongPasswords();
+    void otherUser();
+    void cannotConnect_data();
+    void cannotConnect();
+    void morePromptsThanPasswords();
+    void interrupted();
+    void fromDescriptor();
+    void sambaLogin();
+
+private:
+    std::unique_ptr<TerminalSession> onTerminal(const char* line) const
+    {
+        // One that can't show a wait, which may come or not.
+        QProcessEnvironment environment = m_service->environment();
+        environment.insert(u"TERM"_s, u"dumb"_s);
+        return std::make_unique<TerminalSession>(
+            toolPath(), ToolScene::words(line), QDir::rootPath(), environment, 200);
+    }
+
+    static QByteArray keys(const char* text)
+    {
+        return QByteArray(text) + '\n';
+    }
+
+    static QString mountDir(const QString& relative)
+    {
+        return QDir::homePath() + u"/.vey-fm-vfs"_s + relative;
+    }
+
+    static QStringList mountDirs()
+    {
+        QStringList result;
+        const QList<QByteArray> lines = fileContents(u"/proc/self/mounts"_s).split('\n');
+        for (const QByteArray& line : lines) {
+            const QString directory = QFile::decodeName(line.split(' ').value(1));
+            if (directory.startsWith(mountDir(u"/"_s)))
+                result.append(directory);
+        }
+        return result;
+    }
+
+    static void trust(const char* host)
+    {
+        QDir::home().mkpath(u".ssh"_s);
+        QFile file(QDir::homePath() + u"/.ssh/known_hosts"_s);
+        QVERIFY(file.open(QIODevice::WriteOnly));
+        file.write(QByteArray(host) + ' ' + SshServer::publicKey(host) + '\n');
+    }
+
+    std::unique_ptr<ToolScene> m_service;
+};
+
+void RealToolTest::init()
+{
+    SKIP_WITHOUT_SANDBOX();
+    m_service = std::make_unique<ToolScene>(QJsonObject{
+        {u"remember"_s, true},
+        {u"values"_s, QJsonObject{{u"SmbBrowser.smbNetworkLocalPath"_s, u"/net/smb"_s}}}});
+    QVERIFY(m_service->isReady());
+    QFile::remove(QDir::homePath() + u"/.ssh/known_hosts"_s);
+}
+
+void RealToolTest::cleanup()
+{
+    if (!Sandbox::isEntered())
+        return;
+    const QStringList mounted = mountDirs();
+    for (const QString& directory : mounted)
+        QCOMPARE(QProcess::execute(u"fusermount3"_s, {u"-u"_s, directory}), 0);
+    QDir(mountDir(QString())).removeRecursively();
+    QTRY_VERIFY(processesNamed("ssh").isEmpty());
+    QTRY_VERIFY(processesNamed("sshfs").isEmpty());
+    QStringList findings = SecretWatch::takeFindings();
+    findings.removeAll(u"smbclient environ"_s); // Where the contract puts it.
+    QCOMPARE(findings, QStringList());
+    QCOMPARE(SecretWatch::findFiles(), QStringList());
+    QCOMPARE(m_service->service().violations(), QStringList());
+    m_service.reset();
+}
+
+void RealToolTest::firstContact()
+{
+    const auto session = onTerminal("mount --json sftp://alice@server.test/~/papers");
+    QVERIFY(session->waitFor(SshServer::fingerprint(Sandbox::serverHost).toLatin1()));
+    QVERIFY(session->waitFor("Type yes or no: "));
+    session->type("yes\n");
+    QVERIFY(session->waitFor("Password for alice on sftp://server.test: "));
+    session->type(keys(Sandbox::alice.password));
+    QCOMPARE(session->waitForEnd(), 0);
+    QVERIFY(!session->output().contains(Sandbox::alice.password));
+    const QString papers = mountDir(u"/sftp/alice@server.test~/papers"_s);
+    QVERIFY2(
+        session->output().contains("\"localPath\":\"" + papers.toLatin1() + '"'),
+        session->output().constData());
+    QVERIFY(QFile::exists(papers + u"/draft.txt"_s));
+
+    // Another program finds it, by its place too, and another URL of the host takes it.
+    const ToolResult list = m_service->run("list SFTP/alice@server.test/papers");
+    QCOMPARE(list.out, QByteArray("draft.txt\n"));
+    const ToolResult again = m_service->run("mount sftp://alice@server.test/~");
+    QCOMPARE(again.err, QByteArray());
+    QCOMPARE(again.out, mountDir(u"/sftp/alice@server.test~\n"_s).toLatin1());
+    QCOMPARE(mountDirs().size(), 1);
+}
+
+void RealToolTest::keyRefused()
+{
+    const auto session = onTerminal("mount sftp://alice@server.test/");
+    QVERIFY(session->waitFor("Type yes or no: "));
+    session->type("no\n");
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(
+        session->output().endsWith(
+            "veyfm-vfs: sftp://alice@server.test/: the key of the host was not accepted\n"),
+        session->output().constData());
+    QVERIFY(!QFile::exists(mountDir(QString())));
+}
+
+void RealToolTest::wrongPasswords()
+{
+    trust(Sandbox::serverHost);
+    const auto session = onTerminal("mount sftp://alice@server.test/");
+    for (int i = 1; i <= 3; ++i) {
+        QVERIFY(session->waitFor("Password for alice on sftp://server.test: ", i));
+        session->type(keys(Sandbox::wrongPassword));
+    }
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(
+        session->output().endsWith(
+            "veyfm-vfs: sftp://alice@server.test/: three passwords were refused\n"),
+        session->output().constData());
+    QVERIFY(!QFile::exists(mountDir(QString())));
+}
+
+void RealToolTest::otherUser()
+{
+    trust(Sandbox::serverHost);
+    const auto session = onTerminal("mount sftp://server.test/~/name.txt");
+    QVERIFY(session->waitFor("User name for sftp://server.test [tester]: "));
+    session->type("bob\n");
+    QVERIFY(session->waitFor("Password for bob on sftp://server.test: "));
+    session->type(keys(Sandbox::wrongPassword));
+    QVERIFY(session->waitFor("Access denied\nPassword for bob on sftp://server.test: "));
+    session->type(keys(Sandbox::bob.password));
+    QCOMPARE(session->waitForEnd(), 0);
+    const QString name = mountDir(u"/sftp/bob@server.test~/name.txt"_s);
+    QVERIFY(session->output().endsWith(name.toLatin1() + '\n'));
+    QCOMPARE(fileContents(name), QByteArray("bob"));
+}
+
+void RealToolTest::cannotConnect_data()
+{
+    QTest::addColumn<QByteArray>("host");
+    QTest::newRow("nobody listens") << QByteArray(Sandbox::closedHost);
+    QTest::newRow("unknown host") << QByteArray("unknown.test");
+}
+
+void RealToolTest::cannotConnect()
+{
+    QFETCH(const QByteArray, host);
+    const auto session = onTerminal("mount sftp://alice@" + host + '/');
+    QCOMPARE(session->waitForEnd(), 1);
+    // Now and then ssh has ended before sshfs writes to it, and the job sees another failure.
+    const QByteArray line = "veyfm-vfs: sftp://alice@" + host + "/: ";
+    const QByteArray help = "look with 'ssh " + host + "' whether the host answers";
+    QVERIFY2(session->output().startsWith(line), session->output().constData());
+    QVERIFY2(session->output().contains(help), session->output().constData());
+    QCOMPARE(session->output().count('\n'), 1);
+    QVERIFY(!QFile::exists(mountDir(QString())));
+}
+
+void RealToolTest::morePromptsThanPasswords()
+{
+    // The question of this server is none that a job knows.
+    trust(Sandbox::otherHost);
+    const auto session = onTerminal("mount --timeout 2 sftp://alice@other.test/");
+    QCOMPARE(session->waitForEnd(), 1);
+    QCOMPARE(
+        session->output(),
+        QByteArray("veyfm-vfs: sftp://alice@other.test/: no progress within 2 s: sshfs may be "
+                   "waiting for more than a password; look with 'ssh other.test' whether the host "
+                   "answers and lets you in\n"));
+    QTRY_VERIFY(processesNamed("ssh").isEmpty());
+    QVERIFY(processesNamed("sshfs").isEmpty());
+    QVERIFY(!QFile::exists(mountDir(QString())));
+}
+
+void RealToolTest::interrupted()
+{
+    trust(Sandbox::serverHost);
+    const auto session = onTerminal("mount sftp://alice@server.test/");
+    QVERIFY(session->waitFor("Password for alice on sftp://server.test: "));
+    QVERIFY(!processesNamed("ssh").isEmpty());
+    session->type("\003");
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(
+        session->output().endsWith("veyfm-vfs: sftp://alice@server.test/: interrupted\n"),
+        session->output().constData());
+    QTRY_VERIFY(processesNamed("ssh").isEmpty());
+    QVERIFY(processesNamed("sshfs").isEmpty());
+    QVERIFY(!QFile::exists(mountDir(QString())));
+}
+
+void RealToolTest::fromDescriptor()
+{
+    trust(Sandbox::serverHost);
+    QProcess process;
+    process.setProcessEnvironment(m_service->environment());
+    process.start(
+        toolPath(), ToolScene::words("mount --password-fd 0 sftp://alice@server.test/~/name.txt"));
+    process.write(keys(Sandbox::alice.password));
+    process.closeWriteChannel();
+    QVERIFY(process.waitForFinished());
+    QCOMPARE(process.readAllStandardError(), QByteArray());
+    QCOMPARE(process.exitCode(), 0);
+    const QString name = QFile::decodeName(process.readAllStandardOutput()).trimmed();
+    QCOMPARE(fileContents(name), QByteArray("alice"));
+}
+
+void RealToolTest::sambaLogin()
+{
+    const ToolResult guest = m_service->run("mount smb://server.test/public");
+    QCOMPARE(guest.err, QByteArray());
+    QCOMPARE(guest.out, QByteArray("/net/smb/server.test/public\n"));
+
+    const auto session = onTerminal("mount smb://server.test/private/a");
+    QVERIFY(session->waitFor("User name for smb://server.test/private [tester]: "));
+    session->type("alice\n");
+    QVERIFY(session->waitFor("Password for alice on smb://server.test/private: "));
+    session->type(keys(Sandbox::wrongPassword));
+    QVERIFY(session->waitFor("Logon failure for server.test/private\n"));
+    QVERIFY(session->waitFor("User name for smb://server.test/private [alice]: "));
+    session->type("\n");
+    QVERIFY(session->waitFor("Password for alice on smb://server.test/private: ", 2));
+    session->type(keys(Sandbox::alice.password));
+    QCOMPARE(session->waitForEnd(), 0);
+    QVERIFY2(
+        session->output().endsWith("/net/smb/server.test/private/a\n"),
+        session->output().constData());
+    QVERIFY(!session->output().contains(Sandbox::alice.password));
+}
+
+int main(int argc, char** argv)
+{
+    Sandbox sandbox({"/usr/bin/sshfs", "/usr/bin/fusermount3", "/usr/bin/smbclient"});
+    sandbox.addServer(std::make_unique<SecretWatch>());
+    sandbox.addServer(std::make_unique<SshServer>(Sandbox::serverHost));
+    sandbox.addServer(
+        std::make_unique<SshServer>(Sandbox::otherHost, SshServer::KeyboardInteractive));
+    sandbox.addServer(std::make_unique<SmbServer>());
+    return sandbox.run([&] { return runSandboxTests<RealToolTest>(argc, argv); });
+}
+
+#include "tst_real_tool.moc"
