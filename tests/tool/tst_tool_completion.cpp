@@ -63,7 +63,7 @@ void ToolCompletionTest::verbs()
         complete({QString()}),
         QByteArrayList(
             {"list", "tree", "info", "monitor", "parent", "resolve", "storage", "bookmark",
-             "network", "mount", "notify", "status", "help"}));
+             "network", "mount", "mounts", "notify", "status", "help"}));
     QCOMPARE(
         complete({QStringLiteral("bookmark"), QString()}),
         QByteArrayList({"list", "add", "remove"}));
@@ -73,7 +73,7 @@ void ToolCompletionTest::verbs()
     QCOMPARE(complete({}), complete({QString()}));
     QCOMPARE(
         complete({QStringLiteral("help"), QStringLiteral("mo")}),
-        QByteArrayList({"monitor", "mount"}));
+        QByteArrayList({"monitor", "mount", "mounts"}));
     QCOMPARE(complete({QStringLiteral("--")}), QByteArrayList({"--help", "--version"}));
     QCOMPARE(complete({QStringLiteral("frobnicate"), QString()}), QByteArrayList());
 }

@@ -23,6 +23,7 @@ Verb infoVerb();
 Verb listVerb();
 Verb monitorVerb();
 Verb mountVerb();
+Verb mountsVerb();
 Verb networkVerb();
 Verb notifyVerb();
 Verb parentVerb();
