@@ -49,6 +49,7 @@ void ToolServiceTest::missingService_data()
     row("network workgroups", "");
     row("network hosts", "WG");
     row("network shares", "WG HOST");
+    row("network rescan", "WG");
     row("notify", "/tmp");
 }
 

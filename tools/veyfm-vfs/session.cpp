@@ -23,7 +23,6 @@ namespace Tool {
 
 namespace {
 
-constexpr int defaultTimeout = 10;
 constexpr uint longestTimeout = 1000000; // Seconds; a timer holds milliseconds in an int.
 
 QString waitingForService()
@@ -124,30 +123,37 @@ bool wasInterrupted()
     return serviceInterrupt().wasRequested();
 }
 
+int secondsToWait(const Invocation& invocation, int otherwise)
+{
+    const QString option = QStringLiteral("timeout");
+    return invocation.isSet(option)
+               ? int(std::min(invocation.value(option).toUInt(), longestTimeout))
+               : otherwise;
+}
+
+bool waitUntil(const QString& doing, int seconds, const std::function<bool()>& changed)
+{
+    if (wasInterrupted())
+        return false;
+    if (changed())
+        return true;
+    const Waiting waiting(doing);
+    QEventLoop loop;
+    QObject::connect(
+        QAbstractEventDispatcher::instance(), &QAbstractEventDispatcher::aboutToBlock, &loop, [&] {
+            if (changed())
+                loop.quit();
+        });
+    QTimer::singleShot(std::chrono::seconds(seconds), &loop, &QEventLoop::quit);
+    loop.exec();
+    return changed();
+}
+
 int waitForNews(
     const Invocation& invocation, const QString& what, const std::function<bool()>& changed)
 {
-    if (wasInterrupted())
-        return Failed;
-    const QString option = QStringLiteral("timeout");
-    const int seconds = invocation.isSet(option)
-                            ? int(std::min(invocation.value(option).toUInt(), longestTimeout))
-                            : defaultTimeout;
-    bool come = changed();
-    if (!come) {
-        const Waiting waiting(QStringLiteral("Waiting for the news of the change"));
-        QEventLoop loop;
-        QObject::connect(
-            QAbstractEventDispatcher::instance(), &QAbstractEventDispatcher::aboutToBlock, &loop,
-            [&] {
-                if (changed())
-                    loop.quit();
-            });
-        QTimer::singleShot(std::chrono::seconds(seconds), &loop, &QEventLoop::quit);
-        loop.exec();
-        come = changed();
-    }
-    if (come)
+    const int seconds = secondsToWait(invocation);
+    if (waitUntil(QStringLiteral("Waiting for the news of the change"), seconds, changed))
         return Done;
     if (!wasInterrupted()) {
         report(

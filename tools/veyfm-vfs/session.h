@@ -23,12 +23,18 @@ int runWithService(Invocation& invocation, int (*run)(Invocation& invocation));
 /// nothing: that it was interrupted is told for it.
 bool wasInterrupted();
 
+/// The value of --timeout, or what stands for it, in seconds.
+int secondsToWait(const Invocation& invocation, int otherwise = 10);
+
 /**
- * Waits until the service's news of a change have come and made @p changed true, at most for
- * --timeout or ten seconds. When none come, that is reported of @p what. An ExitCode.
+ * Waits until the service's news have come and made @p changed true, and shows what is done
+ * meanwhile. False when they did not come in so many seconds, or at all since Ctrl-C came.
  *
  * The condition is looked at after each batch of events, so it should be cheap.
  */
+bool waitUntil(const QString& doing, int seconds, const std::function<bool()>& changed);
+
+/// Waits for --timeout or ten seconds. When no news come, that is reported of @p what. An ExitCode.
 int waitForNews(
     const Invocation& invocation, const QString& what, const std::function<bool()>& changed);
 

@@ -6,6 +6,7 @@
 #include "commandline.h"
 #include "describe.h"
 #include "report.h"
+#include "scanjob.h"
 #include "service.h"
 #include "service/smbbrowserproxy.h"
 #include "session.h"
@@ -13,12 +14,16 @@
 #include "table.h"
 #include "vfs/vfs.h"
 
+#include <algorithm>
+
 namespace VeyFM {
 namespace Tool {
 
 namespace {
 
 const QLatin1Char slash('/');
+
+constexpr int defaultTimeout = 60; // Of a scan, in seconds.
 
 /// A level of the Samba network: names, and local paths where it has them.
 struct Level
@@ -86,15 +91,19 @@ Level shares(const QString& workgroup, const QString& host)
     return level;
 }
 
+int fail(const Invocation& invocation, const QString& why)
+{
+    const QStringList operands = invocation.operands();
+    report(operands.isEmpty() ? invocation.verb().name : operands.join(slash), why);
+    return Failed;
+}
+
 int print(Invocation& invocation, const Level& level)
 {
     if (wasInterrupted())
         return Failed;
-    const QStringList operands = invocation.operands();
-    if (!level.why.isEmpty()) {
-        report(operands.isEmpty() ? invocation.verb().name : operands.join(slash), level.why);
-        return Failed;
-    }
+    if (!level.why.isEmpty())
+        return fail(invocation, level.why);
     Output& output = invocation.output();
     JsonArray json(output);
     Table table;
@@ -118,20 +127,91 @@ int print(Invocation& invocation, const Level& level)
     return Done;
 }
 
+/// The level that the operands name.
+Level namedLevel(const Invocation& invocation)
+{
+    const Waiting waiting(QStringLiteral("Looking at the Samba network"));
+    const QStringList operands = invocation.operands();
+    if (operands.isEmpty())
+        return workgroups();
+    return operands.size() == 1 ? hosts(operands.at(0)) : shares(operands.at(0), operands.at(1));
+}
+
 int runBrowse(Invocation& invocation)
 {
-    const QStringList operands = invocation.operands();
-    Level level;
-    {
-        const Waiting waiting(QStringLiteral("Looking at the Samba network"));
-        if (operands.isEmpty())
-            level = workgroups();
-        else if (operands.size() == 1)
-            level = hosts(operands.at(0));
-        else
-            level = shares(operands.at(0), operands.at(1));
+    return print(invocation, namedLevel(invocation));
+}
+
+int printNews(Invocation& invocation, const Level& level, const ScanJob& job)
+{
+    Output& output = invocation.output();
+    JsonArray json(output);
+    Table table;
+    const auto add = [&](const QString& change, const QStringList& names) {
+        for (const QString& name : names) {
+            const QString path = level.path + slash + name;
+            if (invocation.json())
+                json.append(
+                    {{QStringLiteral("change"), change},
+                     {QStringLiteral("name"), name},
+                     {QStringLiteral("path"), path}});
+            else
+                table.add({change, path});
+        }
+    };
+    add(QStringLiteral("removed"), job.removed());
+    add(QStringLiteral("added"), job.added());
+    if (invocation.json())
+        json.end();
+    else
+        table.write(output);
+    return Done;
+}
+
+/// The place of a level; null where the tree has none.
+Entry placeOf(const QStringList& names)
+{
+    Entry place = VFS::ptr()->sambaNetworkEntry();
+    for (const QString& name : names) {
+        const EntryList children = VFS::ptr()->childs(place);
+        const QString path = place.path() + slash + name;
+        const auto found =
+            std::find_if(children.begin(), children.end(), [&path](const Entry& child) {
+                return child.path() == path;
+            });
+        if (found == children.end())
+            return Entry();
+        place = *found;
     }
-    return print(invocation, level);
+    return place;
+}
+
+int runRescan(Invocation& invocation)
+{
+    const Level level = namedLevel(invocation);
+    if (wasInterrupted())
+        return Failed;
+    if (!level.why.isEmpty())
+        return fail(invocation, level.why);
+    const Entry entry = placeOf(invocation.operands());
+    if (entry.isNull()) {
+        return fail(
+            invocation, QStringLiteral("there is no such place: is the network switched off?"));
+    }
+    bool ended = false;
+    ScanJob job(entry);
+    job.setDeleteOnFinish(false);
+    QObject::connect(&job, &Job::finished, &job, [&ended] { ended = true; });
+    job.start();
+    const int seconds = secondsToWait(invocation, defaultTimeout);
+    if (waitUntil(QStringLiteral("Scanning the Samba network"), seconds, [&] { return ended; }))
+        return printNews(invocation, level, job);
+    if (wasInterrupted())
+        return Failed;
+    return fail(
+        invocation,
+        QStringLiteral("asked for, but the service told of no end of the scan within %1 s")
+            .arg(seconds));
 }
 
 Verb browseVerb(const char* name, const char* operands, int count, const char* summary)
@@ -156,9 +236,20 @@ QVector<Verb> browseVerbs()
         browseVerb("shares", "WORKGROUP HOST", 2, "List the shares of a host in the Samba network");
     shares.details = QStringLiteral("One share a line: its name, and its directory while mounted.");
 
+    Verb rescan = browseVerb(
+        "rescan", "[WORKGROUP [HOST]]", 0, "Have the service look again at the Samba network");
+    rescan.details = QStringLiteral(
+        "Looks for workgroups, for the hosts of a workgroup, or for the shares of a host, and\n"
+        "prints what has been added and removed, one path a line.");
+    rescan.mostOperands = 2;
+    rescan.options = {timeoutOption()};
+    rescan.options[0].description =
+        QStringLiteral("Wait so long for the end of the scan (default: 60)");
+    rescan.run = runRescan;
+
     return {
         browseVerb("workgroups", "", 0, "List the workgroups of the Samba network"),
-        browseVerb("hosts", "WORKGROUP", 1, "List the hosts of a workgroup"), shares};
+        browseVerb("hosts", "WORKGROUP", 1, "List the hosts of a workgroup"), shares, rescan};
 }
 
 } // namespace Tool
