@@ -1,0 +1,86 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+// Any text to the tool's look at what is to be mounted, and what passes to the jobs' way of
+// reading it.
+
+#include "fuzzing.h"
+
+#include "core/smburl.h"
+#include "mounturl.h"
+
+#include <QDir>
+#include <QProcess>
+#include <QUrl>
+
+using Fuzzing::require;
+using VeyFM::SmbUrl;
+using namespace VeyFM::Tool;
+
+namespace {
+
+QString below(const QString& directory, const QString& path)
+{
+    return QDir::cleanPath(directory + QLatin1Char('/') + path);
+}
+
+bool isAtOrBelow(const QString& path, const QString& directory)
+{
+    return path == directory || path.startsWith(directory + QLatin1Char('/'));
+}
+
+void checkShare(const SmbUrl& url)
+{
+    const QString service = QStringLiteral("//%1/%2").arg(url.host(), url.share());
+    const QStringList words =
+        QProcess::splitCommand(QStringLiteral("smbclient %1 -k -c du").arg(service));
+    require(words.size() == 5 && words.at(1) == service, "a share is one argument");
+    const QString root = QStringLiteral("/network/%1/%2").arg(url.host(), url.share());
+    require(QDir::cleanPath(root) == root, "a share has a directory of its own");
+    require(isAtOrBelow(below(root, url.tailPath()), root), "a path stays in its share");
+}
+
+void checkFuse(const QUrl& url)
+{
+    const QString user = url.userName(QUrl::FullyDecoded);
+    const QString host = url.host(QUrl::FullyDecoded);
+    const QString account = user.isEmpty() ? host : user + QLatin1Char('@') + host;
+    require(url.isValid() && !host.isEmpty(), "there is a host");
+    require(url.password().isEmpty(), "there is no password");
+    require(url.port() == -1 && !url.hasQuery() && !url.hasFragment(), "nothing is dropped");
+    require(!account.startsWith(QLatin1Char('-')), "an account is no option");
+    require(!account.contains(QLatin1Char(':')), "an account ends at the colon behind it");
+    require(account.toLocal8Bit().size() < 255, "an account is short enough for a directory");
+    const QString root = QStringLiteral("/root/ftp/") + account;
+    require(QDir::cleanPath(root) == root, "an account is one directory");
+    require(
+        isAtOrBelow(below(root, url.path(QUrl::FullyDecoded)), root), "a path stays in its mount");
+    if (url.scheme() == QLatin1String("ftp"))
+        require(
+            !user.contains(QLatin1Char(',')) && !user.contains(QLatin1Char('\\')),
+            "a user is one mount option");
+}
+
+} // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
+{
+    const QString text = Fuzzing::text(data, size);
+    const QString shown = shownUrl(text);
+    require(shownUrl(shown) == shown, "what is shown has no password");
+
+    if (whyNoUser(QStringLiteral("smb"), text).isEmpty() && !text.isEmpty()) {
+        const QStringList words =
+            QProcess::splitCommand(QStringLiteral("smbclient //h/s -U %1 -c du").arg(text));
+        require(words.size() == 6 && words.at(3) == text, "a user is one argument");
+        require(!text.contains(QLatin1Char('%')), "a user has no password behind it");
+    }
+    if (!whyNotMountable(text).isEmpty())
+        return 0;
+    require(shown == text, "what is mounted has no password");
+    if (text.startsWith(QLatin1String("smb")))
+        checkShare(SmbUrl(text));
+    else
+        checkFuse(QUrl(text));
+    return 0;
+}
