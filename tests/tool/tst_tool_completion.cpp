@@ -63,7 +63,7 @@ void ToolCompletionTest::verbs()
         complete({QString()}),
         QByteArrayList(
             {"list", "tree", "info", "monitor", "parent", "resolve", "storage", "bookmark",
-             "network", "mount", "mounts", "notify", "status", "help"}));
+             "network", "mount", "mounts", "update", "notify", "status", "help"}));
     QCOMPARE(
         complete({QStringLiteral("bookmark"), QString()}),
         QByteArrayList({"list", "add", "remove"}));

@@ -50,6 +50,7 @@ void ToolServiceTest::missingService_data()
     row("network hosts", "WG");
     row("network shares", "WG HOST");
     row("network rescan", "WG");
+    row("update", "Samba");
     row("notify", "/tmp");
 }
 

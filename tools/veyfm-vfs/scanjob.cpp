@@ -30,8 +30,6 @@ QStringList ScanJob::removed() const
 void ScanJob::start()
 {
     const VFS* vfs = VFS::ptr();
-    // What was never read would be told as news from inside the request.
-    vfs->childs(m_entry);
     if (m_entry.isSambaNetworkPlace())
         followNetwork();
     else if (m_entry.isSambaWorkgroupPlace())

@@ -16,6 +16,8 @@ namespace Tool {
  * Has the service look again at what is below the Samba network, a workgroup or a host, and ends
  * with that. The library's own job ends on the news of any other entry of the kind, and at once
  * where it has read nothing yet.
+ *
+ * What is below the entry has to have been read before, so that all that is told is new.
  */
 class ScanJob : public Job
 {

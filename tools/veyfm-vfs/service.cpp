@@ -59,6 +59,12 @@ QString startService()
         .arg(serviceName(), reply.error().message());
 }
 
+QString whyNoRunningService()
+{
+    const QString why = whyNoService(serviceState());
+    return why.isEmpty() ? startService() : why;
+}
+
 QString whyNothing(const Question& question)
 {
     QDBusMessage message = QDBusMessage::createMethodCall(

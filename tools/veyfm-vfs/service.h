@@ -30,6 +30,9 @@ QString whyNoService(const ServiceState& state);
 /// Starts the service where it does not run. Why it did not work, or empty.
 QString startService();
 
+/// Both: why there is no service even after it was started, or empty.
+QString whyNoRunningService();
+
 /// A read of the service, as its introspection describes it.
 struct Question
 {

@@ -59,22 +59,24 @@ void openTree()
 
 int runWithTree(Invocation& invocation)
 {
-    {
-        // The verbs have interrupts of their own, one at a time.
-        Interrupt interrupt({SIGINT}, Failed, [] {});
-        interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
-        const Waiting waiting(waitingForService());
-        openTree();
-        if (interrupt.wasRequested()) {
-            interrupt.setWorkEnded();
-            report(invocation.verb().name, interrupted());
-            return Failed;
-        }
-    }
-    return invocation.verb().run(invocation);
+    return runInterruptibly(invocation, openTree) ? invocation.verb().run(invocation) : Failed;
 }
 
 } // namespace
+
+bool runInterruptibly(const Invocation& invocation, const std::function<void()>& work)
+{
+    // The verbs have interrupts of their own, one at a time.
+    Interrupt interrupt({SIGINT}, Failed, [] {});
+    interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
+    const Waiting waiting(waitingForService());
+    work();
+    if (!interrupt.wasRequested())
+        return true;
+    interrupt.setWorkEnded();
+    report(invocation.verb().name, interrupted());
+    return false;
+}
 
 int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))
 {

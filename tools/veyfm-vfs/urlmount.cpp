@@ -36,12 +36,6 @@ const QLatin1Char slash('/');
 
 constexpr int longestLook = 5; // Seconds.
 
-QString whyNoRunningService()
-{
-    const QString why = whyNoService(serviceState());
-    return why.isEmpty() ? startService() : why;
-}
-
 /// Runs the jobs of one command, which share the answers of the user and the watch.
 class JobRunner
 {
@@ -118,6 +112,7 @@ public:
         if (result.why.isEmpty() && m_runner.watch().wasInterrupted())
             result.why = m_runner.watch().whyStopped();
         if (!result.why.isEmpty()) {
+            result.wasInterrupted = m_runner.watch().wasInterrupted();
             cleanUp();
             return result;
         }
@@ -312,6 +307,7 @@ UrlMount mountSamba(const QString& url, const Login& login, int timeoutSeconds)
     result.why = runner.run<MountURLJob>(
         [&url] { return url; },
         [&result](const MountURLJob& job) { result.localPath = QDir::cleanPath(job.localPath()); });
+    result.wasInterrupted = runner.watch().wasInterrupted();
     return result;
 }
 

@@ -24,6 +24,7 @@ struct UrlMount
     State state = New;
     QString url; ///< With the user that was taken in the end.
     QString localPath;
+    bool wasInterrupted = false;
     QString placePath; ///< Empty where no place leads there.
 };
 

@@ -9,9 +9,9 @@ namespace Tool {
 const QVector<Verb>& verbs()
 {
     static const QVector<Verb> all = {
-        listVerb(),    treeVerb(),    infoVerb(),     monitorVerb(), parentVerb(),
-        resolveVerb(), storageVerb(), bookmarkVerb(), networkVerb(), mountVerb(),
-        mountsVerb(),  notifyVerb(),  statusVerb(),   helpVerb(),    completeVerb(),
+        listVerb(),    treeVerb(),     infoVerb(),    monitorVerb(),  parentVerb(), resolveVerb(),
+        storageVerb(), bookmarkVerb(), networkVerb(), mountVerb(),    mountsVerb(), updateVerb(),
+        notifyVerb(),  statusVerb(),   helpVerb(),    completeVerb(),
     };
     return all;
 }

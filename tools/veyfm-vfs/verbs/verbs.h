@@ -31,6 +31,7 @@ Verb resolveVerb();
 Verb statusVerb();
 Verb storageVerb();
 Verb treeVerb();
+Verb updateVerb();
 /// @}
 
 } // namespace Tool
