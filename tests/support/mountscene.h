@@ -121,7 +121,8 @@ public:
             return all;
         const QList<QByteArray> lines = file.readAll().split('\n');
         for (const QByteArray& line : lines) {
-            const QString path = QFile::decodeName(line.split(' ').value(4));
+            const QString path = QFile::decodeName(
+                line.split(' ').value(4).replace("\\040", " ").replace("\\134", "\\"));
             if (path.startsWith(directory() + QLatin1Char('/')))
                 all.append(path.mid(directory().size() + 1));
         }

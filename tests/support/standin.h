@@ -51,6 +51,14 @@ public:
     StandIn(const StandIn&) = delete;
     StandIn& operator=(const StandIn&) = delete;
 
+    /// Stands in for another tool too, which nobody expects to run.
+    void alsoStandFor(const QByteArray& tool)
+    {
+        QFile::link(
+            QStringLiteral(VEYFM_STANDIN_PROGRAM),
+            m_directory.filePath(QStringLiteral("bin/") + QString::fromLatin1(tool)));
+    }
+
     void expect(const QByteArrayList& lines)
     {
         QFile file(path(++m_expected, "play"));
@@ -68,6 +76,18 @@ public:
             ++run;
         }
         return run;
+    }
+
+    /// The runs of all tools that this object stands for, as "tool.run".
+    QStringList allRuns() const
+    {
+        QStringList all;
+        const QStringList files =
+            QDir(m_directory.path()).entryList({QStringLiteral("*.args")}, QDir::Files, QDir::Name);
+        for (const QString& file : files) {
+            all.append(file.chopped(5));
+        }
+        return all;
     }
 
     int expected() const

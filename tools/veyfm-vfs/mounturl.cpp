@@ -332,17 +332,20 @@ QString shownUrl(const QString& url)
 {
     static const QRegularExpression scheme(QStringLiteral("^[A-Za-z][A-Za-z0-9+.-]*://"));
     static const QRegularExpression port(QStringLiteral("^[0-9]*$"));
+    // An encoded colon ends a user as well, for curlftpfs.
+    static const QRegularExpression colon(QStringLiteral(":|%3[Aa]"));
     const int start = scheme.match(url).capturedLength();
     const int end = authorityEnd(url, start);
-    const int colon = url.left(end).indexOf(QLatin1Char(':'), start);
-    if (colon < 0)
+    const QRegularExpressionMatch match = colon.match(url.left(end), start);
+    if (!match.hasMatch())
         return url;
     int at = url.left(end).lastIndexOf(QLatin1Char('@'));
     // A password with a slash, which should be %2F, seems to end before its '@'. Behind a number,
     // which is a port, it is the path that has one.
-    if (at < start && !port.match(url.mid(colon + 1, end - colon - 1)).hasMatch())
+    const int behind = match.capturedEnd();
+    if (at < start && !port.match(url.mid(behind, end - behind)).hasMatch())
         at = url.lastIndexOf(QLatin1Char('@'));
-    return at > colon ? url.left(colon) + url.mid(at) : url;
+    return at >= behind ? url.left(match.capturedStart()) + url.mid(at) : url;
 }
 
 } // namespace Tool
