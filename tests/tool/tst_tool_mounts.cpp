@@ -4,8 +4,7 @@
 #include "mountinfo.h"
 #include "networkmounts.h"
 #include "support/makeentry.h"
-#include "support/terminalsession.h"
-#include "support/toolscene.h"
+#include "support/mountscene.h"
 
 #include <QTest>
 
@@ -91,6 +90,7 @@ private Q_SLOTS:
     void passesOverOthers();
     void placesInMounts();
     void unknownRegistry();
+    void realMounts();
 };
 
 void ToolMountsTest::lists()
@@ -300,6 +300,43 @@ void ToolMountsTest::unknownRegistry()
     QCOMPARE(
         lines(RegisteredMounts(), info),
         QStringList(QStringLiteral("ftp://a/|/root/mounts/ftp/a|mounted|")));
+}
+
+void ToolMountsTest::realMounts()
+{
+    const QString problem = keepMountsPrivate();
+    if (!problem.isEmpty())
+        QSKIP(qPrintable(problem));
+    MountScene alone("sshfs");
+    alone.tool.expect(Said::success());
+    QCOMPARE(alone.run("mount sftp://me@host/~/dir").exitCode, 0);
+    QCOMPARE(
+        alone.run("mounts").out,
+        "sftp://me@host/~/  " +
+            QFile::encodeName(alone.directory(QStringLiteral("sftp/me@host~"))) +
+            "  unregistered  -\n");
+
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene shared("sshfs", &service);
+    shared.tool.expect(Said::success());
+    QCOMPARE(shared.run("mount sftp://me@host/dir").exitCode, 0);
+    // The scripted service forgets what it is told.
+    const QString directory = shared.directory(QStringLiteral("sftp/me@host"));
+    const QString url = QStringLiteral("sftp://me@host/");
+    service.service().setValue(fuseMethod, QJsonObject{{url, directory}});
+    service.service().setValue(
+        networkMethod,
+        QJsonObject{{url, place("SFTP/me@host", QFile::encodeName(directory).constData())}});
+    const ToolResult mounted = shared.run("mounts");
+    QCOMPARE(mounted.err, QByteArray());
+    QCOMPARE(
+        mounted.out,
+        "sftp://me@host/  " + QFile::encodeName(directory) + "  mounted  SFTP/me@host\n");
+    QCOMPARE(::umount2(QFile::encodeName(directory).constData(), MNT_DETACH), 0);
+    QCOMPARE(
+        shared.run("mounts").out,
+        "sftp://me@host/  " + QFile::encodeName(directory) + "  stale  SFTP/me@host\n");
 }
 
 QTEST_GUILESS_MAIN(ToolMountsTest)
