@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "real/realmounttest.h"
+#include "real/realftptest.h"
 #include "real/smbserver.h"
 #include "real/sshserver.h"
 #include "support/terminalsession.h"
@@ -25,6 +25,8 @@ private Q_SLOTS:
     void interrupted();
     void fromDescriptor();
     void sambaLogin();
+    void ftpLogin();
+    void ftpInterrupted();
 
 private:
     std::unique_ptr<TerminalSession> onTerminal(const char* line) const
@@ -259,15 +261,50 @@ void RealToolTest::sambaLogin()
     QVERIFY(!session->output().contains(Sandbox::alice.password));
 }
 
+void RealToolTest::ftpLogin()
+{
+    const auto session = onTerminal("mount ftp://bob@server.test/papers");
+    QVERIFY(session->waitFor("Password for bob on ftp://server.test: "));
+    session->type(keys(Sandbox::wrongPassword));
+    QVERIFY(session->waitFor("Access denied\nPassword for bob on ftp://server.test: "));
+    session->type(keys(Sandbox::bob.password));
+    QCOMPARE(session->waitForEnd(), 0);
+    const QString papers = mountDir(u"/ftp/bob@server.test/papers"_s);
+    QVERIFY2(session->output().endsWith(papers.toLatin1() + '\n'), session->output().constData());
+    QVERIFY(!session->output().contains(Sandbox::bob.password));
+
+    const ToolResult list = m_service->run("list FTP/bob@server.test/papers");
+    QCOMPARE(list.out, QByteArray("draft.txt\n"));
+    const ToolResult mounts = m_service->run("mounts");
+    QCOMPARE(mounts.lines().size(), 1);
+    QVERIFY2(mounts.out.contains("mounted"), mounts.out.constData());
+}
+
+void RealToolTest::ftpInterrupted()
+{
+    const auto session = onTerminal("mount ftp://bob@server.test/");
+    QVERIFY(session->waitFor("Password for bob on ftp://server.test: "));
+    QVERIFY(!processesNamed("curlftpfs").isEmpty());
+    session->type("\003");
+    QCOMPARE(session->waitForEnd(), 1);
+    QTRY_VERIFY(processesNamed("curlftpfs").isEmpty());
+    QVERIFY(!QFile::exists(mountDir(QString())));
+}
+
 int main(int argc, char** argv)
 {
-    Sandbox sandbox({"/usr/bin/sshfs", "/usr/bin/fusermount3", "/usr/bin/smbclient"});
+    Sandbox sandbox(
+        {"/usr/bin/sshfs", "/usr/bin/fusermount3", "/usr/bin/smbclient", "/usr/bin/rclone"});
     sandbox.addServer(std::make_unique<SecretWatch>());
     sandbox.addServer(std::make_unique<SshServer>(Sandbox::serverHost));
     sandbox.addServer(
         std::make_unique<SshServer>(Sandbox::otherHost, SshServer::KeyboardInteractive));
     sandbox.addServer(std::make_unique<SmbServer>());
-    return sandbox.run([&] { return runSandboxTests<RealToolTest>(argc, argv); });
+    sandbox.addServer(std::make_unique<FtpServer>(Sandbox::serverHost));
+    return sandbox.run([&] {
+        useCurlftpfsAdapter();
+        return runSandboxTests<RealToolTest>(argc, argv);
+    });
 }
 
 #include "tst_real_tool.moc"
