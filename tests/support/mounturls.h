@@ -130,7 +130,9 @@ private:
         row("smb://host/share?x", "smbclient can't be told of a share with '?' in its name");
         row("smb://host/share#x", "smbclient can't be told of a share with '#' in its name");
         row("smb://host/50%", "smbclient can't be told of a share with '%' in its name");
-        row("smb://host/my%20share", "'%20' stands for itself in an smb URL: write the character");
+        row("smb://host/my%20share",
+            "smbclient can't be told of a share with white space in its name");
+        row("smb://host/my%2dshare", "'%2d' stands for itself in an smb URL: write the character");
         row("smb://host/share/%2e%2e",
             "'%2e' stands for itself in an smb URL: write the character");
         row("smb://host/-oshare", "the name of the share must not begin with a dash");

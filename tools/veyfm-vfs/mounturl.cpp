@@ -178,9 +178,16 @@ QString whyNotSmb(const QString& text, const QString& authority)
 {
     static const QRegularExpression escape(QStringLiteral("%[0-9A-Fa-f]{2}"));
     const QRegularExpressionMatch match = escape.match(text);
-    if (match.hasMatch())
-        return QStringLiteral("'%1' stands for itself in an smb URL: write the character")
-            .arg(match.captured());
+    if (match.hasMatch()) {
+        // Not every character would be taken.
+        const SmbUrl meant(QUrl::fromPercentEncoding(text.toUtf8()));
+        const QString why =
+            whyNoShare(meant.share(), HostAndPort(meant.host()).host, meant.workgroup());
+        return why.isEmpty()
+                   ? QStringLiteral("'%1' stands for itself in an smb URL: write the character")
+                         .arg(match.captured())
+                   : why;
+    }
     const QString scheme = QStringLiteral("smb");
     const SmbUrl url(text);
     const HostAndPort address(url.host());
