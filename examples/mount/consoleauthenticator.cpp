@@ -71,5 +71,11 @@ ConsoleAuthenticator::ask(const QString& server, const QString& user, bool wasRe
 
 bool ConsoleAuthenticator::confirm(const QString& text)
 {
-    return readLine(text + QLatin1Char(' ')) == QLatin1String("yes");
+    // It may hold what a server sent, and control characters steer terminals.
+    QString shown;
+    for (const QChar character : text) {
+        const bool isHarmless = character.isPrint() || character == QLatin1Char('\n');
+        shown += isHarmless ? character : QChar(QLatin1Char(' '));
+    }
+    return readLine(shown + QLatin1Char(' ')) == QLatin1String("yes");
 }
