@@ -166,9 +166,9 @@ void ToolMountTest::toolIsMissing_data()
                          << QByteArray("smbclient is not installed: install the package smbclient");
     QTest::newRow("ftp") << QStringLiteral("ftp://host/")
                          << QByteArray("curlftpfs is not installed: where there is no package of "
-                                       "it, as on Debian 12, install the adapter that libveyfmvfs "
-                                       "has under its CMake option VEYFM_INSTALL_CURLFTPFS_RCLONE "
-                                       "(see docs/mounting.md)");
+                                       "it, as on Debian 12, install the one that libveyfmvfs "
+                                       "ships, by its CMake option "
+                                       "VEYFM_INSTALL_CURLFTPFS_RCLONE");
 }
 
 void ToolMountTest::toolIsMissing()

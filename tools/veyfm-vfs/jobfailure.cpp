@@ -31,8 +31,8 @@ constexpr MountTool mountTools[] = {
     {"sftp", "sshfs", "install the package sshfs"},
     {"smb", "smbclient", "install the package smbclient"},
     {"ftp", "curlftpfs",
-     "where there is no package of it, as on Debian 12, install the adapter that libveyfmvfs has "
-     "under its CMake option VEYFM_INSTALL_CURLFTPFS_RCLONE (see docs/mounting.md)"},
+     "where there is no package of it, as on Debian 12, install the one that libveyfmvfs ships, by "
+     "its CMake option VEYFM_INSTALL_CURLFTPFS_RCLONE"},
 };
 
 bool isInstalled(const char* program)
