@@ -30,7 +30,8 @@ namespace {
 
 const QLatin1Char slash('/');
 
-constexpr std::chrono::seconds patience(5); // With fusermount3.
+constexpr std::chrono::seconds patience(5);  // With fusermount3.
+constexpr std::chrono::seconds shortLook(1); // A dead mount tells at once.
 
 QString mountRoot()
 {
@@ -71,6 +72,20 @@ int waitForChild(pid_t pid, std::chrono::milliseconds patience)
         return -1;
     }
     return ::waitpid(pid, &status, 0) == pid && WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+}
+
+/// A look at the file system of a directory: 0, the error, or -1 for one that does not answer.
+int errorOf(const QString& directory, std::chrono::seconds patience)
+{
+    const QByteArray path = QFile::encodeName(directory);
+    // Not here: a look that hangs can't be taken back, not even by the end of the process.
+    const pid_t pid = ::fork();
+    if (pid == 0) {
+        ::closefrom(STDIN_FILENO);
+        struct statfs info;
+        ::_exit(::statfs(path.constData(), &info) == 0 ? 0 : errno);
+    }
+    return pid < 0 ? errno : waitForChild(pid, patience);
 }
 
 /// Runs a program with its output thrown away, for at most five seconds. Whether it did well.
@@ -130,15 +145,7 @@ bool isOnFuseMount(const QString& path, const MountInfo& kernel)
 
 QString whyDead(const QString& directory, int seconds)
 {
-    const QByteArray path = QFile::encodeName(directory);
-    // Not here: a look that hangs can't be taken back, not even by the end of the process.
-    const pid_t pid = ::fork();
-    if (pid == 0) {
-        ::closefrom(STDIN_FILENO);
-        struct statfs info;
-        ::_exit(::statfs(path.constData(), &info) == 0 ? 0 : errno);
-    }
-    const int error = pid < 0 ? errno : waitForChild(pid, std::chrono::seconds(seconds));
+    const int error = errorOf(directory, std::chrono::seconds(seconds));
     if (error < 0)
         return QStringLiteral("it does not answer");
     return error == 0 ? QString() : systemReason(error);
@@ -152,17 +159,43 @@ FuseTrace::FuseTrace(const QString& scheme)
         if (!QDir(directory).exists())
             m_parents.append(directory);
     }
-    const QVector<KernelMount> mounts = MountInfo::read().mounts();
-    for (const KernelMount& mount : mounts)
-        m_mounts.append(mount.directory);
+    retake();
 }
 
-void FuseTrace::remove(const QStringList& directories) const
+void FuseTrace::retake()
 {
-    const MountInfo kernel = MountInfo::read();
+    const QVector<KernelMount> mounts = MountInfo::read().mounts();
+    const std::lock_guard<std::mutex> lock(m_lock);
+    m_mounts.clear();
+    for (const KernelMount& mount : mounts)
+        m_mounts.append(mount.id);
+}
+
+bool FuseTrace::isMadeHere(const QString& directory, Made made) const
+{
+    if (made == NoMounts)
+        return false;
+    const QString path = kernelDirectory(directory);
+    const KernelMount* top = nullptr;
+    const QVector<KernelMount> mounts = MountInfo::read().mounts();
+    for (const KernelMount& mount : mounts) {
+        if (mount.directory == path)
+            top = &mount;
+    }
+    if (!top || !top->isFuse())
+        return false;
+    {
+        const std::lock_guard<std::mutex> lock(m_lock);
+        if (m_mounts.contains(top->id))
+            return false;
+    }
+    return made == AllMounts || errorOf(directory, shortLook) == ENOTCONN;
+}
+
+void FuseTrace::remove(const QStringList& directories, Made made) const
+{
     for (const QString& directory : directories) {
-        const QString path = kernelDirectory(directory);
-        if (kernel.isMountPoint(path) && !m_mounts.contains(path))
+        if (isMadeHere(directory, made))
             unmount(directory);
         if (!m_names.contains(directory.mid(m_parent.size() + 1)))
             ::rmdir(QFile::encodeName(directory).constData());

@@ -7,6 +7,9 @@
 #include <QString>
 #include <QStringList>
 #include <QUrl>
+#include <QVector>
+
+#include <mutex>
 
 namespace VeyFM {
 namespace Tool {
@@ -25,22 +28,36 @@ QString whyDead(const QString& directory, int seconds);
 
 /**
  * What a run may have left behind below the root of the mounts: directories that it made, and
- * mounts. What was there when the object was made is never touched.
+ * mounts. What was there when the object was made is never touched, nor is a mount that no tool
+ * makes. From any thread.
  */
 class FuseTrace
 {
 public:
+    /// Which of the new mounts are those of this run. Other programs mount there, too.
+    enum Made {
+        NoMounts,
+        DeadMounts, ///< Those of tools that were ended.
+        AllMounts,
+    };
+
     /// For URLs of one scheme.
     explicit FuseTrace(const QString& scheme);
 
-    /// Unmounts and removes those of the directories that are new. From any thread.
-    void remove(const QStringList& directories) const;
+    /// What is mounted by now was not mounted by this run.
+    void retake();
+
+    /// Unmounts and removes those of the directories that are new.
+    void remove(const QStringList& directories, Made made) const;
 
 private:
+    bool isMadeHere(const QString& directory, Made made) const;
+
     const QString m_parent;
     QStringList m_parents; ///< Those that were not there.
     QStringList m_names;
-    QStringList m_mounts;
+    mutable std::mutex m_lock; ///< For what follows.
+    QVector<int> m_mounts;     ///< The numbers of the kernel for them.
 };
 
 } // namespace Tool

@@ -67,7 +67,7 @@ MountInfo::MountInfo(const QByteArray& text)
             continue;
         m_mounts.append(
             {unescaped(fields.at(4)), unescaped(fields.at(separator + 1)),
-             unescaped(fields.at(separator + 2))});
+             unescaped(fields.at(separator + 2)), fields.at(0).toInt()});
     }
 }
 

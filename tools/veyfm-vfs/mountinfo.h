@@ -17,6 +17,7 @@ struct KernelMount
     QString directory; ///< Absolute, and without links.
     QString type;      ///< The file system, such as "ext4" or "fuse.sshfs".
     QString source;    ///< What the program that mounted it says, such as "user@host:/".
+    int id = 0;        ///< No other mount has it as long as this one stands.
 
     bool isFuse() const;
 };

@@ -8,6 +8,7 @@
 #include "jobfailure.h"
 #include "jobs/mountfuseentryjob.h"
 #include "jobs/mounturljob.h"
+#include "mountauthenticator.h"
 #include "mountinfo.h"
 #include "mounturl.h"
 #include "report.h"
@@ -26,6 +27,7 @@
 #include <QUrl>
 
 #include <algorithm>
+#include <atomic>
 
 namespace VeyFM {
 namespace Tool {
@@ -43,7 +45,7 @@ public:
     JobRunner(const QString& scheme, const QString& shown, const Login& login, int timeoutSeconds)
         : m_scheme(scheme)
         , m_doing(QStringLiteral("Mounting ") + shown)
-        , m_authenticator(QSharedPointer<TerminalAuthenticator>::create(login))
+        , m_authenticator(QSharedPointer<MountAuthenticator>::create(login))
         , m_watch(m_authenticator, timeoutSeconds)
     {
     }
@@ -56,6 +58,8 @@ public:
         while (true) {
             MadeJob job(m_authenticator, url());
             const JobResult result = m_watch.run(job, m_doing);
+            m_wasStopped =
+                result.end == JobResult::TimedOut || result.end == JobResult::Interrupted;
             if (result.isOk()) {
                 take(job);
                 return QString();
@@ -65,9 +69,18 @@ public:
         }
     }
 
-    const TerminalAuthenticator& authenticator() const
+    MountAuthenticator& authenticator()
     {
         return *m_authenticator;
+    }
+    const MountAuthenticator& authenticator() const
+    {
+        return *m_authenticator;
+    }
+    /// Whether the last job did not come to its own end.
+    bool wasStopped() const
+    {
+        return m_wasStopped;
     }
     JobWatch& watch()
     {
@@ -77,8 +90,9 @@ public:
 private:
     const QString m_scheme;
     const QString m_doing;
-    const QSharedPointer<TerminalAuthenticator> m_authenticator;
+    const QSharedPointer<MountAuthenticator> m_authenticator;
     JobWatch m_watch;
+    bool m_wasStopped = false;
 };
 
 /// Mounts a URL of the schemes ftp and sftp: its root, once for all URLs of the host.
@@ -94,7 +108,12 @@ public:
         , m_trace(url.scheme())
         , m_runner(url.scheme(), m_shown, login, timeoutSeconds)
     {
-        m_runner.watch().setCutOff(m_shown, [this] { m_trace.remove(directories()); });
+        // The tool has mounted nothing before it got its answer.
+        m_runner.authenticator().setAskedHandler([this] { m_trace.retake(); });
+        // A job is cut off in a call to the service, when its tool has done well.
+        m_runner.watch().setCutOff(m_shown, [this] {
+            m_trace.remove(directories(), m_hasRunJob ? FuseTrace::AllMounts : FuseTrace::NoMounts);
+        });
     }
 
     UrlMount mount()
@@ -185,6 +204,7 @@ private:
     template <typename MadeJob>
     QString runJob()
     {
+        m_hasRunJob = true;
         const auto url = [this] {
             takeUser();
             return rootUrl();
@@ -252,7 +272,12 @@ private:
 
     void cleanUp()
     {
-        m_trace.remove(directories());
+        FuseTrace::Made made = FuseTrace::NoMounts;
+        if (m_runner.authenticator().hasMounted())
+            made = FuseTrace::AllMounts;
+        else if (m_runner.wasStopped())
+            made = FuseTrace::DeadMounts;
+        m_trace.remove(directories(), made);
         if (wasThere() || !m_whyAlone.isEmpty() || !m_runner.authenticator().wasAccepted())
             return;
         // Without waiting: that it is silent may be the reason.
@@ -280,11 +305,12 @@ private:
     QUrl m_url; ///< With the user that was taken in the end.
     const QString m_shown;
     const MountInfo m_before;
-    const FuseTrace m_trace;
+    FuseTrace m_trace;
     QString m_whyAlone;          ///< Why other programs don't see what is mounted, or empty.
     QString m_directory;         ///< That of the root.
     bool m_isRegistered = false; ///< Whether the service takes the directory for a mount.
     bool m_hasPlace = false;
+    std::atomic<bool> m_hasRunJob{false};
     JobRunner m_runner; ///< Ends first, with the thread that cleans up.
 };
 

@@ -1,0 +1,166 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#include "support/mountscene.h"
+
+#include <fcntl.h>
+
+namespace {
+
+constexpr int patience = 30000;
+
+/// What another program mounts while "mount" runs.
+class OtherMount
+{
+public:
+    OtherMount(const char* type, const QString& directory)
+    {
+        const QByteArray path = QFile::encodeName(directory);
+        QByteArray options;
+        if (type == QByteArray("fuse")) {
+            m_device = ::open("/dev/fuse", O_RDWR | O_CLOEXEC);
+            options = "rootmode=40000,user_id=0,group_id=0,fd=" + QByteArray::number(m_device);
+        }
+        m_stands = ::mount("other", path.constData(), type, 0, options.constData()) == 0;
+    }
+    ~OtherMount()
+    {
+        if (m_device >= 0)
+            ::close(m_device);
+    }
+    OtherMount(const OtherMount&) = delete;
+    OtherMount& operator=(const OtherMount&) = delete;
+
+    bool stands() const
+    {
+        return m_stands;
+    }
+
+private:
+    int m_device = -1; ///< As long as it is open the mount is not dead, though nobody answers.
+    bool m_stands = false;
+};
+
+} // namespace
+
+/// When "mount" fails, the mounts of others stay, and those of its own tools go.
+class ToolMountOthersTest : public QObject
+{
+    Q_OBJECT
+
+private Q_SLOTS:
+    void initTestCase();
+    void duringQuestion_data();
+    void duringQuestion();
+    void duringQuestionOfRefusedMount();
+    void besideFailingTool();
+    void besideHungTool();
+    void ofKilledTool();
+};
+
+void ToolMountOthersTest::initTestCase()
+{
+    const QString problem = keepMountsPrivate();
+    if (!problem.isEmpty())
+        QSKIP(qPrintable(problem));
+}
+
+void ToolMountOthersTest::duringQuestion_data()
+{
+    QTest::addColumn<QByteArray>("type");
+    QTest::addColumn<QByteArray>("key");
+    QTest::addColumn<QByteArray>("why");
+    QTest::newRow("fuse, given up")
+        << QByteArray("fuse") << QByteArray("\004") << QByteArray("cancelled");
+    QTest::newRow("tmpfs, given up")
+        << QByteArray("tmpfs") << QByteArray("\004") << QByteArray("cancelled");
+    QTest::newRow("fuse, interrupted")
+        << QByteArray("fuse") << QByteArray("\003") << QByteArray("interrupted");
+    QTest::newRow("tmpfs, interrupted")
+        << QByteArray("tmpfs") << QByteArray("\003") << QByteArray("interrupted");
+}
+
+void ToolMountOthersTest::duringQuestion()
+{
+    QFETCH(const QByteArray, type);
+    QFETCH(const QByteArray, key);
+    QFETCH(const QByteArray, why);
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::sshPassword() + Said::sshRefusal());
+    const auto session = scene.onTerminal("mount sftp://me@host/");
+    QVERIFY(session->waitFor("Password for me on sftp://host: "));
+    {
+        const OtherMount other(type.constData(), scene.directory(QStringLiteral("sftp/me@host")));
+        QVERIFY(other.stands());
+    }
+    session->type(key);
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(session->output().contains(why), session->output().constData());
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
+}
+
+void ToolMountOthersTest::duringQuestionOfRefusedMount()
+{
+    // The tool is answered, and mounts on top of it.
+    ToolScene service;
+    QVERIFY(service.isReady());
+    service.service().load({{QStringLiteral("echo"), false}});
+    MountScene scene("sshfs", &service);
+    scene.tool.expect(Said::sshPassword() + Said::success());
+    const auto session = scene.onTerminal("mount --timeout 1 sftp://me@host/");
+    QVERIFY(session->waitFor("Password for me on sftp://host: "));
+    const OtherMount other("tmpfs", scene.directory(QStringLiteral("sftp/me@host")));
+    QVERIFY(other.stands());
+    session->type("geheim\n");
+    QCOMPARE(session->waitForEnd(), 1);
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
+    // A dead mount would not tell.
+    QVERIFY(QFile::exists(scene.directory(QStringLiteral("sftp/me@host"))));
+}
+
+void ToolMountOthersTest::besideFailingTool()
+{
+    // Two at once, and the other was faster.
+    MountScene scene("sshfs");
+    scene.tool.expect({"hang"});
+    QProcess process;
+    process.setProcessEnvironment(scene.environment());
+    process.start(toolPath(), MountScene::words("mount sftp://me@host/"));
+    QTRY_VERIFY_WITH_TIMEOUT(scene.tool.processId(1) > 0, patience);
+    {
+        const OtherMount other("fuse", scene.directory(QStringLiteral("sftp/me@host")));
+        QVERIFY(other.stands());
+    }
+    ::kill(pid_t(scene.tool.processId(1)), SIGKILL);
+    QVERIFY(process.waitForFinished(patience));
+    QCOMPARE(process.exitCode(), 1);
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
+}
+
+void ToolMountOthersTest::besideHungTool()
+{
+    MountScene scene("sshfs");
+    scene.tool.expect({"hang"});
+    QProcess process;
+    process.setProcessEnvironment(scene.environment());
+    process.start(toolPath(), MountScene::words("mount --timeout 2 sftp://me@host/"));
+    QTRY_VERIFY_WITH_TIMEOUT(scene.tool.processId(1) > 0, patience);
+    const OtherMount other("fuse", scene.directory(QStringLiteral("sftp/me@host")));
+    QVERIFY(other.stands());
+    QVERIFY(process.waitForFinished(patience));
+    QCOMPARE(process.exitCode(), 1);
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
+}
+
+void ToolMountOthersTest::ofKilledTool()
+{
+    MountScene scene("sshfs");
+    scene.tool.expect({"block 15", "mount", "hang"});
+    const ToolResult result = scene.run("mount --timeout 1 sftp://me@host/");
+    QCOMPARE(result.exitCode, 1);
+    QVERIFY2(result.err.contains("no progress within 1 s"), result.err.constData());
+    QVERIFY(scene.isClean());
+}
+
+QTEST_GUILESS_MAIN(ToolMountOthersTest)
+#include "tst_tool_mount_others.moc"
