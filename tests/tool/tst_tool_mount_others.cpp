@@ -41,9 +41,40 @@ private:
     bool m_stands = false;
 };
 
+/// A process that a shell starts before it becomes the program.
+class OlderSibling
+{
+public:
+    ~OlderSibling()
+    {
+        if (id() > 0)
+            ::kill(id(), SIGKILL);
+    }
+
+    /// For a shell: $0 is the program.
+    QStringList shellArguments(const char* line) const
+    {
+        const QString script =
+            QStringLiteral("sleep 90 </dev/null >/dev/null 2>&1 & echo $! > \"$1\"; "
+                           "exec \"$0\" %1");
+        return {
+            QStringLiteral("-c"), script.arg(QLatin1String(line)), toolPath(),
+            m_directory.filePath(QStringLiteral("pid"))};
+    }
+
+    pid_t id() const
+    {
+        QFile file(m_directory.filePath(QStringLiteral("pid")));
+        return file.open(QIODevice::ReadOnly) ? file.readAll().trimmed().toInt() : 0;
+    }
+
+private:
+    QTemporaryDir m_directory;
+};
+
 } // namespace
 
-/// When "mount" fails, the mounts of others stay, and those of its own tools go.
+/// When "mount" fails, the mounts and processes of others stay, and those of its own tools go.
 class ToolMountOthersTest : public QObject
 {
     Q_OBJECT
@@ -56,6 +87,8 @@ private Q_SLOTS:
     void besideFailingTool();
     void besideHungTool();
     void ofKilledTool();
+    void processStays();
+    void processIsNoTool();
 };
 
 void ToolMountOthersTest::initTestCase()
@@ -160,6 +193,39 @@ void ToolMountOthersTest::ofKilledTool()
     QCOMPARE(result.exitCode, 1);
     QVERIFY2(result.err.contains("no progress within 1 s"), result.err.constData());
     QVERIFY(scene.isClean());
+}
+
+void ToolMountOthersTest::processStays()
+{
+    const OlderSibling sibling;
+    MountScene scene("sshfs");
+    scene.tool.expect({"hang"});
+    const ToolResult result = runProgram(
+        QStringLiteral("/bin/sh"), sibling.shellArguments("mount --timeout 1 sftp://me@host/"),
+        QString(), scene.environment());
+    QCOMPARE(result.exitCode, 1);
+    QVERIFY2(result.err.contains("no progress within 1 s"), result.err.constData());
+    QVERIFY(!MountScene::isRunning(scene.tool.processId(1)));
+    QVERIFY(MountScene::isRunning(sibling.id()));
+}
+
+void ToolMountOthersTest::processIsNoTool()
+{
+    // The question that is thrown away shows by no tool running.
+    const OlderSibling sibling;
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::sshPassword() + Said::sshRefusal());
+    scene.tool.expect(Said::sshPassword() + Said::success());
+    TerminalSession session(
+        QStringLiteral("/bin/sh"), sibling.shellArguments("mount sftp://me@host/"),
+        QDir::rootPath(), scene.environment(), 200);
+    QVERIFY(session.waitFor("Password for me on sftp://host: "));
+    session.type("wrong\n");
+    QVERIFY(session.waitFor("Access denied\nPassword for me on sftp://host: "));
+    session.type("right\n");
+    QCOMPARE(session.waitForEnd(), 0);
+    QCOMPARE(session.output().count("Password for"), 2);
+    QCOMPARE(scene.tool.input(2), QByteArray("right\n"));
 }
 
 QTEST_GUILESS_MAIN(ToolMountOthersTest)

@@ -7,10 +7,13 @@
 #include <QDir>
 #include <QFile>
 
+#include <algorithm>
+#include <cerrno>
 #include <vector>
 
 #include <signal.h>
 #include <sys/syscall.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 namespace VeyFM {
@@ -20,35 +23,53 @@ namespace {
 
 constexpr std::chrono::seconds patience(1);
 
-/// The parent of a process that runs, or 0.
-pid_t parentOf(const QString& pid)
+struct Process
 {
-    QFile file(QStringLiteral("/proc/%1/stat").arg(pid));
-    if (!file.open(QIODevice::ReadOnly))
-        return 0;
-    // "PID (NAME) STATE PPID ...", where the name may hold anything.
-    const QByteArray line = file.readAll();
-    const QList<QByteArray> fields = line.mid(line.lastIndexOf(')') + 2).split(' ');
-    const bool runs = fields.size() > 1 && fields.at(0) != "Z" && fields.at(0) != "X";
-    return runs ? pid_t(fields.at(1).toInt()) : 0;
+    pid_t pid = 0;
+    pid_t parent = 0;
+    QByteArray begin; ///< When it began. Another that gets the number later began later.
+
+    bool operator==(const Process& other) const
+    {
+        return pid == other.pid && begin == other.begin;
+    }
+};
+
+// Written before there is a second thread.
+std::vector<Process> inherited;
+
+/// All processes that run.
+std::vector<Process> runningProcesses()
+{
+    std::vector<Process> all;
+    const QStringList names = QDir(QStringLiteral("/proc")).entryList(QDir::Dirs);
+    for (const QString& name : names) {
+        bool isNumber = false;
+        const pid_t pid = name.toInt(&isNumber);
+        QFile file(QStringLiteral("/proc/%1/stat").arg(name));
+        if (!isNumber || !file.open(QIODevice::ReadOnly))
+            continue;
+        // "PID (NAME) STATE PPID ... BEGIN ...", where the name may hold anything.
+        const QByteArray line = file.readAll();
+        const QList<QByteArray> fields = line.mid(line.lastIndexOf(')') + 2).split(' ');
+        if (fields.size() > 19 && fields.at(0) != "Z" && fields.at(0) != "X")
+            all.push_back({pid, pid_t(fields.at(1).toInt()), fields.at(19)});
+    }
+    return all;
 }
 
 /// Below this process, parents first.
 std::vector<pid_t> runningDescendants()
 {
-    std::multimap<pid_t, pid_t> children;
-    const QStringList names = QDir(QStringLiteral("/proc")).entryList(QDir::Dirs);
-    for (const QString& name : names) {
-        bool isNumber = false;
-        const pid_t pid = name.toInt(&isNumber);
-        if (isNumber)
-            children.emplace(parentOf(name), pid);
-    }
+    const std::vector<Process> all = runningProcesses();
     std::vector<pid_t> found;
     const auto addChildrenOf = [&](pid_t parent) {
-        const auto range = children.equal_range(parent);
-        for (auto it = range.first; it != range.second; ++it)
-            found.push_back(it->second);
+        for (const Process& process : all) {
+            const bool isOurs =
+                std::find(inherited.begin(), inherited.end(), process) == inherited.end();
+            if (process.parent == parent && isOurs)
+                found.push_back(process.pid);
+        }
     };
     addChildrenOf(::getpid());
     for (size_t i = 0; i < found.size(); ++i)
@@ -68,6 +89,19 @@ bool sendSignal(int handle, int number)
 }
 
 } // namespace
+
+void leaveInheritedChildren()
+{
+    siginfo_t child;
+    const bool hasNone =
+        ::waitid(P_ALL, 0, &child, WEXITED | WNOHANG | WNOWAIT) != 0 && errno == ECHILD;
+    if (hasNone)
+        return;
+    for (const Process& process : runningProcesses()) {
+        if (process.parent == ::getpid())
+            inherited.push_back(process);
+    }
+}
 
 bool hasRunningDescendants()
 {

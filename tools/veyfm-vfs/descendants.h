@@ -12,6 +12,12 @@
 namespace VeyFM {
 namespace Tool {
 
+/**
+ * To be called first in the program. Children stay with a process that runs another program, so
+ * it may begin with some that it has not started. They and theirs are left alone in what follows.
+ */
+void leaveInheritedChildren();
+
 /// Whether a process runs that this one has started, or that such a one has.
 bool hasRunningDescendants();
 

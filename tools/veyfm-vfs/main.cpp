@@ -2,12 +2,14 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "commandline.h"
+#include "descendants.h"
 #include "report.h"
 
 #include <QCoreApplication>
 
 int main(int argc, char* argv[])
 {
+    VeyFM::Tool::leaveInheritedChildren();
     VeyFM::Tool::installLogging();
     QCoreApplication application(argc, argv);
     QCoreApplication::setApplicationName(QStringLiteral("veyfm-vfs"));
