@@ -23,6 +23,7 @@ private Q_SLOTS:
     void withoutService();
     void newMount_data();
     void newMount();
+    void linkedDirectory();
     void toolMountsNothing();
     void toolFails();
     void toolIsMissing_data();
@@ -116,6 +117,27 @@ void ToolMountTest::newMount()
             .startsWith(placeRegister + QStringLiteral("[\"%1\",[\"%2\"").arg(rootUrl, place)),
         qPrintable(calls.filter(placeRegister).at(0)));
     QCOMPARE(scene.mounts(), QStringList(directory));
+}
+
+void ToolMountTest::linkedDirectory()
+{
+    // As on a disk with more room.
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    QVERIFY(QDir().mkpath(scene.directory(QStringLiteral("elsewhere"))));
+    QVERIFY(QFile::link(
+        scene.directory(QStringLiteral("elsewhere")), scene.directory(QStringLiteral("sftp"))));
+    scene.tool.expect(Said::success());
+    const ToolResult result = scene.run("mount sftp://me@host/");
+    QCOMPARE(result.err, QByteArray());
+    QCOMPARE(result.out, scene.line(QStringLiteral("sftp/me@host")));
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("elsewhere/me@host")));
+
+    service.service().load({{QStringLiteral("echo"), false}});
+    scene.tool.expect(Said::success());
+    QCOMPARE(scene.run("mount --timeout 1 sftp://you@host/").exitCode, 1);
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("elsewhere/me@host")));
 }
 
 void ToolMountTest::toolMountsNothing()

@@ -129,9 +129,16 @@ void ToolMountInfoTest::kernelPaths()
     QCOMPARE(
         kernelPath(root + QStringLiteral("/sftp//host/"), root),
         real + QStringLiteral("/sftp/host"));
-    // No link is followed below the root: it may lead to a server that has gone.
+    QVERIFY(QDir(top).mkpath(QStringLiteral("other")));
+    QVERIFY(QFile::link(top + QStringLiteral("/other"), real + QStringLiteral("/ftp")));
+    QCOMPARE(
+        kernelPath(root + QStringLiteral("/ftp/host"), root), top + QStringLiteral("/other/host"));
+    // The last link is not followed: it may lead to a server that has gone.
     QVERIFY(QFile::link(QStringLiteral("/usr"), real + QStringLiteral("/usr")));
     QCOMPARE(kernelPath(root + QStringLiteral("/usr"), root), real + QStringLiteral("/usr"));
+    QVERIFY(QFile::link(QStringLiteral("/usr"), top + QStringLiteral("/other/usr")));
+    QCOMPARE(
+        kernelPath(root + QStringLiteral("/ftp/usr"), root), top + QStringLiteral("/other/usr"));
     QCOMPARE(kernelPath(root + QStringLiteral("2/x"), root), root + QStringLiteral("2/x"));
     QCOMPARE(kernelPath(root + QStringLiteral("/../x/"), root), top + QStringLiteral("/link/x"));
     QCOMPARE(

@@ -91,10 +91,16 @@ bool MountInfo::isMountPoint(const QString& directory) const
 QString kernelPath(const QString& directory, const QString& root)
 {
     const QString path = QDir::cleanPath(directory);
-    const QString canonicalRoot = QFileInfo(root).canonicalFilePath();
-    if (canonicalRoot.isEmpty() || !(path + slash).startsWith(root + slash))
+    if (!(path + slash).startsWith(root + slash))
         return path;
-    return canonicalRoot + path.mid(root.size());
+    const int schemeEnd = path.indexOf(slash, root.size() + 1);
+    for (const int end : {schemeEnd, root.size()}) {
+        const QString canonical =
+            end < 0 ? QString() : QFileInfo(path.left(end)).canonicalFilePath();
+        if (!canonical.isEmpty())
+            return canonical + path.mid(end);
+    }
+    return path;
 }
 
 } // namespace Tool

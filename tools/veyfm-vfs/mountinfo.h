@@ -53,8 +53,9 @@ private:
 };
 
 /**
- * The directory as the kernel names it: without links from the top down to @p root, where it lies
- * below that, and tidied up. Nothing below @p root is looked at.
+ * The directory as the kernel names it: tidied up and, where it lies below @p root, without links
+ * from the top down to the directory of its scheme. Nothing below that is looked at, since it may
+ * be a mount.
  */
 QString kernelPath(const QString& directory, const QString& root);
 
