@@ -25,7 +25,10 @@ private Q_SLOTS:
     void interrupted();
     void fromDescriptor();
     void sambaLogin();
+    void sambaMissing_data();
+    void sambaMissing();
     void ftpLogin();
+    void ftpMissing();
     void ftpInterrupted();
 
 private:
@@ -46,6 +49,12 @@ private:
     static QString mountDir(const QString& relative)
     {
         return QDir::homePath() + u"/.vey-fm-vfs"_s + relative;
+    }
+
+    /// Where the service would show the Samba network.
+    static QString sambaDir(const QString& relative)
+    {
+        return QDir::homePath() + u"/net"_s + relative;
     }
 
     static QStringList mountDirs()
@@ -76,7 +85,7 @@ void RealToolTest::init()
     SKIP_WITHOUT_SANDBOX();
     m_service = std::make_unique<ToolScene>(QJsonObject{
         {u"remember"_s, true},
-        {u"values"_s, QJsonObject{{u"SmbBrowser.smbNetworkLocalPath"_s, u"/net/smb"_s}}}});
+        {u"values"_s, QJsonObject{{u"SmbBrowser.smbNetworkLocalPath"_s, sambaDir(QString())}}}});
     QVERIFY(m_service->isReady());
     QFile::remove(QDir::homePath() + u"/.ssh/known_hosts"_s);
 }
@@ -121,6 +130,16 @@ void RealToolTest::firstContact()
     const ToolResult again = m_service->run("mount sftp://alice@server.test/~");
     QCOMPARE(again.err, QByteArray());
     QCOMPARE(again.out, mountDir(u"/sftp/alice@server.test~\n"_s).toLatin1());
+    QCOMPARE(mountDirs().size(), 1);
+
+    const ToolResult missing = m_service->run("mount sftp://alice@server.test/~/missing");
+    QCOMPARE(missing.exitCode, 1);
+    QCOMPARE(missing.out, QByteArray());
+    QCOMPARE(
+        missing.err,
+        "veyfm-vfs: sftp://alice@server.test/~/missing: it is mounted, but the server has no such "
+        "file or directory: " +
+            mountDir(u"/sftp/alice@server.test~/missing\n"_s).toLatin1());
     QCOMPARE(mountDirs().size(), 1);
 }
 
@@ -240,9 +259,11 @@ void RealToolTest::fromDescriptor()
 
 void RealToolTest::sambaLogin()
 {
+    QVERIFY(QDir().mkpath(sambaDir(u"/server.test/public"_s)));
+    QVERIFY(QDir().mkpath(sambaDir(u"/server.test/private/a"_s)));
     const ToolResult guest = m_service->run("mount smb://server.test/public");
     QCOMPARE(guest.err, QByteArray());
-    QCOMPARE(guest.out, QByteArray("/net/smb/server.test/public\n"));
+    QCOMPARE(guest.out, sambaDir(u"/server.test/public\n"_s).toLatin1());
 
     const auto session = onTerminal("mount smb://server.test/private/a");
     QVERIFY(session->waitFor("User name for smb://server.test/private [tester]: "));
@@ -256,9 +277,43 @@ void RealToolTest::sambaLogin()
     session->type(keys(Sandbox::alice.password));
     QCOMPARE(session->waitForEnd(), 0);
     QVERIFY2(
-        session->output().endsWith("/net/smb/server.test/private/a\n"),
+        session->output().endsWith(sambaDir(u"/server.test/private/a\n"_s).toLatin1()),
         session->output().constData());
     QVERIFY(!session->output().contains(Sandbox::alice.password));
+}
+
+void RealToolTest::sambaMissing_data()
+{
+    QTest::addColumn<QByteArray>("host");
+    QTest::addColumn<QByteArray>("url");
+    QTest::newRow("share") << QByteArray("server.test") << QByteArray("smb://server.test/missing");
+    QTest::newRow("nobody listens") << QByteArray(Sandbox::closedHost)
+                                    << QByteArray("smb://") + Sandbox::closedHost + "/public";
+    QTest::newRow("unknown host") << QByteArray("unknown.test")
+                                  << QByteArray("smb://unknown.test/public");
+}
+
+void RealToolTest::sambaMissing()
+{
+    QFETCH(const QByteArray, host);
+    QFETCH(const QByteArray, url);
+    const ToolResult result = m_service->run("mount " + url);
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(result.out, QByteArray());
+    QVERIFY2(result.err.contains(": there is nothing at "), result.err.constData());
+    QVERIFY2(result.err.contains("'smbclient -L " + host + '\''), result.err.constData());
+}
+
+void RealToolTest::ftpMissing()
+{
+    const auto session = onTerminal("mount ftp://bob@server.test/missing");
+    QVERIFY(session->waitFor("Password for bob on ftp://server.test: "));
+    session->type(keys(Sandbox::bob.password));
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(
+        session->output().contains(": it is mounted, but the server has no such file or directory"),
+        session->output().constData());
+    QCOMPARE(mountDirs(), QStringList(mountDir(u"/ftp/bob@server.test"_s)));
 }
 
 void RealToolTest::ftpLogin()

@@ -25,10 +25,10 @@ QString failure(const char* call)
         QLatin1String(call), QString::fromLocal8Bit(std::strerror(errno)));
 }
 
-fuse_attr directoryAttributes()
+fuse_attr directoryAttributes(quint64 node)
 {
     fuse_attr attributes = {};
-    attributes.ino = FUSE_ROOT_ID;
+    attributes.ino = node;
     attributes.mode = S_IFDIR | 0755;
     attributes.nlink = 2;
     return attributes;
@@ -109,6 +109,17 @@ void SlowDirectory::answer(quint64 id, int error, const void* data, size_t size)
         return;
 }
 
+void SlowDirectory::answerLookup(quint64 id, const char* name)
+{
+    fuse_entry_out reply = {};
+    reply.nodeid = FUSE_ROOT_ID + 1;
+    reply.attr = directoryAttributes(reply.nodeid);
+    if (std::strcmp(name, "a") == 0)
+        answer(id, 0, &reply, sizeof reply);
+    else
+        answer(id, ENOENT, nullptr, 0);
+}
+
 void SlowDirectory::answerNames(quint64 id, quint64 offset, size_t size)
 {
     QByteArray records;
@@ -152,7 +163,7 @@ void SlowDirectory::serve()
         }
         case FUSE_GETATTR: {
             fuse_attr_out reply = {};
-            reply.attr = directoryAttributes();
+            reply.attr = directoryAttributes(header->nodeid);
             answer(header->unique, 0, &reply, sizeof reply);
             break;
         }
@@ -187,7 +198,7 @@ void SlowDirectory::serve()
         case FUSE_INTERRUPT:
             break; // No answer is due.
         case FUSE_LOOKUP:
-            answer(header->unique, ENOENT, nullptr, 0);
+            answerLookup(header->unique, reinterpret_cast<const char*>(header + 1));
             break;
         default:
             answer(header->unique, ENOSYS, nullptr, 0);

@@ -10,9 +10,9 @@
 #include <thread>
 
 /**
- * A directory that takes for ever to list: a file system of its own, served by a thread of the
- * test. It is mounted in a mount namespace that only this process and its children see, which
- * takes root and /dev/fuse.
+ * A directory that takes for ever to list and has another, "a", that it does not list: a file
+ * system of its own, served by a thread of the test. It is mounted in a mount namespace that only
+ * this process and its children see, which takes root and /dev/fuse.
  */
 class SlowDirectory
 {
@@ -40,6 +40,7 @@ private:
     bool mount();
     void serve();
     void answer(quint64 id, int error, const void* data, size_t size);
+    void answerLookup(quint64 id, const char* name);
     void answerNames(quint64 id, quint64 offset, size_t size);
 
     const Kind m_kind;

@@ -231,8 +231,10 @@ void ToolMountTest::toolCannotRun()
 
 void ToolMountTest::samba()
 {
-    ToolScene service(
-        scriptOf(QStringLiteral("SmbBrowser.smbNetworkLocalPath"), QStringLiteral("/net/smb")));
+    QTemporaryDir network;
+    const QString share = network.filePath(QStringLiteral("host/share"));
+    QVERIFY(QDir().mkpath(share + QStringLiteral("/a")));
+    ToolScene service(scriptOf(QStringLiteral("SmbBrowser.smbNetworkLocalPath"), network.path()));
     QVERIFY(service.isReady());
     MountScene scene("smbclient", &service);
     scene.tool.expect({"out Total number of bytes: 1\\n"});
@@ -240,13 +242,22 @@ void ToolMountTest::samba()
     QCOMPARE(result.err, QByteArray());
     QCOMPARE(result.exitCode, 0);
     const QJsonObject object = result.json().at(0).toObject();
-    QVERIFY(object.value(QStringLiteral("localPath"))
-                .toString()
-                .startsWith(QStringLiteral("/net/smb/")));
-    QVERIFY(
-        object.value(QStringLiteral("localPath")).toString().endsWith(QStringLiteral("/share/a")));
+    QCOMPARE(object.value(QStringLiteral("localPath")).toString(), share + QStringLiteral("/a"));
     QVERIFY(object.value(QStringLiteral("path")).isNull());
     QCOMPARE(object.value(QStringLiteral("alreadyMounted")), QJsonValue(true));
+
+    // What smbclient does not find counts as access.
+    scene.tool.expect({"out tree connect failed: NT_STATUS_BAD_NETWORK_NAME\\n", "exit 1"});
+    const ToolResult missing = scene.run("mount smb://host/missing");
+    QCOMPARE(missing.exitCode, 1);
+    QCOMPARE(missing.out, QByteArray());
+    QCOMPARE(
+        missing.err,
+        failure(
+            "smb://host/missing",
+            "there is nothing at " +
+                network.filePath(QStringLiteral("host/missing")).toLocal8Bit() +
+                ": look with 'smbclient -L host' whether the host answers and has that share"));
 }
 
 void ToolMountTest::sambaWithoutService()

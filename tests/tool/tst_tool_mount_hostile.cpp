@@ -219,8 +219,9 @@ void ToolMountHostileTest::samba()
     QFETCH(const QString, url);
     QFETCH(const QString, service);
     QFETCH(const QString, path);
-    ToolScene scripted(
-        scriptOf(QStringLiteral("SmbBrowser.smbNetworkLocalPath"), QStringLiteral("/smb")));
+    QTemporaryDir network;
+    QVERIFY(QDir(network.path()).mkpath(path));
+    ToolScene scripted(scriptOf(QStringLiteral("SmbBrowser.smbNetworkLocalPath"), network.path()));
     QVERIFY(scripted.isReady());
     MountScene scene("smbclient", &scripted);
     standForAll(scene);
@@ -231,7 +232,7 @@ void ToolMountHostileTest::samba()
         scene.environment());
     QCOMPARE(result.err, QByteArray());
     QCOMPARE(result.exitCode, 0);
-    QCOMPARE(result.out, "/smb/" + path.toUtf8() + '\n');
+    QCOMPARE(result.out, network.filePath(path).toUtf8() + '\n');
     QCOMPARE(scene.tool.arguments(1), QByteArrayList({service.toUtf8(), "-k", "-c", "du"}));
     QCOMPARE(scene.tool.arguments(2), QByteArrayList({service.toUtf8(), "-U", "%", "-c", "du"}));
     QCOMPARE(
@@ -242,8 +243,9 @@ void ToolMountHostileTest::samba()
 
 void ToolMountHostileTest::sambaUser()
 {
-    ToolScene scripted(
-        scriptOf(QStringLiteral("SmbBrowser.smbNetworkLocalPath"), QStringLiteral("/smb")));
+    QTemporaryDir network;
+    QVERIFY(QDir(network.path()).mkpath(QStringLiteral("host/share")));
+    ToolScene scripted(scriptOf(QStringLiteral("SmbBrowser.smbNetworkLocalPath"), network.path()));
     QVERIFY(scripted.isReady());
     MountScene scene("smbclient", &scripted);
     scene.tool.expect({"exit 1"});

@@ -21,6 +21,7 @@ private Q_SLOTS:
     void mountedAlready();
     void mountedUnknownToService();
     void mountedWithoutService();
+    void pathIsMissing();
     void deadMount();
     void silentMount();
     void staleRegistration();
@@ -97,6 +98,23 @@ void ToolMountPresentTest::mountedWithoutService()
     QCOMPARE(result.exitCode, 0);
     QCOMPARE(result.out, scene.line(QStringLiteral("sftp/me@host/a")));
     QCOMPARE(scene.tool.runs(), 0);
+}
+
+void ToolMountPresentTest::pathIsMissing()
+{
+    MountScene scene("sshfs");
+    const QString directory = scene.directory(QStringLiteral("sftp/me@host"));
+    QVERIFY(QDir().mkpath(directory));
+    const SlowDirectory mounted(SlowDirectory::Endless, directory);
+    const ToolResult result = scene.run("mount --json sftp://me@host/b/c");
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(result.out, QByteArray());
+    QCOMPARE(
+        result.err,
+        failure(
+            "sftp://me@host/b/c", "it is mounted, but the server has no such file or directory: " +
+                                      QFile::encodeName(directory) + "/b/c"));
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
 }
 
 void ToolMountPresentTest::deadMount()

@@ -74,10 +74,10 @@ int waitForChild(pid_t pid, std::chrono::milliseconds patience)
     return ::waitpid(pid, &status, 0) == pid && WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
-/// A look at the file system of a directory: 0, the error, or -1 for one that does not answer.
-int errorOf(const QString& directory, std::chrono::seconds patience)
+/// A look at the file system of a path: 0, the error, or -1 for one that does not answer.
+int errorOf(const QString& place, std::chrono::seconds patience)
 {
-    const QByteArray path = QFile::encodeName(directory);
+    const QByteArray path = QFile::encodeName(place);
     // Not here: a look that hangs can't be taken back, not even by the end of the process.
     const pid_t pid = ::fork();
     if (pid == 0) {
@@ -149,6 +149,12 @@ QString whyDead(const QString& directory, int seconds)
     if (error < 0)
         return QStringLiteral("it does not answer");
     return error == 0 ? QString() : systemReason(error);
+}
+
+bool isMissing(const QString& path, int seconds)
+{
+    const int error = errorOf(path, std::chrono::seconds(seconds));
+    return error == ENOENT || error == ENOTDIR;
 }
 
 FuseTrace::FuseTrace(const QString& scheme)

@@ -26,6 +26,9 @@ bool isOnFuseMount(const QString& path, const MountInfo& kernel);
 /// up after so many seconds.
 QString whyDead(const QString& directory, int seconds);
 
+/// Whether it is certain that there is nothing at a path. Given up after so many seconds.
+bool isMissing(const QString& path, int seconds);
+
 /**
  * What a run may have left behind below the root of the mounts: directories that it made, and
  * mounts. What was there when the object was made is never touched, nor is a mount that no tool

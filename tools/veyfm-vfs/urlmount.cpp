@@ -4,6 +4,7 @@
 #include "urlmount.h"
 
 #include "core/mountpaths.h"
+#include "core/smburl.h"
 #include "fusedirectory.h"
 #include "jobfailure.h"
 #include "jobs/mountfuseentryjob.h"
@@ -36,7 +37,11 @@ namespace {
 
 const QLatin1Char slash('/');
 
-constexpr int longestLook = 5; // Seconds.
+int lookSeconds(int timeoutSeconds)
+{
+    constexpr int longest = 5;
+    return timeoutSeconds == 0 ? longest : std::min(timeoutSeconds, longest);
+}
 
 /// Runs the jobs of one command, which share the answers of the user and the watch.
 class JobRunner
@@ -100,7 +105,7 @@ class FuseMounter
 {
 public:
     FuseMounter(const QUrl& url, const Login& login, int timeoutSeconds)
-        : m_patience(timeoutSeconds == 0 ? longestLook : std::min(timeoutSeconds, longestLook))
+        : m_patience(lookSeconds(timeoutSeconds))
         , m_firstUrl(url)
         , m_url(url)
         , m_shown(shownUrl(url.toString()))
@@ -337,16 +342,38 @@ UrlMount mountSamba(const QString& url, const Login& login, int timeoutSeconds)
     return result;
 }
 
-} // namespace
-
-UrlMount mountUrl(const QString& url, const Login& login, int timeoutSeconds)
+UrlMount mountFuse(const QString& url, const Login& login, int timeoutSeconds)
 {
-    if (schemeOf(url) == QLatin1String("smb"))
-        return mountSamba(url, login, timeoutSeconds);
     QUrl parsed(url);
     if (!login.user.isEmpty())
         parsed.setUserName(login.user, QUrl::DecodedMode);
     return FuseMounter(parsed, login, timeoutSeconds).mount();
+}
+
+/// Why a local path that a job came to is of no use, or empty. The jobs don't look.
+QString whyMissing(const UrlMount& mount, int timeoutSeconds)
+{
+    const Waiting waiting(QStringLiteral("Looking at the mount"));
+    if (!isMissing(mount.localPath, lookSeconds(timeoutSeconds)))
+        return QString();
+    // smbclient that fails to find something counts as one that was let in.
+    if (mount.state == UrlMount::Reached)
+        return QStringLiteral("there is nothing at %1: look with 'smbclient -L %2' whether the "
+                              "host answers and has that share")
+            .arg(mount.localPath, SmbUrl(mount.url).host());
+    return QStringLiteral("it is mounted, but the server has no such file or directory: %1")
+        .arg(mount.localPath);
+}
+
+} // namespace
+
+UrlMount mountUrl(const QString& url, const Login& login, int timeoutSeconds)
+{
+    UrlMount mount = schemeOf(url) == QLatin1String("smb") ? mountSamba(url, login, timeoutSeconds)
+                                                           : mountFuse(url, login, timeoutSeconds);
+    if (mount.why.isEmpty())
+        mount.why = whyMissing(mount, timeoutSeconds);
+    return mount;
 }
 
 } // namespace Tool

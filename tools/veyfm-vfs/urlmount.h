@@ -20,7 +20,7 @@ struct UrlMount
         Reached  ///< A Samba URL, for which nothing is mounted.
     };
 
-    QString why; ///< Why there is none, with what helps; empty for success.
+    QString why; ///< Why there is no local path, with what helps; empty for success.
     State state = New;
     QString url; ///< With the user that was taken in the end.
     QString localPath;
@@ -31,7 +31,8 @@ struct UrlMount
 /**
  * Mounts a URL that whyNotMountable() has nothing against, and shows on the terminal what takes
  * its time. An ftp or sftp URL is mounted with the service, so that all programs of the session
- * have it, or without. Where it fails or is interrupted nothing stays behind.
+ * have it, or without. Where it fails or is interrupted nothing stays behind. A path that is not
+ * there is a failure, too, but the mount of the root stands then.
  */
 UrlMount mountUrl(const QString& url, const Login& login, int timeoutSeconds);
 
