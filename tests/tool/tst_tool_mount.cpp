@@ -2,9 +2,6 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "support/mountscene.h"
-#include "support/outsidegroup.h"
-
-#include <grp.h>
 
 namespace {
 
@@ -37,8 +34,6 @@ private Q_SLOTS:
     void usage_data();
     void usage();
     void networkSwitchedOff();
-    void outsideTheGroup();
-    void hungToolOfUser();
 };
 
 void ToolMountTest::initTestCase()
@@ -368,37 +363,6 @@ void ToolMountTest::networkSwitchedOff()
         failure(
             "sftp://me@host/",
             "other programs don't see this mount: the network is switched off in the settings"));
-}
-
-void ToolMountTest::outsideTheGroup()
-{
-    const OutsideGroup outside;
-    ToolScene service;
-    QVERIFY(service.isReady());
-    MountScene scene("sshfs", &service);
-    const ToolResult result = scene.run("mount sftp://me@host/");
-    const QByteArray group = ::getgrnam("fuse") ? "" : "sudo groupadd --system fuse && ";
-    QCOMPARE(result.exitCode, 1);
-    QCOMPARE(
-        result.err,
-        failure(
-            "sftp://me@host/", "only members of the group 'fuse' can do that: run '" + group +
-                                   "sudo usermod -aG fuse nobody', then log in again"));
-    QCOMPARE(scene.tool.runs(), 0);
-    QVERIFY(scene.isClean());
-}
-
-void ToolMountTest::hungToolOfUser()
-{
-    // A process that leaves no core file is closed to others of its user, but not to itself.
-    const OutsideGroup outside;
-    MountScene scene("sshfs");
-    scene.tool.expect({"hang"});
-    const ToolResult result = scene.run("mount --timeout 1 sftp://me@host/");
-    QCOMPARE(result.exitCode, 1);
-    QVERIFY2(result.err.contains("no progress within 1 s"), result.err.constData());
-    QVERIFY(!MountScene::isRunning(scene.tool.processId(1)));
-    QVERIFY(scene.isClean());
 }
 
 QTEST_GUILESS_MAIN(ToolMountTest)
