@@ -3,6 +3,8 @@
 
 #include "descendants.h"
 
+#include "pidfd.h"
+
 #include <QByteArray>
 #include <QDir>
 #include <QFile>
@@ -12,7 +14,6 @@
 #include <vector>
 
 #include <signal.h>
-#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -77,17 +78,6 @@ std::vector<pid_t> runningDescendants()
     return found;
 }
 
-// By number: glibc 2.36 declares pidfd_open() without C linkage.
-int openHandle(pid_t pid)
-{
-    return int(::syscall(SYS_pidfd_open, pid, 0));
-}
-
-bool sendSignal(int handle, int number)
-{
-    return ::syscall(SYS_pidfd_send_signal, handle, number, nullptr, 0) == 0;
-}
-
 } // namespace
 
 void leaveInheritedChildren()
@@ -116,7 +106,7 @@ Descendants::~Descendants()
 
 void Descendants::add(pid_t pid)
 {
-    const int handle = openHandle(pid);
+    const int handle = openPidfd(pid);
     if (handle >= 0)
         m_seen.insert({pid, {handle, Clock::time_point()}});
 }

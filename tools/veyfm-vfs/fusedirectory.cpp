@@ -4,6 +4,7 @@
 #include "fusedirectory.h"
 
 #include "mountinfo.h"
+#include "pidfd.h"
 #include "report.h"
 #include "vfs/vfs.h"
 #include "vfs/vfssettings.h"
@@ -19,7 +20,6 @@
 #include <signal.h>
 #include <spawn.h>
 #include <sys/statfs.h>
-#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -59,7 +59,7 @@ QStringList namesIn(const QString& directory)
 /// Waits for the end of a child, and ends it when it takes too long. Its exit code, or -1.
 int waitForChild(pid_t pid, std::chrono::milliseconds patience)
 {
-    const int handle = int(::syscall(SYS_pidfd_open, pid, 0));
+    const int handle = openPidfd(pid);
     pollfd poll = {handle, POLLIN, 0};
     const bool ended = ::poll(&poll, 1, int(patience.count())) == 1;
     if (handle >= 0)
