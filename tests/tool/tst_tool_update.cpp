@@ -107,6 +107,7 @@ private Q_SLOTS:
     void severalEntries();
     void passwordsOfSeveralEntries();
     void interrupted();
+    void questionBehindHungTool();
     void interruptedScan();
     void stuckService();
 };
@@ -571,6 +572,25 @@ void ToolUpdateTest::interrupted()
     QCOMPARE(scene.tool.runs(), 1);
     QVERIFY(scene.isClean());
     QTRY_VERIFY(!MountScene::isRunning(scene.tool.processId(1)));
+}
+
+void ToolUpdateTest::questionBehindHungTool()
+{
+    ToolScene service(known());
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    scene.tool.expect({"hang"});
+    scene.tool.expect(Said::sshPassword() + Said::success());
+    const auto session = scene.onTerminal("update --timeout 1 Network/work Network/home");
+    QVERIFY(session->waitFor("Password for me on sftp://host: "));
+    QVERIFY(session->output().contains("veyfm-vfs: Network/work: no progress within 1 s"));
+    // A person who takes longer than the program may take to part.
+    QTest::qWait(2500);
+    session->type("geheim\n");
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(
+        session->output().endsWith(scene.line(QStringLiteral("sftp/me@host~"))),
+        session->output().constData());
 }
 
 void ToolUpdateTest::interruptedScan()

@@ -9,6 +9,7 @@
 #include "service.h"
 #include "spinner.h"
 #include "vfs/vfs.h"
+#include "watchedjob.h"
 
 #include <QAbstractEventDispatcher>
 #include <QCoreApplication>
@@ -62,6 +63,19 @@ int runWithTree(Invocation& invocation)
     return runInterruptibly(invocation, openTree) ? invocation.verb().run(invocation) : Failed;
 }
 
+int runWithNeeds(Invocation& invocation)
+{
+    switch (invocation.verb().needs) {
+    case Needs::Tree:
+        return runWithTree(invocation);
+    case Needs::Service:
+        return runWithService(invocation, invocation.verb().run);
+    case Needs::Nothing:
+        break;
+    }
+    return invocation.verb().run(invocation);
+}
+
 } // namespace
 
 bool runInterruptibly(const Invocation& invocation, const std::function<void()>& work)
@@ -109,15 +123,9 @@ int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))
 
 int runVerb(Invocation& invocation)
 {
-    switch (invocation.verb().needs) {
-    case Needs::Tree:
-        return runWithTree(invocation);
-    case Needs::Service:
-        return runWithService(invocation, invocation.verb().run);
-    case Needs::Nothing:
-        break;
-    }
-    return invocation.verb().run(invocation);
+    const int exitCode = runWithNeeds(invocation);
+    boundParting();
+    return exitCode;
 }
 
 bool wasInterrupted()

@@ -37,6 +37,8 @@ constexpr char endByte = 'e';
 // All that the handler touches.
 volatile int handlerDescriptor = -1;
 
+std::atomic<bool> hadToStop{false};
+
 void sendByte(int descriptor, char byte)
 {
     if (::write(descriptor, &byte, 1) < 0) {
@@ -93,6 +95,17 @@ int jobTimeout(const Invocation& invocation)
                : defaultTimeout;
 }
 
+void boundParting()
+{
+    if (!hadToStop)
+        return;
+    // A service that hangs keeps a process at its very end too.
+    std::thread([] {
+        std::this_thread::sleep_for(parting);
+        ::_exit(Failed);
+    }).detach();
+}
+
 JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int timeoutSeconds)
     : m_authenticator(std::move(authenticator))
     , m_timeoutSeconds(timeoutSeconds)
@@ -125,13 +138,6 @@ JobWatch::~JobWatch()
     handlerDescriptor = -1;
     ::close(m_pipe[0]);
     ::close(m_pipe[1]);
-    if (!m_hadToStop)
-        return;
-    // A service that hangs keeps a process at its very end too.
-    std::thread([] {
-        std::this_thread::sleep_for(parting);
-        ::_exit(Failed);
-    }).detach();
 }
 
 void JobWatch::setCutOff(const QString& what, const std::function<void()>& cleanUp)
@@ -275,7 +281,7 @@ void JobWatch::watch()
 /// False when the object ends.
 bool JobWatch::stop()
 {
-    m_hadToStop = true;
+    hadToStop = true;
     const Clock::time_point last = Clock::now() + grace;
     Descendants tools;
     while (true) {

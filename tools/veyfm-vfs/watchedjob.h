@@ -53,6 +53,10 @@ Option jobTimeoutOption();
 /// Its value in seconds; 0 for no bound.
 int jobTimeout(const Invocation& invocation);
 
+/// To be called when the verb has ended. Where a job had to be stopped, what the program still does
+/// may take two seconds more, and is cut off then.
+void boundParting();
+
 /**
  * Runs the jobs of a verb, one after the other, and sees to it that each comes to an end: jobs
  * may by their contract stay unfinished for ever, and some block their thread.
@@ -64,9 +68,6 @@ int jobTimeout(const Invocation& invocation);
  * program exits. As long as the object lives signals end only jobs, so a verb can clean up behind
  * them. A second signal has its default effect. Signals that are ignored when the object is made
  * stay ignored.
- *
- * When a job had to be stopped, what the program does behind the end of the object may take two
- * seconds more, and is cut off then.
  *
  * The signals are not blocked, and programs that are started meanwhile don't have them blocked.
  * One object at a time, and none beside an Interrupt.
@@ -118,7 +119,6 @@ private:
     int m_handledCount = 0;
     std::atomic<bool> m_interrupted{false};
     std::atomic<bool> m_timedOut{false};
-    std::atomic<bool> m_hadToStop{false};
 
     std::mutex m_lock; ///< For what follows.
     bool m_running = false;
