@@ -54,6 +54,9 @@ private Q_SLOTS:
     void interruptedService();
     void stoppedService_data();
     void stoppedService();
+    void serviceNeverAnswers_data();
+    void serviceNeverAnswers();
+    void interruptedWhereServiceNeverAnswers();
     void ignoredSignal();
     void toolsHaveNoSignalsBlocked_data();
     void toolsHaveNoSignalsBlocked();
@@ -323,6 +326,58 @@ void ToolMountWatchTest::stoppedService()
     service.service().resume();
     QVERIFY2(session->output().contains("no progress within 1 s"), session->output().constData());
     QVERIFY(scene.isClean());
+}
+
+void ToolMountWatchTest::serviceNeverAnswers_data()
+{
+    QTest::addColumn<QByteArray>("url");
+    for (const char* url : {"sftp://me@host/", "ftp://host/", "smb://host/share"})
+        QTest::newRow(url) << QByteArray(url);
+}
+
+void ToolMountWatchTest::serviceNeverAnswers()
+{
+    QFETCH(const QByteArray, url);
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    service.service().stop();
+    QElapsedTimer timer;
+    timer.start();
+    const ToolResult result = scene.run("mount --timeout 1 --no-input " + url);
+    // Each of several calls gives up after 25 seconds.
+    const qint64 elapsed = timer.elapsed();
+    service.service().resume();
+    QVERIFY(elapsed < 20000);
+    QCOMPARE(
+        result.err,
+        failure(url, "no progress within 1 s: the file manager service does not answer"));
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(scene.tool.runs(), 0);
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountWatchTest::interruptedWhereServiceNeverAnswers()
+{
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    service.service().stop();
+    QProcessEnvironment environment = scene.environment();
+    environment.insert(QStringLiteral("TERM"), QStringLiteral("xterm"));
+    TerminalSession session(
+        toolPath(), MountScene::words("mount --timeout 0 sftp://me@host/"), QDir::rootPath(),
+        environment);
+    QVERIFY(session.waitFor(" Waiting for the file manager service ("));
+    QElapsedTimer timer;
+    timer.start();
+    session.type("\003");
+    QCOMPARE(session.waitForEnd(), 1);
+    QVERIFY(timer.elapsed() < 5000);
+    service.service().resume();
+    QVERIFY2(
+        session.output().endsWith("\r\033[Kveyfm-vfs: sftp://me@host/: interrupted\n"),
+        session.output().constData());
 }
 
 void ToolMountWatchTest::ignoredSignal()

@@ -110,6 +110,8 @@ private Q_SLOTS:
     void questionBehindHungTool();
     void interruptedScan();
     void stuckService();
+    void stuckServiceTakesItsTime();
+    void stoppedService();
 };
 
 void ToolUpdateTest::initTestCase()
@@ -620,8 +622,35 @@ void ToolUpdateTest::stuckService()
     session.type("\003");
     QCOMPARE(session.waitForEnd(), 1);
     QVERIFY2(
-        session.output().endsWith("\r\033[Kveyfm-vfs: update: interrupted\n"),
+        session.output().endsWith("\r\033[Kveyfm-vfs: Samba/WG: interrupted\n"),
         session.output().constData());
+}
+
+void ToolUpdateTest::stuckServiceTakesItsTime()
+{
+    ToolScene service(known());
+    QVERIFY(service.isReady());
+    service.service().setRules(
+        QStringLiteral("SmbBrowser.workgroups"), {QJsonObject{{QStringLiteral("silent"), true}}});
+    const ToolResult result = service.run("update --timeout 1 Samba/WG");
+    QCOMPARE(
+        result.err, QByteArray("veyfm-vfs: Samba/WG: no progress within 1 s: the file manager "
+                               "service does not answer\n"));
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(result.out, QByteArray());
+}
+
+void ToolUpdateTest::stoppedService()
+{
+    ToolScene service(known());
+    QVERIFY(service.isReady());
+    service.service().stop();
+    const ToolResult result = service.run("update --timeout 1 Network/work");
+    service.service().resume();
+    QCOMPARE(
+        result.err, QByteArray("veyfm-vfs: update: no progress within 1 s: the file manager "
+                               "service does not answer\n"));
+    QCOMPARE(result.exitCode, 1);
 }
 
 QTEST_GUILESS_MAIN(ToolUpdateTest)

@@ -26,11 +26,6 @@ namespace {
 
 constexpr uint longestTimeout = 1000000; // Seconds; a timer holds milliseconds in an int.
 
-QString waitingForService()
-{
-    return QStringLiteral("Waiting for the file manager service");
-}
-
 QString interrupted()
 {
     return QStringLiteral("interrupted");
@@ -49,13 +44,20 @@ Interrupt& serviceInterrupt()
     return interrupt;
 }
 
-/// Makes the tree, which asks the service, and has slow places show that they are slow.
-void openTree()
+/// Does what may block on the service, in a verb that has an end of its own for Ctrl-C otherwise.
+/// False when Ctrl-C came meanwhile, which has been told then.
+bool runInterruptibly(const Invocation& invocation, const std::function<void()>& work)
 {
-    const VFS* vfs = VFS::ptr();
-    QObject::connect(
-        vfs, &VFS::longTimeOperationStarted, vfs, [] { Spinner::begin(waitingForService()); });
-    QObject::connect(vfs, &VFS::longTimeOperationFinished, vfs, [] { Spinner::end(); });
+    // The verbs have interrupts of their own, one at a time.
+    Interrupt interrupt({SIGINT}, Failed, [] {});
+    interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
+    const Waiting waiting(waitingForService());
+    work();
+    if (!interrupt.wasRequested())
+        return true;
+    interrupt.setWorkEnded();
+    report(invocation.verb().name, interrupted());
+    return false;
 }
 
 int runWithTree(Invocation& invocation)
@@ -78,18 +80,17 @@ int runWithNeeds(Invocation& invocation)
 
 } // namespace
 
-bool runInterruptibly(const Invocation& invocation, const std::function<void()>& work)
+QString waitingForService()
 {
-    // The verbs have interrupts of their own, one at a time.
-    Interrupt interrupt({SIGINT}, Failed, [] {});
-    interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
-    const Waiting waiting(waitingForService());
-    work();
-    if (!interrupt.wasRequested())
-        return true;
-    interrupt.setWorkEnded();
-    report(invocation.verb().name, interrupted());
-    return false;
+    return QStringLiteral("Waiting for the file manager service");
+}
+
+void openTree()
+{
+    const VFS* vfs = VFS::ptr();
+    QObject::connect(
+        vfs, &VFS::longTimeOperationStarted, vfs, [] { Spinner::begin(waitingForService()); });
+    QObject::connect(vfs, &VFS::longTimeOperationFinished, vfs, [] { Spinner::end(); });
 }
 
 int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))

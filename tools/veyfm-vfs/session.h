@@ -16,11 +16,11 @@ class Invocation;
 /// Runs a verb, after what it needs has been made. An ExitCode.
 int runVerb(Invocation& invocation);
 
-/**
- * Does what may block on the service, in a verb that has an end of its own for Ctrl-C otherwise.
- * False when Ctrl-C came meanwhile, which has been told then.
- */
-bool runInterruptibly(const Invocation& invocation, const std::function<void()>& work);
+/// What is shown while the service lets wait.
+QString waitingForService();
+
+/// Makes the tree, which asks the service, and has slow places show that they are slow.
+void openTree();
 
 /// Starts the service and makes the tree, then calls @p run. Without a service it reports why.
 int runWithService(Invocation& invocation, int (*run)(Invocation& invocation));

@@ -69,8 +69,11 @@ public:
                 take(job);
                 return QString();
             }
-            if (result.end != JobResult::Silent || !m_authenticator->isWorthAnotherJob())
-                return whyFailed(result, m_scheme, *m_authenticator, m_watch);
+            if (result.end == JobResult::Silent && m_authenticator->isWorthAnotherJob())
+                continue;
+            QString why = m_watch.whyStopped();
+            m_watch.call([&] { why = whyFailed(result, m_scheme, *m_authenticator, m_watch); });
+            return why;
         }
     }
 
@@ -124,16 +127,15 @@ public:
     UrlMount mount()
     {
         UrlMount result;
-        {
-            const Waiting waiting(QStringLiteral("Looking at what is mounted"));
+        m_runner.watch().call([this] {
             m_whyAlone = VFS::ptr()->settings()->isNetworkEnabled()
                              ? whyNoRunningService()
                              : QStringLiteral("the network is switched off in the settings");
-            find();
-        }
+        });
+        find();
         if (!m_runner.watch().wasInterrupted())
             result.why = work();
-        if (result.why.isEmpty() && m_runner.watch().wasInterrupted())
+        if (m_runner.watch().wasInterrupted())
             result.why = m_runner.watch().whyStopped();
         if (!result.why.isEmpty()) {
             result.wasInterrupted = m_runner.watch().wasInterrupted();
@@ -146,7 +148,7 @@ public:
         result.url = m_url.toString(QUrl::FullyEncoded);
         result.localPath =
             QDir::cleanPath(m_directory + slash + MountPaths::mountRootRelativePath(m_url));
-        result.placePath = placeOf(result.localPath);
+        m_runner.watch().call([this, &result] { result.placePath = placeOf(result.localPath); });
         return result;
     }
 
@@ -158,6 +160,11 @@ private:
 
     /// Looks where the URL is mounted, or will be.
     void find()
+    {
+        m_runner.watch().call([this] { look(); });
+    }
+
+    void look()
     {
         m_directory.clear();
         m_hasPlace = false;
@@ -233,7 +240,7 @@ private:
         if (!m_whyAlone.isEmpty() || m_hasPlace)
             return QString();
         if (!m_isRegistered)
-            VFS::ptr()->fuseMountsManager()->addMount(rootUrl(), m_directory);
+            registerAs(m_directory);
         return runJob<MountFuseEntryJob>();
     }
 
@@ -241,8 +248,15 @@ private:
     void forgetRegistration()
     {
         if (m_isRegistered)
-            VFS::ptr()->fuseMountsManager()->addMount(rootUrl(), QString());
+            registerAs(QString());
         m_isRegistered = false;
+    }
+
+    void registerAs(const QString& directory)
+    {
+        m_runner.watch().call([this, &directory] {
+            VFS::ptr()->fuseMountsManager()->addMount(rootUrl(), directory);
+        });
     }
 
     QString whyNotUsable() const
@@ -324,17 +338,17 @@ UrlMount mountSamba(const QString& url, const Login& login, int timeoutSeconds)
     UrlMount result;
     result.state = UrlMount::Reached;
     result.url = url;
-    result.why = whyNoRunningService();
+    const QString scheme = schemeOf(url);
+    JobRunner runner(scheme, shownUrl(url), login, timeoutSeconds);
+    runner.watch().setCutOff(shownUrl(url));
+    runner.watch().call([&result] { result.why = whyNoRunningService(); });
     if (!result.why.isEmpty()) {
         result.why.prepend(QStringLiteral("Samba shares are reached through the service: "));
         return result;
     }
-    const QString scheme = schemeOf(url);
     result.why = whyNoTool(scheme);
     if (!result.why.isEmpty())
         return result;
-    JobRunner runner(scheme, shownUrl(url), login, timeoutSeconds);
-    runner.watch().setCutOff(shownUrl(url));
     result.why = runner.run<MountURLJob>(
         [&url] { return url; },
         [&result](const MountURLJob& job) { result.localPath = QDir::cleanPath(job.localPath()); });

@@ -29,10 +29,10 @@ struct UrlMount
 };
 
 /**
- * Mounts a URL that whyNotMountable() has nothing against, and shows on the terminal what takes
- * its time. An ftp or sftp URL is mounted with the service, so that all programs of the session
- * have it, or without. Where it fails or is interrupted nothing stays behind. A path that is not
- * there is a failure, too, but the mount of the root stands then.
+ * Mounts a URL that whyNotMountable() has nothing against, once the tree is there, and shows on the
+ * terminal what takes its time. An ftp or sftp URL is mounted with the service, so that all
+ * programs of the session have it, or without. Where it fails or is interrupted nothing stays
+ * behind. A path that is not there is a failure, too, but the mount of the root stands then.
  */
 UrlMount mountUrl(const QString& url, const Login& login, int timeoutSeconds);
 

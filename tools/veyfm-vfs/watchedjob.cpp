@@ -7,6 +7,7 @@
 #include "descendants.h"
 #include "jobs/job.h"
 #include "report.h"
+#include "session.h"
 #include "spinner.h"
 
 #include <QCoreApplication>
@@ -27,6 +28,7 @@ namespace {
 constexpr int defaultTimeout = 60;
 constexpr uint longestTimeout = 1000000; // Seconds; poll() takes milliseconds in an int.
 constexpr std::chrono::seconds grace(5);
+constexpr std::chrono::milliseconds graceOfCalls(500);
 constexpr std::chrono::seconds parting(2);
 constexpr int paceMilliseconds = 100;
 
@@ -106,6 +108,14 @@ void boundParting()
     }).detach();
 }
 
+QString askService(const QString& what, int timeoutSeconds, const std::function<void()>& work)
+{
+    JobWatch watch(QSharedPointer<TerminalAuthenticator>::create(Login()), timeoutSeconds);
+    watch.setCutOff(what);
+    watch.call(work);
+    return watch.wasInterrupted() ? watch.whyStopped() : QString();
+}
+
 JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int timeoutSeconds)
     : m_authenticator(std::move(authenticator))
     , m_timeoutSeconds(timeoutSeconds)
@@ -166,16 +176,16 @@ JobResult JobWatch::run(Job& job, const QString& doing)
     if (m_interrupted)
         return {JobResult::Interrupted, 0, QString()};
     m_authenticator->setAskingHandler([this, doing](bool asking) {
-        setState(true, !asking);
+        setState(InJob, !asking);
         if (!asking)
             Spinner::begin(doing);
     });
     JobResult result;
     {
         const Waiting waiting(doing);
-        setState(true, true);
+        setState(InJob, true);
         result = resultOf(job);
-        setState(false, false);
+        setState(Idle, false);
     }
     m_authenticator->setAskingHandler({});
     // What comes too late does not count: the caller cleans up behind it.
@@ -184,6 +194,16 @@ JobResult JobWatch::run(Job& job, const QString& doing)
     else if (m_timedOut)
         result.end = JobResult::TimedOut;
     return result;
+}
+
+void JobWatch::call(const std::function<void()>& work)
+{
+    if (m_interrupted)
+        return;
+    const Waiting waiting(waitingForService());
+    setState(InCall, true);
+    work();
+    setState(Idle, false);
 }
 
 JobResult JobWatch::resultOf(Job& job)
@@ -232,28 +252,29 @@ bool JobWatch::wasStopped() const
     return m_interrupted || m_timedOut;
 }
 
-void JobWatch::setState(bool running, bool clockRuns)
+void JobWatch::setState(State state, bool clockRuns)
 {
     {
         const std::lock_guard<std::mutex> lock(m_lock);
-        m_running = running;
+        m_state = state;
         m_clockRuns = clockRuns && m_timeoutSeconds > 0;
         m_deadline = Clock::now() + std::chrono::seconds(m_timeoutSeconds);
     }
     sendByte(m_pipe[1], changeByte);
 }
 
-bool JobWatch::isRunning()
+JobWatch::State JobWatch::state()
 {
     const std::lock_guard<std::mutex> lock(m_lock);
-    return m_running;
+    return m_state;
 }
 
-/// Of the job's time; -1 where nothing bounds it. When there is none left it has timed out.
+/// Of the time of a job or call; -1 where nothing bounds it. When there is none left it has timed
+/// out.
 int JobWatch::millisecondsLeft()
 {
     const std::lock_guard<std::mutex> lock(m_lock);
-    if (!m_running || !m_clockRuns)
+    if (m_state == Idle || !m_clockRuns)
         return -1;
     const auto left =
         std::chrono::duration_cast<std::chrono::milliseconds>(m_deadline - Clock::now()).count();
@@ -282,14 +303,14 @@ void JobWatch::watch()
 bool JobWatch::stop()
 {
     hadToStop = true;
-    const Clock::time_point last = Clock::now() + grace;
+    const Clock::time_point begin = Clock::now();
     Descendants tools;
     while (true) {
         // Again and again, since a job may start another tool, or its loop, only now.
-        const bool running = isRunning();
-        if (!running && !m_interrupted)
+        const State now = state();
+        if (now == Idle && !m_interrupted)
             return true;
-        if (running) {
+        if (now == InJob) {
             m_authenticator->cancel();
             quitLoop();
             tools.end();
@@ -299,7 +320,8 @@ bool JobWatch::stop()
             return false;
         if (byte == signalByte)
             m_interrupted = true;
-        if (Clock::now() >= last)
+        const Clock::duration passed = Clock::now() - begin;
+        if (passed >= grace || (now == InCall && passed >= graceOfCalls))
             cutOff();
     }
 }
@@ -323,7 +345,11 @@ void JobWatch::cutOff()
     }
     if (cleanUp)
         cleanUp();
-    report(what, whyStopped());
+    const bool isServiceSilent = state() == InCall && !m_interrupted;
+    report(
+        what, isServiceSilent
+                  ? whyStopped() + QStringLiteral(": the file manager service does not answer")
+                  : whyStopped());
     ::_exit(Failed);
 }
 

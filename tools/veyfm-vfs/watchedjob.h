@@ -85,6 +85,10 @@ public:
     /// it must not delete itself.
     JobResult run(Job& job, const QString& doing);
 
+    /// Does what may block on the service, unless a signal came before. It has the time of a job,
+    /// and is cut off behind that, or half a second after a signal.
+    void call(const std::function<void()>& work);
+
     /// Whether a signal came. The verb then ends, and says so once.
     bool wasInterrupted() const;
 
@@ -96,6 +100,8 @@ private:
 
     using Clock = std::chrono::steady_clock;
 
+    enum State { Idle, InJob, InCall };
+
     struct Handled
     {
         int number;
@@ -104,8 +110,8 @@ private:
 
     JobResult resultOf(Job& job);
     bool wasStopped() const;
-    void setState(bool running, bool clockRuns);
-    bool isRunning();
+    void setState(State state, bool clockRuns);
+    State state();
     int millisecondsLeft();
     void watch();
     bool stop();
@@ -121,7 +127,7 @@ private:
     std::atomic<bool> m_timedOut{false};
 
     std::mutex m_lock; ///< For what follows.
-    bool m_running = false;
+    State m_state = Idle;
     bool m_clockRuns = false;
     Clock::time_point m_deadline;
     QEventLoop* m_loop = nullptr;
@@ -130,6 +136,10 @@ private:
 
     std::thread m_thread;
 };
+
+/// JobWatch::call() where there is no job, with a watch of its own. That a signal came, in words,
+/// or empty.
+QString askService(const QString& what, int timeoutSeconds, const std::function<void()>& work);
 
 } // namespace Tool
 } // namespace VeyFM

@@ -6,6 +6,7 @@
 #include "login.h"
 #include "mounturl.h"
 #include "report.h"
+#include "session.h"
 #include "urlmount.h"
 #include "verbs/verbs.h"
 #include "watchedjob.h"
@@ -38,11 +39,14 @@ int run(Invocation& invocation)
     QString why = whyNotMountable(url);
     if (why.isEmpty())
         why = whyNoUser(schemeOf(url), login.user);
+    const int timeout = jobTimeout(invocation);
+    if (why.isEmpty())
+        why = askService(shownUrl(url), timeout, openTree);
     UrlMount mount;
     if (why.isEmpty()) {
         if (login.user.isEmpty())
             login.user = userOf(url);
-        mount = mountUrl(url, login, jobTimeout(invocation));
+        mount = mountUrl(url, login, timeout);
         why = mount.why;
     }
     if (!why.isEmpty()) {
@@ -84,6 +88,7 @@ Verb mountVerb()
     verb.operandKind = OperandKind::Texts;
     verb.leastOperands = 1;
     verb.mostOperands = 1;
+    verb.needs = Needs::Nothing; // The tree is made under a watch.
     verb.options = loginOptions() + QVector<Option>{jobTimeoutOption()};
     verb.whyWrong = whyWrong;
     verb.run = run;

@@ -59,7 +59,11 @@ public:
 private:
     Outcome mount(const Entry& entry)
     {
-        const NetworkPlace place = VFS::ptr()->networkPlace(entry);
+        NetworkPlace place;
+        const QString stopped =
+            askService(m_operand, m_timeout, [&] { place = VFS::ptr()->networkPlace(entry); });
+        if (!stopped.isEmpty())
+            return {stopped, true};
         const QString url = place.url();
         QString why = whyNotMountable(url);
         if (why.isEmpty())
@@ -159,26 +163,30 @@ Located openedEntry(const QString& path)
 
 int run(Invocation& invocation)
 {
+    const int timeout = jobTimeout(invocation);
     QString why;
-    if (!runInterruptibly(invocation, [&why] { why = whyNoRunningService(); }))
-        return Failed;
+    const QString stopped = askService(invocation.verb().name, timeout, [&why] {
+        openTree();
+        why = whyNoRunningService();
+    });
+    if (!stopped.isEmpty())
+        why = stopped;
     if (!why.isEmpty()) {
         report(invocation.verb().name, why);
         return Failed;
     }
     const Login login = readLogin(invocation);
-    const int timeout = jobTimeout(invocation);
     Output& output = invocation.output();
     JsonArray json(output);
     int exitCode = Done;
     const QStringList operands = invocation.operands();
     for (const QString& operand : operands) {
         Located located;
-        if (!runInterruptibly(invocation, [&] { located = openedEntry(operand); })) {
-            exitCode = Failed;
-            break;
-        }
-        Outcome outcome = {located.why};
+        Outcome outcome;
+        outcome.why = askService(operand, timeout, [&] { located = openedEntry(operand); });
+        outcome.wasInterrupted = !outcome.why.isEmpty();
+        if (outcome.why.isEmpty())
+            outcome.why = located.why;
         if (outcome.why.isEmpty())
             outcome = Update(operand, login, timeout).run(located.entry);
         if (!outcome.why.isEmpty()) {
@@ -213,6 +221,7 @@ Verb updateVerb()
         "again at what is there. Passwords are asked for as with mount; where --password-fd\n"
         "gives them, each entry that needs one reads a line.");
     verb.leastOperands = 1;
+    verb.needs = Needs::Nothing; // The tree is made under a watch.
     verb.options = loginOptions() + QVector<Option>{jobTimeoutOption()};
     verb.whyWrong = whyNoLogin;
     verb.run = run;
