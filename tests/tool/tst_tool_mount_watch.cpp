@@ -49,6 +49,8 @@ private Q_SLOTS:
     void refusingService();
     void interruptedQuestion_data();
     void interruptedQuestion();
+    void interruptedTwice();
+    void interruptedAgain();
     void interruptedTool_data();
     void interruptedTool();
     void interruptedService();
@@ -78,6 +80,15 @@ private:
         process.start(
             QStringLiteral("setsid"),
             QStringList({QStringLiteral("--wait"), toolPath()}) + MountScene::words(line));
+    }
+
+    /// Sends a signal, and waits until a thread has taken it.
+    static bool interrupt(pid_t pid)
+    {
+        ::kill(pid, SIGINT);
+        const QString path = QStringLiteral("/proc/%1/status").arg(pid);
+        return QTest::qWaitFor(
+            [&path] { return contents(path).contains("\nShdPnd:\t0000000000000000"); }, patience);
     }
 
     /// The tool behind setsid.
@@ -238,6 +249,51 @@ void ToolMountWatchTest::interruptedQuestion()
         session->output().constData());
     QVERIFY(!session->output().contains("half"));
     QVERIFY(!MountScene::isRunning(scene.tool.processId(1)));
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountWatchTest::interruptedTwice()
+{
+    // At once, as timeout(1) does it.
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::sshPassword() + Said::sshRefusal());
+    const auto session = scene.onTerminal("mount sftp://me@host/");
+    QVERIFY(session->waitFor("Password for me on sftp://host: "));
+    QVERIFY(!session->hasEcho());
+    QVERIFY(interrupt(session->processId()));
+    ::kill(session->processId(), SIGINT);
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(
+        session->output().endsWith("\nveyfm-vfs: sftp://me@host/: interrupted\n"),
+        session->output().constData());
+    QVERIFY(session->hasEcho());
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountWatchTest::interruptedAgain()
+{
+    // By a person who has enough of waiting for a job that can't be stopped.
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    scene.tool.expect(Said::sshPassword() + Said::success());
+    const auto session = scene.onTerminal("mount --timeout 0 sftp://me@host/");
+    QVERIFY(session->waitFor("Password for me on sftp://host: "));
+    service.service().stop();
+    session->type("geheim\n");
+    QTRY_COMPARE_WITH_TIMEOUT(
+        scene.mounts(), QStringList(QStringLiteral("sftp/me@host")), patience);
+    QElapsedTimer timer;
+    timer.start();
+    session->type("\003");
+    QTest::qWait(700);
+    session->type("\003");
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY(timer.elapsed() < 4000);
+    service.service().resume();
+    QVERIFY2(
+        session->output().endsWith("veyfm-vfs: sftp://me@host/: interrupted\n"),
+        session->output().constData());
     QVERIFY(scene.isClean());
 }
 

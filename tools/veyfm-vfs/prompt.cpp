@@ -10,6 +10,7 @@
 #include <array>
 #include <cerrno>
 #include <fcntl.h>
+#include <mutex>
 #include <poll.h>
 #include <signal.h>
 #include <sys/eventfd.h>
@@ -74,6 +75,11 @@ private:
     std::array<struct sigaction, watchedSignals.size()> m_before = {};
 };
 
+class HiddenInput;
+
+std::mutex hiddenLock; // For what follows.
+const HiddenInput* hiddenInput = nullptr;
+
 /// The terminal without its echo, as long as the object lives.
 class HiddenInput
 {
@@ -84,14 +90,17 @@ public:
     {
         if (!m_changed)
             return;
+        const std::lock_guard<std::mutex> lock(hiddenLock);
         termios hidden = m_before;
         hidden.c_lflag &= ~tcflag_t(ECHO | ECHOE | ECHOK | ECHONL);
         m_changed = ::tcsetattr(terminal, TCSAFLUSH, &hidden) == 0;
+        hiddenInput = this;
     }
     ~HiddenInput()
     {
-        if (m_changed)
-            ::tcsetattr(m_terminal, TCSAFLUSH, &m_before);
+        const std::lock_guard<std::mutex> lock(hiddenLock);
+        hiddenInput = nullptr;
+        putBack();
     }
     HiddenInput(const HiddenInput&) = delete;
     HiddenInput& operator=(const HiddenInput&) = delete;
@@ -99,6 +108,11 @@ public:
     bool isHidden() const
     {
         return m_changed;
+    }
+    void putBack() const
+    {
+        if (m_changed)
+            ::tcsetattr(m_terminal, TCSAFLUSH, &m_before);
     }
 
 private:
@@ -204,6 +218,13 @@ void Prompt::cancel()
 {
     m_cancelled = true;
     wake(m_wake);
+}
+
+void Prompt::restoreTerminal()
+{
+    const std::lock_guard<std::mutex> lock(hiddenLock);
+    if (hiddenInput)
+        hiddenInput->putBack();
 }
 
 bool Prompt::isCancelled() const

@@ -45,6 +45,9 @@ public:
     bool isCancelled() const;
     void restart();
 
+    /// Puts the terminal back before the program is cut off. From any thread.
+    static void restoreTerminal();
+
 private:
     Q_DISABLE_COPY(Prompt)
 

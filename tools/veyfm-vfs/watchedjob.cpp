@@ -29,6 +29,7 @@ constexpr int defaultTimeout = 60;
 constexpr uint longestTimeout = 1000000; // Seconds; poll() takes milliseconds in an int.
 constexpr std::chrono::seconds grace(5);
 constexpr std::chrono::milliseconds graceOfCalls(500);
+constexpr std::chrono::milliseconds graceOfSignals(500); // timeout(1) sends each twice.
 constexpr std::chrono::seconds parting(2);
 constexpr int paceMilliseconds = 100;
 
@@ -127,7 +128,7 @@ JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int time
 
     struct sigaction action = {};
     action.sa_handler = handleSignal;
-    action.sa_flags = SA_RESTART | int(SA_RESETHAND);
+    action.sa_flags = SA_RESTART;
     for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
         Handled& handled = m_handled[m_handledCount];
         handled.number = number;
@@ -304,6 +305,7 @@ bool JobWatch::stop()
 {
     hadToStop = true;
     const Clock::time_point begin = Clock::now();
+    Clock::time_point signalled = begin;
     Descendants tools;
     while (true) {
         // Again and again, since a job may start another tool, or its loop, only now.
@@ -318,10 +320,14 @@ bool JobWatch::stop()
         const char byte = nextByte(m_pipe[0], paceMilliseconds);
         if (byte == endByte)
             return false;
-        if (byte == signalByte)
+        const Clock::time_point time = Clock::now();
+        if (byte == signalByte && !m_interrupted) {
             m_interrupted = true;
-        const Clock::duration passed = Clock::now() - begin;
-        if (passed >= grace || (now == InCall && passed >= graceOfCalls))
+            signalled = time;
+        } else if (byte == signalByte && time - signalled >= graceOfSignals) {
+            cutOff();
+        }
+        if (time - begin >= grace || (now == InCall && time - begin >= graceOfCalls))
             cutOff();
     }
 }
@@ -343,6 +349,7 @@ void JobWatch::cutOff()
         what = m_what;
         cleanUp = m_cleanUp;
     }
+    Prompt::restoreTerminal();
     if (cleanUp)
         cleanUp();
     const bool isServiceSilent = state() == InCall && !m_interrupted;

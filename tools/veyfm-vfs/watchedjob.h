@@ -66,8 +66,8 @@ void boundParting();
  * question, and ends the tools that the job has started and starts, until it comes back. One that
  * does not is cut off after five seconds: the cleaning is done, the reason is reported, and the
  * program exits. As long as the object lives signals end only jobs, so a verb can clean up behind
- * them. A second signal has its default effect. Signals that are ignored when the object is made
- * stay ignored.
+ * them. Another signal, half a second behind the first or later, cuts off what is left of that.
+ * Signals that are ignored when the object is made stay ignored.
  *
  * The signals are not blocked, and programs that are started meanwhile don't have them blocked.
  * One object at a time, and none beside an Interrupt.
