@@ -27,6 +27,7 @@ private Q_SLOTS:
     void staleRegistration();
     void stalePlace();
     void staleRegistrationOfOtherUser();
+    void mountOfOtherUserWithoutPlace();
 };
 
 void ToolMountPresentTest::initTestCase()
@@ -222,6 +223,30 @@ void ToolMountPresentTest::staleRegistrationOfOtherUser()
         session->output().constData());
     QCOMPARE(scene.tool.runs(), 2);
     QCOMPARE(scene.mounts(), QStringList(QStringLiteral("ftp/you@host")));
+}
+
+void ToolMountPresentTest::mountOfOtherUserWithoutPlace()
+{
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    const QString directory = scene.directory(QStringLiteral("sftp/you@host"));
+    QVERIFY(QDir().mkpath(directory));
+    const SlowDirectory mounted(SlowDirectory::Endless, directory);
+    service.service().load({{QStringLiteral("remember"), true}});
+    service.service().setValue(
+        QStringLiteral("FuseMountsManager.mounts"),
+        QJsonObject{{QStringLiteral("sftp://you@host/"), directory}});
+    scene.tool.expect(Said::sshPassword("root") + QByteArrayList{"exit 1"});
+    const auto session = scene.onTerminal("mount --json sftp://host/a");
+    QVERIFY(session->waitFor("User name for sftp://host [root]: "));
+    session->type("you\n");
+    QCOMPARE(session->waitForEnd(), 0);
+    QVERIFY2(
+        session->output().contains("\"path\":\"SFTP/you@host/a\""), session->output().constData());
+    QVERIFY(session->output().contains("\"alreadyMounted\":true"));
+    QCOMPARE(scene.tool.runs(), 1);
+    QCOMPARE(service.service().calls().filter(placeRegister).size(), 1);
 }
 
 QTEST_GUILESS_MAIN(ToolMountPresentTest)

@@ -66,7 +66,8 @@ QString lookWithSsh(const TerminalAuthenticator& authenticator)
 QString whyNoProgress(const QString& scheme, const TerminalAuthenticator& authenticator)
 {
     // A job that runs no tool, or is done with it, waits for the service alone.
-    if (authenticator.protocol().isEmpty() || authenticator.wasAccepted())
+    if (authenticator.protocol().isEmpty() || authenticator.wasAccepted() ||
+        authenticator.wasUserChangedLast())
         return QStringLiteral("the file manager service does not tell of the mount");
     if (scheme == QLatin1String("sftp")) {
         return QStringLiteral("sshfs may be waiting for more than a password; ") +

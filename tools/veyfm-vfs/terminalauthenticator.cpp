@@ -114,11 +114,17 @@ void TerminalAuthenticator::beginJob()
     m_wasAccepted = false;
     m_keyConfirmed = false;
     m_passwordGiven = false;
+    m_userChangedLast = false;
 }
 
 bool TerminalAuthenticator::wasAccepted() const
 {
     return m_wasAccepted;
+}
+
+bool TerminalAuthenticator::wasUserChangedLast() const
+{
+    return m_userChangedLast;
 }
 
 QStringList TerminalAuthenticator::changedUsers() const
@@ -173,6 +179,7 @@ QString TerminalAuthenticator::requestPassword(
     bool* cancelled)
 {
     Q_UNUSED(isRetry) // Some jobs say so of the first question, too.
+    m_userChangedLast = false;
     if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty())
         return giveUp(wasCancelled(), cancelled);
     if (m_triedResource != resource()) {
@@ -219,6 +226,7 @@ QString TerminalAuthenticator::requestPassword(
 void TerminalAuthenticator::noteChangedUser(const QString& user)
 {
     m_wasRefused = false;
+    m_userChangedLast = true;
     const std::lock_guard<std::mutex> lock(m_changedUsersLock);
     m_changedUsers.append(user);
 }
@@ -332,6 +340,7 @@ QString TerminalAuthenticator::whyNoPassword(const QString& user, Secret& passwo
 bool TerminalAuthenticator::askQuestion(const QString& title, const QString& text)
 {
     Q_UNUSED(title) // It says that this is a question.
+    m_userChangedLast = false;
     if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty())
         return false;
     const Asking asking(m_askingHandler);

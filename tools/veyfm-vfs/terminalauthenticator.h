@@ -48,6 +48,10 @@ public:
     /// Whether the job told that a login has worked.
     bool wasAccepted() const;
 
+    /// Whether the last answer to the job was another user. When it asks no more, that user's mount
+    /// was there.
+    bool wasUserChangedLast() const;
+
     /// The users that jobs were told so far to take in place of the one in the URL, the last one
     /// last. From any thread.
     QStringList changedUsers() const;
@@ -92,6 +96,7 @@ private:
     bool m_descriptorRead = false;
     bool m_wasAccepted = false;
     bool m_keyConfirmed = false;
+    bool m_userChangedLast = false;
     QString m_whyGivenUp;
     mutable std::mutex m_changedUsersLock;
     QStringList m_changedUsers;

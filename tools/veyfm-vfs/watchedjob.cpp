@@ -223,8 +223,8 @@ JobResult JobWatch::resultOf(Job& job)
     }
     job.start();
     // All of an SFTP conversation happens in there.
-    const bool isSilent =
-        m_authenticator->protocol() == QLatin1String("sftp") && !m_authenticator->wasAccepted();
+    const bool isSilent = m_authenticator->protocol() == QLatin1String("sftp") &&
+                          !m_authenticator->wasAccepted() && !m_authenticator->wasUserChangedLast();
     if (!ended && !isSilent) {
         const QList<QProcess*> tools = job.findChildren<QProcess*>();
         for (QProcess* tool : tools) {
