@@ -44,6 +44,7 @@ private Q_SLOTS:
     void hungTool();
     void stubbornTool();
     void answeringTakesNoTime();
+    void silentDescriptor();
     void hungSambaTool();
     void silentService();
     void refusingService();
@@ -156,6 +157,24 @@ void ToolMountWatchTest::answeringTakesNoTime()
     QTest::qWait(1500);
     session->type("geheim\n");
     QCOMPARE(session->waitForEnd(), 0);
+}
+
+void ToolMountWatchTest::silentDescriptor()
+{
+    // A program that feeds the password takes no longer than the tool may; a person does.
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::sshPassword() + Said::sshRefusal());
+    QProcess process;
+    start(process, scene, "mount --timeout 1 --password-fd 0 sftp://me@host/");
+    QVERIFY(process.waitForFinished(patience));
+    QCOMPARE(
+        process.readAllStandardError(),
+        failure(
+            "sftp://me@host/", "no progress within 1 s: no password came from the descriptor of "
+                               "--password-fd"));
+    QCOMPARE(process.exitCode(), 1);
+    QVERIFY(!MountScene::isRunning(scene.tool.processId(1)));
+    QVERIFY(scene.isClean());
 }
 
 void ToolMountWatchTest::hungSambaTool()

@@ -65,6 +65,8 @@ QString lookWithSsh(const TerminalAuthenticator& authenticator)
 
 QString whyNoProgress(const QString& scheme, const TerminalAuthenticator& authenticator)
 {
+    if (authenticator.isDescriptorSilent())
+        return QStringLiteral("no password came from the descriptor of --password-fd");
     // A job that runs no tool, or is done with it, waits for the service alone.
     if (authenticator.protocol().isEmpty() || authenticator.wasAccepted() ||
         authenticator.wasUserChangedLast())

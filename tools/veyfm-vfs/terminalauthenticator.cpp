@@ -65,20 +65,22 @@ void sayLines(QString text)
 
 } // namespace
 
-/// Somebody is asked as long as it lives.
+/// A question is open as long as it lives. Only a person may take the time that it needs.
 class TerminalAuthenticator::Asking
 {
 public:
-    explicit Asking(const std::function<void(bool)>& handler)
-        : m_handler(handler)
+    explicit Asking(const TerminalAuthenticator& authenticator)
+        : m_handler(authenticator.m_askingHandler)
+        , m_isPersonAsked(authenticator.isPersonAsked())
     {
-        Spinner::end();
-        if (m_handler)
+        if (m_isPersonAsked)
+            Spinner::end();
+        if (m_isPersonAsked && m_handler)
             m_handler(true);
     }
     ~Asking()
     {
-        if (m_handler)
+        if (m_isPersonAsked && m_handler)
             m_handler(false);
     }
     Asking(const Asking&) = delete;
@@ -86,6 +88,7 @@ public:
 
 private:
     const std::function<void(bool)>& m_handler;
+    const bool m_isPersonAsked;
 };
 
 TerminalAuthenticator::TerminalAuthenticator(const Login& login)
@@ -120,6 +123,11 @@ void TerminalAuthenticator::beginJob()
 bool TerminalAuthenticator::wasAccepted() const
 {
     return m_wasAccepted;
+}
+
+bool TerminalAuthenticator::isDescriptorSilent() const
+{
+    return m_isDescriptorSilent;
 }
 
 bool TerminalAuthenticator::wasUserChangedLast() const
@@ -195,7 +203,7 @@ QString TerminalAuthenticator::requestPassword(
     if (!why.isEmpty())
         return giveUp(why, cancelled);
 
-    const Asking asking(m_askingHandler);
+    const Asking asking(*this);
     if (isUsed && m_wasRefused && isPersonAsked())
         m_prompt.show(message.isEmpty() || protocol() != smb ? title : message);
     QString name = user;
@@ -317,10 +325,10 @@ QString TerminalAuthenticator::whyNoPassword(const QString& user, Secret& passwo
         m_descriptorRead = true;
         if (m_prompt.readLine(m_login.passwordDescriptor, password))
             return whyUnfit(password, protocol());
-        return m_prompt.isCancelled()
-                   ? wasCancelled()
-                   : QStringLiteral("no password could be read from descriptor %1")
-                         .arg(m_login.passwordDescriptor);
+        m_isDescriptorSilent = m_prompt.isCancelled();
+        return m_isDescriptorSilent ? wasCancelled()
+                                    : QStringLiteral("no password could be read from descriptor %1")
+                                          .arg(m_login.passwordDescriptor);
     }
     if (!isPersonAsked()) {
         return whyNoAnswer(
@@ -343,7 +351,7 @@ bool TerminalAuthenticator::askQuestion(const QString& title, const QString& tex
     m_userChangedLast = false;
     if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty())
         return false;
-    const Asking asking(m_askingHandler);
+    const Asking asking(*this);
     if (!isPersonAsked()) {
         sayLines(text);
         m_whyGivenUp =

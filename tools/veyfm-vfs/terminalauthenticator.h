@@ -48,6 +48,9 @@ public:
     /// Whether the job told that a login has worked.
     bool wasAccepted() const;
 
+    /// Whether the job was stopped while it waited for --password-fd.
+    bool isDescriptorSilent() const;
+
     /// Whether the last answer to the job was another user. When it asks no more, that user's mount
     /// was there.
     bool wasUserChangedLast() const;
@@ -66,7 +69,7 @@ public:
      */
     bool isWorthAnotherJob();
 
-    /// Called with true before somebody is asked and with false behind, in the thread of the job.
+    /// Called with true before a person is asked and with false behind, in the thread of the job.
     void setAskingHandler(std::function<void(bool)> handler);
 
     /// Answers every question of the running job with "cancelled", from any thread.
@@ -94,6 +97,7 @@ private:
     bool m_wasRefused = false;
     bool m_passwordGiven = false; ///< Since the last refusal.
     bool m_descriptorRead = false;
+    bool m_isDescriptorSilent = false;
     bool m_wasAccepted = false;
     bool m_keyConfirmed = false;
     bool m_userChangedLast = false;
