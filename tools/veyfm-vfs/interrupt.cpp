@@ -21,7 +21,8 @@ constexpr char signalByte = 's';
 constexpr char endByte = 'e';
 
 // All that the handler touches.
-volatile int handlerDescriptor = -1;
+std::atomic<int> handlerDescriptor{-1};
+static_assert(std::atomic<int>::is_always_lock_free);
 
 void handleSignal(int)
 {

@@ -27,8 +27,9 @@ namespace {
 constexpr std::array<int, 2> watchedSignals = {SIGTSTP, SIGQUIT};
 
 // All that the handler touches.
-volatile sig_atomic_t pendingSignal = 0;
-volatile int wakeDescriptor = -1;
+std::atomic<int> pendingSignal{0};
+std::atomic<int> wakeDescriptor{-1};
+static_assert(std::atomic<int>::is_always_lock_free);
 
 void wake(int descriptor)
 {
