@@ -7,7 +7,7 @@
 #include "fuzzing.h"
 
 #include "core/smburl.h"
-#include "mounturl.h"
+#include "mount/mounturl.h"
 
 #include <QDir>
 #include <QProcess>

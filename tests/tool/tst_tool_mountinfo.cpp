@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "mountinfo.h"
+#include "mount/mountinfo.h"
 
 #include <QDir>
 #include <QFile>

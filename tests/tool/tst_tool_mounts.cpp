@@ -1,8 +1,8 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "mountinfo.h"
-#include "networkmounts.h"
+#include "mount/mountinfo.h"
+#include "mount/networkmounts.h"
 #include "support/makeentry.h"
 #include "support/mountscene.h"
 

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "core/smburl.h"
-#include "mounturl.h"
+#include "mount/mounturl.h"
 #include "support/mounturls.h"
 
 #include <QDir>

@@ -3,7 +3,7 @@
 
 #include "commandline.h"
 
-#include "mounturl.h"
+#include "mount/mounturl.h"
 #include "report.h"
 #include "session.h"
 #include "verbs/verbs.h"

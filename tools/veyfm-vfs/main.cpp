@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "commandline.h"
-#include "descendants.h"
+#include "mount/descendants.h"
 #include "report.h"
 
 #include <QCoreApplication>

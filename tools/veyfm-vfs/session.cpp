@@ -5,11 +5,11 @@
 
 #include "commandline.h"
 #include "interrupt.h"
+#include "mount/watchedjob.h"
 #include "report.h"
 #include "service.h"
 #include "spinner.h"
 #include "vfs/vfs.h"
-#include "watchedjob.h"
 
 #include <QAbstractEventDispatcher>
 #include <QCoreApplication>

@@ -5,8 +5,8 @@
 
 #include "commandline.h"
 #include "describe.h"
+#include "mount/scanjob.h"
 #include "report.h"
-#include "scanjob.h"
 #include "service.h"
 #include "service/smbbrowserproxy.h"
 #include "session.h"

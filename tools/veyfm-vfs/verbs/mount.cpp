@@ -3,13 +3,13 @@
 
 #include "commandline.h"
 #include "describe.h"
-#include "login.h"
-#include "mounturl.h"
+#include "mount/login.h"
+#include "mount/mounturl.h"
+#include "mount/urlmount.h"
+#include "mount/watchedjob.h"
 #include "report.h"
 #include "session.h"
-#include "urlmount.h"
 #include "verbs/verbs.h"
-#include "watchedjob.h"
 
 namespace VeyFM {
 namespace Tool {

@@ -3,9 +3,9 @@
 
 #include "commandline.h"
 #include "describe.h"
-#include "mountinfo.h"
-#include "mounturl.h"
-#include "networkmounts.h"
+#include "mount/mountinfo.h"
+#include "mount/mounturl.h"
+#include "mount/networkmounts.h"
 #include "report.h"
 #include "service.h"
 #include "service/fusemountsmanagerproxy.h"

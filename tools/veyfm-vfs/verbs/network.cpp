@@ -4,7 +4,7 @@
 #include "commandline.h"
 #include "core/smburl.h"
 #include "describe.h"
-#include "mounturl.h"
+#include "mount/mounturl.h"
 #include "report.h"
 #include "service.h"
 #include "service/networkplacesmanagerproxy.h"

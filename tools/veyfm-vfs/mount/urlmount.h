@@ -4,7 +4,7 @@
 #ifndef VEYFM_TOOL_URLMOUNT_H
 #define VEYFM_TOOL_URLMOUNT_H
 
-#include "login.h"
+#include "mount/login.h"
 
 #include <QString>
 

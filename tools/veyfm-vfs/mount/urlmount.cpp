@@ -1,17 +1,18 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "urlmount.h"
+#include "mount/urlmount.h"
 
 #include "core/mountpaths.h"
 #include "core/smburl.h"
-#include "fusedirectory.h"
-#include "jobfailure.h"
 #include "jobs/mountfuseentryjob.h"
 #include "jobs/mounturljob.h"
-#include "mountauthenticator.h"
-#include "mountinfo.h"
-#include "mounturl.h"
+#include "mount/fusedirectory.h"
+#include "mount/jobfailure.h"
+#include "mount/mountauthenticator.h"
+#include "mount/mountinfo.h"
+#include "mount/mounturl.h"
+#include "mount/watchedjob.h"
 #include "report.h"
 #include "service.h"
 #include "service/fusemountsmanagerproxy.h"
@@ -20,7 +21,6 @@
 #include "vfs/vfs.h"
 #include "vfs/vfsplacebase.h"
 #include "vfs/vfssettings.h"
-#include "watchedjob.h"
 
 #include <QDBusConnection>
 #include <QDBusMessage>

@@ -4,7 +4,7 @@
 #ifndef VEYFM_TOOL_PROMPT_H
 #define VEYFM_TOOL_PROMPT_H
 
-#include "secret.h"
+#include "mount/secret.h"
 
 #include <QString>
 

@@ -4,7 +4,7 @@
 #ifndef VEYFM_TOOL_MOUNTAUTHENTICATOR_H
 #define VEYFM_TOOL_MOUNTAUTHENTICATOR_H
 
-#include "terminalauthenticator.h"
+#include "mount/terminalauthenticator.h"
 
 #include <functional>
 

@@ -5,9 +5,9 @@
 #define VEYFM_TOOL_TERMINALAUTHENTICATOR_H
 
 #include "jobs/authenticator.h"
-#include "login.h"
-#include "prompt.h"
-#include "secret.h"
+#include "mount/login.h"
+#include "mount/prompt.h"
+#include "mount/secret.h"
 
 #include <QStringList>
 

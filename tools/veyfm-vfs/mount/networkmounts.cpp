@@ -1,9 +1,9 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "networkmounts.h"
+#include "mount/networkmounts.h"
 
-#include "mountinfo.h"
+#include "mount/mountinfo.h"
 
 #include <QDir>
 #include <QStringList>

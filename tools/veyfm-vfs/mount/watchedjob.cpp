@@ -1,11 +1,11 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "watchedjob.h"
+#include "mount/watchedjob.h"
 
 #include "commandline.h"
-#include "descendants.h"
 #include "jobs/job.h"
+#include "mount/descendants.h"
 #include "report.h"
 #include "session.h"
 #include "spinner.h"

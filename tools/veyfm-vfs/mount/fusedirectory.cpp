@@ -1,10 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "fusedirectory.h"
+#include "mount/fusedirectory.h"
 
-#include "mountinfo.h"
-#include "pidfd.h"
+#include "mount/mountinfo.h"
+#include "mount/pidfd.h"
 #include "report.h"
 #include "vfs/vfs.h"
 #include "vfs/vfssettings.h"

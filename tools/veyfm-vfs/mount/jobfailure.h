@@ -4,7 +4,7 @@
 #ifndef VEYFM_TOOL_JOBFAILURE_H
 #define VEYFM_TOOL_JOBFAILURE_H
 
-#include "watchedjob.h"
+#include "mount/watchedjob.h"
 
 namespace VeyFM {
 namespace Tool {

@@ -1,9 +1,9 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "descendants.h"
+#include "mount/descendants.h"
 
-#include "pidfd.h"
+#include "mount/pidfd.h"
 
 #include <QByteArray>
 #include <QDir>

@@ -1,10 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "jobfailure.h"
+#include "mount/jobfailure.h"
 
 #include "core/fuse.h"
-#include "login.h"
+#include "mount/login.h"
 #include "report.h"
 #include "service/smbbrowserproxy.h"
 #include "vfs/vfs.h"

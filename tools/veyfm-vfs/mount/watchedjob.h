@@ -4,7 +4,7 @@
 #ifndef VEYFM_TOOL_WATCHEDJOB_H
 #define VEYFM_TOOL_WATCHEDJOB_H
 
-#include "terminalauthenticator.h"
+#include "mount/terminalauthenticator.h"
 
 #include <QSharedPointer>
 

@@ -1,10 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "terminalauthenticator.h"
+#include "mount/terminalauthenticator.h"
 
-#include "descendants.h"
-#include "mounturl.h"
+#include "mount/descendants.h"
+#include "mount/mounturl.h"
 #include "report.h"
 #include "spinner.h"
 #include "terminal.h"
