@@ -7,8 +7,7 @@ namespace {
 
 const QByteArray noKey =
     "the key of the host is not known, and nobody could be asked about it: connect once with 'ssh "
-    "host', or check the fingerprint above and add the key with 'ssh-keyscan host >> "
-    "~/.ssh/known_hosts'";
+    "host', which asks";
 
 } // namespace
 

@@ -356,8 +356,7 @@ bool TerminalAuthenticator::askQuestion(const QString& title, const QString& tex
         sayLines(text);
         m_whyGivenUp =
             QStringLiteral("the key of the host is not known, and nobody could be asked about it: "
-                           "connect once with 'ssh %1', or check the fingerprint above and add "
-                           "the key with 'ssh-keyscan %1 >> ~/.ssh/known_hosts'")
+                           "connect once with 'ssh %1', which asks")
                 .arg(server());
         return false;
     }
