@@ -273,6 +273,9 @@ void ToolMountWatchTest::interruptedQuestion()
 
 void ToolMountWatchTest::interruptedTwice()
 {
+#ifdef __SANITIZE_THREAD__
+    QSKIP("the thread sanitizer delivers signals late, the second one behind the end of the watch");
+#endif
     // At once, as timeout(1) does it.
     MountScene scene("sshfs");
     scene.tool.expect(Said::sshPassword() + Said::sshRefusal());
