@@ -151,7 +151,7 @@ void MountFtpURLJob::readStandardError()
     Q_D(MountFtpURLJob);
     d->output.append(d->process->readAllStandardError());
     d->outputSize += d->output.last().size();
-    while (d->outputSize > mostOutput) {
+    while (d->outputSize > mostOutput && d->output.size() > 1) {
         d->outputSize -= d->output.takeFirst().size();
     }
     handleEvents();
