@@ -13,6 +13,7 @@
 #include <string>
 #include <sys/ioctl.h>
 #include <sys/mount.h>
+#include <sys/wait.h>
 #include <termios.h>
 #include <unistd.h>
 
@@ -116,10 +117,10 @@ sigset_t only(int signal)
     return set;
 }
 
-void blockSignal(int signal)
+void maskSignal(int how, int signal)
 {
     const sigset_t set = only(signal);
-    sigprocmask(SIG_BLOCK, &set, nullptr);
+    sigprocmask(how, &set, nullptr);
 }
 
 void waitForSignal(int signal)
@@ -137,6 +138,17 @@ void waitForEver()
     while (true) {
         pause();
     }
+}
+
+void finishSlowly()
+{
+    const pid_t child = fork();
+    if (child == 0) {
+        usleep(300000);
+        append(".finished", "");
+        _exit(0);
+    }
+    waitpid(child, nullptr, 0);
 }
 
 // A file system that nobody serves, and that is dead as soon as this process ends.
@@ -166,7 +178,9 @@ void play(const std::string& line)
     } else if (verb == "drained") {
         waitForReader();
     } else if (verb == "block") {
-        blockSignal(std::atoi(rest.c_str()));
+        maskSignal(SIG_BLOCK, std::atoi(rest.c_str()));
+    } else if (verb == "unblock") {
+        maskSignal(SIG_UNBLOCK, std::atoi(rest.c_str()));
     } else if (verb == "await") {
         waitForSignal(std::atoi(rest.c_str()));
     } else if (verb == "hang") {
@@ -177,6 +191,8 @@ void play(const std::string& line)
             waitForEver();
         }
         append(".child", std::to_string(child));
+    } else if (verb == "finish") {
+        finishSlowly();
     } else if (verb == "mount") {
         mountDirectory();
     } else if (verb == "kill") {

@@ -20,9 +20,11 @@
  *   echo on, echo off    switches the echo of the terminal
  *   drained              waits until all that it printed on standard error has been read
  *   block N              keeps a signal from ending it
+ *   unblock N            no more
  *   await N              waits for a signal that it blocks
  *   hang                 waits for a signal that ends it
  *   fork                 starts a process that waits for a signal that ends it
+ *   finish               runs a process that needs a third of a second; see hasFinished()
  *   mount                mounts a dead file system on the directory among its arguments
  *   kill N, exit N       ends
  *
@@ -128,6 +130,12 @@ public:
     QByteArray commandLine(int run) const
     {
         return read(run, "cmdline");
+    }
+
+    /// Whether the process that a run has started by "finish" got to its end.
+    bool hasFinished(int run) const
+    {
+        return QFile::exists(path(run, "finished"));
     }
 
     /// The process that a run has started by "fork"; 0 before it has.

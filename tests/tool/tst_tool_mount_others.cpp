@@ -87,6 +87,9 @@ private Q_SLOTS:
     void besideFailingTool();
     void besideHungTool();
     void ofKilledTool();
+    void ofToolThatAsksLater_data();
+    void ofToolThatAsksLater();
+    void ofToolThatAsksLaterRefused();
     void processStays();
     void processIsNoTool();
 };
@@ -192,6 +195,45 @@ void ToolMountOthersTest::ofKilledTool()
     const ToolResult result = scene.run("mount --timeout 1 sftp://me@host/");
     QCOMPARE(result.exitCode, 1);
     QVERIFY2(result.err.contains("no progress within 1 s"), result.err.constData());
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountOthersTest::ofToolThatAsksLater_data()
+{
+    QTest::addColumn<QByteArray>("key");
+    QTest::newRow("interrupted") << QByteArray("\003");
+    QTest::newRow("no progress") << QByteArray("geheim\n");
+}
+
+void ToolMountOthersTest::ofToolThatAsksLater()
+{
+    // sshfs mounts before it connects, and leaves a dead mount when it is killed.
+    QFETCH(const QByteArray, key);
+    MountScene scene("sshfs");
+    scene.tool.expect(
+        QByteArrayList{"block 15", "mount"} + Said::sshPassword() + QByteArrayList{"hang"});
+    const auto session = scene.onTerminal("mount --timeout 1 sftp://me@host/");
+    QVERIFY(session->waitFor("Password for me on sftp://host: "));
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
+    session->type(key);
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountOthersTest::ofToolThatAsksLaterRefused()
+{
+    ToolScene service;
+    QVERIFY(service.isReady());
+    service.service().load({{QStringLiteral("echo"), false}});
+    MountScene scene("sshfs", &service);
+    scene.tool.expect(QByteArrayList{"mount"} + Said::sshPassword());
+    const auto session = scene.onTerminal("mount --timeout 1 sftp://me@host/");
+    QVERIFY(session->waitFor("Password for me on sftp://host: "));
+    session->type("geheim\n");
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(
+        session->output().contains("the file manager service does not tell of the mount"),
+        session->output().constData());
     QVERIFY(scene.isClean());
 }
 

@@ -60,21 +60,21 @@ std::vector<Process> runningProcesses()
 }
 
 /// Below this process, parents first.
-std::vector<pid_t> runningDescendants()
+std::vector<Process> runningDescendants()
 {
     const std::vector<Process> all = runningProcesses();
-    std::vector<pid_t> found;
+    std::vector<Process> found;
     const auto addChildrenOf = [&](pid_t parent) {
         for (const Process& process : all) {
             const bool isOurs =
                 std::find(inherited.begin(), inherited.end(), process) == inherited.end();
             if (process.parent == parent && isOurs)
-                found.push_back(process.pid);
+                found.push_back(process);
         }
     };
     addChildrenOf(::getpid());
     for (size_t i = 0; i < found.size(); ++i)
-        addChildrenOf(found[i]);
+        addChildrenOf(found[i].pid);
     return found;
 }
 
@@ -104,30 +104,38 @@ Descendants::~Descendants()
         ::close(seen.handle);
 }
 
-void Descendants::add(pid_t pid)
+void Descendants::add(pid_t pid, bool isHelper)
 {
     const int handle = openPidfd(pid);
     if (handle >= 0)
-        m_seen.insert({pid, {handle, Clock::time_point()}});
+        m_seen.insert({pid, {handle, isHelper, Clock::time_point()}});
+}
+
+bool Descendants::wasAsked(pid_t pid) const
+{
+    const auto seen = m_seen.find(pid);
+    return seen != m_seen.end() && seen->second.asked != Clock::time_point();
 }
 
 void Descendants::end()
 {
-    const std::vector<pid_t> before = runningDescendants();
-    for (const pid_t pid : before) {
-        if (m_seen.count(pid) == 0)
-            add(pid);
+    for (const Process& process : runningDescendants()) {
+        if (m_seen.count(process.pid) == 0)
+            add(process.pid, wasAsked(process.parent));
     }
     // What is below us behind the opening, too, is what was opened.
-    const std::vector<pid_t> behind = runningDescendants();
+    const std::vector<Process> behind = runningDescendants();
     const Clock::time_point now = Clock::now();
     for (auto it = m_seen.begin(); it != m_seen.end();) {
         Seen& seen = it->second;
         const bool isNew = seen.asked == Clock::time_point();
         bool isThere = true;
         if (isNew) {
-            isThere = std::find(behind.begin(), behind.end(), it->first) != behind.end() &&
-                      sendSignal(seen.handle, SIGTERM);
+            const auto isSame = [pid = it->first](const Process& other) {
+                return other.pid == pid;
+            };
+            isThere = std::any_of(behind.begin(), behind.end(), isSame) &&
+                      sendSignal(seen.handle, seen.isHelper ? 0 : SIGTERM);
             seen.asked = now;
         } else if (now - seen.asked >= patience) {
             isThere = sendSignal(seen.handle, SIGKILL);

@@ -24,7 +24,8 @@ bool hasRunningDescendants();
 /**
  * Ends the processes that this one has started, and those that they have. Each is asked to end
  * (SIGTERM) when it is first seen, and made to (SIGKILL) when it is still there a second later,
- * also if it has lost its parent meanwhile. Other processes are never touched.
+ * also if it has lost its parent meanwhile. What a process starts when it has been asked gets that
+ * second in peace: sshfs runs fusermount3 at its end. Other processes are never touched.
  */
 class Descendants
 {
@@ -43,11 +44,13 @@ private:
 
     struct Seen
     {
-        int handle; ///< A pidfd: another process that gets the number is not meant.
+        int handle;    ///< A pidfd: another process that gets the number is not meant.
+        bool isHelper; ///< Of one that had been asked before.
         Clock::time_point asked;
     };
 
-    void add(pid_t pid);
+    void add(pid_t pid, bool isHelper);
+    bool wasAsked(pid_t pid) const;
 
     std::map<pid_t, Seen> m_seen;
 };

@@ -114,6 +114,15 @@ void unmount(const QString& directory)
     }
 }
 
+QVector<int> mountIds()
+{
+    QVector<int> ids;
+    const QVector<KernelMount> mounts = MountInfo::read().mounts();
+    for (const KernelMount& mount : mounts)
+        ids.append(mount.id);
+    return ids;
+}
+
 } // namespace
 
 QString fuseDirectory(const QUrl& url)
@@ -160,21 +169,37 @@ bool isMissing(const QString& path, int seconds)
 FuseTrace::FuseTrace(const QString& scheme)
     : m_parent(mountRoot() + slash + scheme)
     , m_names(namesIn(m_parent))
+    , m_others(mountIds())
 {
     for (const QString& directory : {m_parent, mountRoot()}) {
         if (!QDir(directory).exists())
             m_parents.append(directory);
     }
-    retake();
 }
 
-void FuseTrace::retake()
+void FuseTrace::pause()
 {
-    const QVector<KernelMount> mounts = MountInfo::read().mounts();
+    const QVector<int> now = mountIds();
     const std::lock_guard<std::mutex> lock(m_lock);
-    m_mounts.clear();
-    for (const KernelMount& mount : mounts)
-        m_mounts.append(mount.id);
+    m_atPause = now;
+    m_isPaused = true;
+}
+
+void FuseTrace::resume()
+{
+    const QVector<int> now = mountIds();
+    const std::lock_guard<std::mutex> lock(m_lock);
+    for (const int id : now) {
+        if (!m_atPause.contains(id))
+            m_others.append(id);
+    }
+    m_isPaused = false;
+}
+
+bool FuseTrace::isOfOthers(int mountId) const
+{
+    const std::lock_guard<std::mutex> lock(m_lock);
+    return m_others.contains(mountId) || (m_isPaused && !m_atPause.contains(mountId));
 }
 
 bool FuseTrace::isMadeHere(const QString& directory, Made made) const
@@ -188,13 +213,8 @@ bool FuseTrace::isMadeHere(const QString& directory, Made made) const
         if (mount.directory == path)
             top = &mount;
     }
-    if (!top || !top->isFuse())
+    if (!top || !top->isFuse() || isOfOthers(top->id))
         return false;
-    {
-        const std::lock_guard<std::mutex> lock(m_lock);
-        if (m_mounts.contains(top->id))
-            return false;
-    }
     return made == AllMounts || errorOf(directory, shortLook) == ENOTCONN;
 }
 

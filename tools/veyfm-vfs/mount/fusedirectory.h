@@ -47,20 +47,25 @@ public:
     /// For URLs of one scheme.
     explicit FuseTrace(const QString& scheme);
 
-    /// What is mounted by now was not mounted by this run.
-    void retake();
+    /// From pause() to resume() the tool waits: what is mounted meanwhile is of others. What was
+    /// mounted before may be its own, since sshfs mounts first and asks then.
+    void pause();
+    void resume();
 
     /// Unmounts and removes those of the directories that are new.
     void remove(const QStringList& directories, Made made) const;
 
 private:
+    bool isOfOthers(int mountId) const;
     bool isMadeHere(const QString& directory, Made made) const;
 
     const QString m_parent;
     QStringList m_parents; ///< Those that were not there.
     QStringList m_names;
-    mutable std::mutex m_lock; ///< For what follows.
-    QVector<int> m_mounts;     ///< The numbers of the kernel for them.
+    mutable std::mutex m_lock; ///< For what follows, which the kernel has numbers for.
+    QVector<int> m_others;     ///< Mounts that this run has not made.
+    QVector<int> m_atPause;    ///< All mounts, at its begin.
+    bool m_isPaused = false;
 };
 
 } // namespace Tool

@@ -6,9 +6,9 @@
 namespace VeyFM {
 namespace Tool {
 
-void MountAuthenticator::setAskedHandler(std::function<void()> handler)
+void MountAuthenticator::setQuestionHandler(std::function<void(bool asking)> handler)
 {
-    m_askedHandler = std::move(handler);
+    m_questionHandler = std::move(handler);
 }
 
 bool MountAuthenticator::hasMounted() const
@@ -20,16 +20,18 @@ QString MountAuthenticator::requestPassword(
     bool isRetry, const QString& title, const QString& message, QString& user, bool* userChanged,
     bool* cancelled)
 {
+    noteQuestion(true);
     QString password = TerminalAuthenticator::requestPassword(
         isRetry, title, message, user, userChanged, cancelled);
-    noteAsked();
+    noteQuestion(false);
     return password;
 }
 
 bool MountAuthenticator::askQuestion(const QString& title, const QString& text)
 {
+    noteQuestion(true);
     const bool yes = TerminalAuthenticator::askQuestion(title, text);
-    noteAsked();
+    noteQuestion(false);
     return yes;
 }
 
@@ -39,10 +41,10 @@ void MountAuthenticator::credentialsAccepted()
     TerminalAuthenticator::credentialsAccepted();
 }
 
-void MountAuthenticator::noteAsked() const
+void MountAuthenticator::noteQuestion(bool asking) const
 {
-    if (m_askedHandler && !m_hasMounted)
-        m_askedHandler();
+    if (m_questionHandler && !m_hasMounted)
+        m_questionHandler(asking);
 }
 
 } // namespace Tool

@@ -17,9 +17,9 @@ class MountAuthenticator : public TerminalAuthenticator
 public:
     using TerminalAuthenticator::TerminalAuthenticator;
 
-    /// Called when a question has ended and the tool has not got the answer yet. No more when a
-    /// tool has mounted something.
-    void setAskedHandler(std::function<void()> handler);
+    /// Called with true when a question begins, and with false when it has ended and the tool has
+    /// not got the answer yet. No more when a tool has mounted something.
+    void setQuestionHandler(std::function<void(bool asking)> handler);
 
     /// Whether the tool of a job has done well.
     bool hasMounted() const;
@@ -31,9 +31,9 @@ public:
     void credentialsAccepted() override;
 
 private:
-    void noteAsked() const;
+    void noteQuestion(bool asking) const;
 
-    std::function<void()> m_askedHandler;
+    std::function<void(bool)> m_questionHandler;
     bool m_hasMounted = false;
 };
 

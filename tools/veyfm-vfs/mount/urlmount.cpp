@@ -116,8 +116,12 @@ public:
         , m_trace(url.scheme())
         , m_runner(url.scheme(), m_shown, login, timeoutSeconds)
     {
-        // The tool has mounted nothing before it got its answer.
-        m_runner.authenticator().setAskedHandler([this] { m_trace.retake(); });
+        m_runner.authenticator().setQuestionHandler([this](bool asking) {
+            if (asking)
+                m_trace.pause();
+            else
+                m_trace.resume();
+        });
         // A job is cut off in a call to the service, when its tool has done well.
         m_runner.watch().setCutOff(m_shown, [this] {
             m_trace.remove(directories(), m_hasRunJob ? FuseTrace::AllMounts : FuseTrace::NoMounts);
