@@ -143,10 +143,11 @@ JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int time
 
 JobWatch::~JobWatch()
 {
-    for (int i = 0; i < m_handledCount; ++i)
-        ::sigaction(m_handled[i].number, &m_handled[i].before, nullptr);
     sendByte(m_pipe[1], endByte);
     m_thread.join();
+    // Behind a signal the verb ends, and another may be on its way: it does nothing any more.
+    for (int i = 0; i < m_handledCount && !m_interrupted; ++i)
+        ::sigaction(m_handled[i].number, &m_handled[i].before, nullptr);
     handlerDescriptor = -1;
     ::close(m_pipe[0]);
     ::close(m_pipe[1]);

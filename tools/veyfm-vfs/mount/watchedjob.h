@@ -67,6 +67,7 @@ void boundParting();
  * does not is cut off after five seconds: the cleaning is done, the reason is reported, and the
  * program exits. As long as the object lives signals end only jobs, so a verb can clean up behind
  * them. Another signal, half a second behind the first or later, cuts off what is left of that.
+ * When the object has ended behind a signal, others have no effect: see boundParting().
  * Signals that are ignored when the object is made stay ignored.
  *
  * The signals are not blocked, and programs that are started meanwhile don't have them blocked.
