@@ -76,10 +76,39 @@ bool takeTerminal(int slave)
     return true;
 }
 
-[[noreturn]] void becomeTool(int slave, const char* path, char* const* argv)
+/// What the child waits at until the parent has its handle. In a host that ignores SIGCHLD one that
+/// has ended is gone at once, and its number may be another's.
+struct Gate
+{
+    UniqueFd child;
+    UniqueFd parent;
+
+    bool make()
+    {
+        int ends[2];
+        if (pipe2(ends, O_CLOEXEC) != 0)
+            return false;
+        child = UniqueFd(ends[0]);
+        parent = UniqueFd(ends[1]);
+        return true;
+    }
+    /// False when the parent has died.
+    bool waitInChild() const
+    {
+        char byte = 0;
+        close(parent.get());
+        return read(child.get(), &byte, 1) == 1;
+    }
+    bool letPass() const
+    {
+        return write(parent.get(), "", 1) == 1;
+    }
+};
+
+[[noreturn]] void becomeTool(const Gate& gate, int slave, const char* path, char* const* argv)
 {
     resetSignals();
-    if (takeTerminal(slave)) {
+    if (gate.waitInChild() && takeTerminal(slave)) {
         closefrom(STDERR_FILENO + 1);
         execv(path, argv);
     }
@@ -106,7 +135,8 @@ PtyChild launchOnPty(const QByteArray& command, const QList<QByteArray>& args)
     const QByteArray path = executablePath(command);
     PtyChild child;
     UniqueFd slave;
-    if (path.isEmpty() || !openTerminal(child.master, slave))
+    Gate gate;
+    if (path.isEmpty() || !openTerminal(child.master, slave) || !gate.make())
         return {};
 
     std::vector<char*> argv;
@@ -118,14 +148,14 @@ PtyChild launchOnPty(const QByteArray& command, const QList<QByteArray>& args)
 
     child.pid = forkWithoutSignals();
     if (child.pid == 0)
-        becomeTool(slave.get(), path.constData(), argv.data());
+        becomeTool(gate, slave.get(), path.constData(), argv.data());
     if (child.pid < 0)
         return {};
 
     // By number: glibc 2.36 declares pidfd_open() without C linkage. The flag that closes it on
     // exec is always set.
     child.handle = UniqueFd(int(syscall(SYS_pidfd_open, child.pid, 0)));
-    if (!child.handle.isValid()) {
+    if (!child.handle.isValid() || !gate.letPass()) {
         kill(child.pid, SIGKILL);
         waitpid(child.pid, nullptr, 0);
         return {};
