@@ -50,6 +50,11 @@ bool holdsSecret(const QByteArray& text)
         secrets.begin(), secrets.end(), [&](const char* secret) { return text.contains(secret); });
 }
 
+QByteArray nameIn(const QString& processFolder)
+{
+    return contents(processFolder + QLatin1String("comm")).trimmed();
+}
+
 void look(QSet<QByteArray>& findings)
 {
     const QDir processes(QStringLiteral("/proc"));
@@ -57,9 +62,11 @@ void look(QSet<QByteArray>& findings)
     for (const QString& id : ids) {
         const QString folder = processes.filePath(id) + QLatin1Char('/');
         for (const char* file : {"cmdline", "environ"}) {
+            const QByteArray before = nameIn(folder);
             if (holdsSecret(contents(folder + QLatin1String(file)))) {
-                const QByteArray name = contents(folder + QLatin1String("comm")).trimmed();
-                findings.insert(name + ' ' + file);
+                // It may have become another program meanwhile, or have ended.
+                const QByteArray behind = nameIn(folder);
+                findings.insert((behind.isEmpty() ? before : behind) + ' ' + file);
             }
         }
     }
