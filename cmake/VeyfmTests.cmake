@@ -28,7 +28,8 @@ endif()
 # Builds tst_<topic> from tst_<topic>.cpp and registers it with ctest. Each test gets a home,
 # XDG folders and a session bus address of its own, so that tests may run side by side and a
 # user's settings never reach them. A test that uses threads has the label "threads": the thread
-# sanitizer builds and runs only those.
+# sanitizer builds and runs only those. One that takes its time has the label "slow", and begins
+# before the others, so that the round does not end with nothing else to do.
 #
 # A cancelled listing leaks its directory stream, which is meant. The leak checker passes over it,
 # but only where it unwinds slowly: the quick way ends at the first frame of libc, and who opened
@@ -66,4 +67,7 @@ function(veyfm_add_test topic)
         TIMEOUT 120
         LABELS "${ARG_LABELS}"
     )
+    if("slow" IN_LIST ARG_LABELS)
+        set_tests_properties(${topic} PROPERTIES COST 30)
+    endif()
 endfunction()

@@ -30,6 +30,7 @@ if(NOT VEYFM_SANITIZE)
     set_tests_properties(consumer PROPERTIES
         ENVIRONMENT "CXX=${CMAKE_CXX_COMPILER};CMAKE_GENERATOR=${CMAKE_GENERATOR}"
         TIMEOUT 600
+        COST 30
     )
 
     add_test(NAME curlftpfsinstall
