@@ -17,12 +17,9 @@ class DBusWire : public QDBusVirtualObject
 {
 public:
     DBusWire()
-        // No file: Qt closes the server in a thread of its own, at a time nobody can wait for.
-        : m_server(
-              QLatin1String("unix:abstract=veyfm-") + QUuid::createUuid().toString(QUuid::Id128))
-        , m_client(QDBusConnection::connectToPeer(m_server.address(), QStringLiteral("wire")))
+        : m_client(QDBusConnection::connectToPeer(server()->address(), QStringLiteral("wire")))
     {
-        connect(&m_server, &QDBusServer::newConnection, this, [this](QDBusConnection connection) {
+        connect(server(), &QDBusServer::newConnection, this, [this](QDBusConnection connection) {
             m_serverName = connection.name();
             connection.registerVirtualObject(QStringLiteral("/"), this, QDBusConnection::SubPath);
         });
@@ -36,7 +33,7 @@ public:
 
     bool isConnected() const
     {
-        return m_server.isConnected() && m_client.isConnected();
+        return server()->isConnected() && m_client.isConnected();
     }
 
     /// The reply, an error when none comes.
@@ -78,7 +75,16 @@ public:
     }
 
 private:
-    QDBusServer m_server;
+    /// It stays to the end of the process, and has no file: Qt closes a server in a thread of its
+    /// own, at a time nobody can wait for, and now and then while the destructor still holds its
+    /// lock, for which both then wait for ever.
+    static QDBusServer* server()
+    {
+        static QDBusServer* const instance = new QDBusServer(
+            QLatin1String("unix:abstract=veyfm-") + QUuid::createUuid().toString(QUuid::Id128));
+        return instance;
+    }
+
     QDBusConnection m_client;
     QString m_serverName;
     QString m_signature;
