@@ -1,103 +1,44 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "jobs/mountsftpurljob.h"
-#include "support/mountjobtest.h"
+#include "support/fusemounturltest.h"
 
 using namespace VeyFM;
 
-/// SFTP mounts that need no question, with a scripted `sshfs` on its terminal and a scripted
-/// service.
-class MountSFtpURLJobTest : public MountJobTest
+/// SFTP mounts that need no question.
+class MountSFtpURLJobTest : public FuseMountUrlTest
 {
     Q_OBJECT
 
+public:
+    MountSFtpURLJobTest()
+        : FuseMountUrlTest(FuseProtocol::sftp())
+    {
+    }
+
+protected:
+    void addMountedUrls() override;
+    void addUnsafeUrls() override;
+
 private Q_SLOTS:
-    void initTestCase();
-    void init();
-    void cleanup();
-    void otherScheme_data();
-    void otherScheme();
-    void alreadyMounted_data();
-    void alreadyMounted();
     void commandLine_data();
     void commandLine();
     void homeAndRootAreTwoMounts();
-    void unsafeUrls_data();
-    void unsafeUrls();
     void missingToolIsAFailure();
-    void cleanupTestCase();
-
-private:
-    static void verifyFailed(MountSFtpURLJob* job)
-    {
-        QCOMPARE(job->error(), 5);
-        QCOMPARE(job->errorString(), u"Mounting sftp resource failed"_s);
-    }
 };
 
-void MountSFtpURLJobTest::initTestCase()
+void MountSFtpURLJobTest::addMountedUrls()
 {
-    QVERIFY2(startVfs("{}"), qPrintable(service.errorString()));
-}
-
-void MountSFtpURLJobTest::init()
-{
-    QVERIFY(!QFileInfo::exists(mountDir(QString())));
-    startScene("sshfs");
-}
-
-void MountSFtpURLJobTest::cleanup()
-{
-    checkScene();
-    QDir(mountDir(QString())).removeRecursively();
-}
-
-void MountSFtpURLJobTest::otherScheme_data()
-{
-    QTest::addColumn<QString>("url");
-    for (const QString& url :
-         {u"ftp://host"_s, u"SFTP://host"_s, u"sftps://host"_s, u"host"_s, u" sftp://host"_s,
-          QString()}) {
-        QTest::newRow(qPrintable(url)) << url;
-    }
-}
-
-void MountSFtpURLJobTest::otherScheme()
-{
-    QFETCH(QString, url);
-    const auto job = makeJob<MountSFtpURLJob>(url);
-    startToEnd(job.get());
-    QCOMPARE(job->error(), 5);
-    QCOMPARE(job->errorString(), u"Url scheme is not sftp"_s);
-    QVERIFY(!QFileInfo::exists(mountDir(QString())));
-    QCOMPARE(service->takeCalls(), QStringList());
-}
-
-void MountSFtpURLJobTest::alreadyMounted_data()
-{
-    QTest::addColumn<QString>("url");
-    QTest::addColumn<QString>("key");
-    QTest::addColumn<QString>("path");
-    QTest::newRow("path") << u"sftp://host/a/b%20c"_s << u"sftp://host/"_s << u"/mnt//a/b c"_s;
-    QTest::newRow("no path") << u"sftp://bob@host"_s << u"sftp://bob@host/"_s << u"/mnt/"_s;
     // Cut off a path below the home directory, unlike for FTP.
     QTest::newRow("home") << u"sftp://host/~/a"_s << u"sftp://host/~/"_s << u"/mnt//a"_s;
 }
 
-void MountSFtpURLJobTest::alreadyMounted()
+// The user comes first in what sshfs is to mount.
+void MountSFtpURLJobTest::addUnsafeUrls()
 {
-    QFETCH(QString, url);
-    QFETCH(QString, key);
-    QFETCH(QString, path);
-    setFuseMounts({{key, u"/mnt"_s}});
-    const auto job = makeJob<MountSFtpURLJob>(url);
-    startToEnd(job.get());
-    QCOMPARE(job->error(), 0);
-    QCOMPARE(job->localPath(), path);
-    QCOMPARE(auth->calls, QStringList());
-    QCOMPARE(service->takeCalls(), QStringList(u"FuseMountsManager.mounts[]"_s));
-    QVERIFY(!QFileInfo::exists(mountDir(QString())));
+    QTest::newRow("user is an option") << u"sftp://-oProxyCommand=x@host/a"_s;
+    QTest::newRow("encoded option") << u"sftp://%2doProxyCommand=x@host/a"_s;
+    QTest::newRow("option in brackets") << u"sftp://%5B-oProxyCommand=x%5D@host/a"_s;
 }
 
 void MountSFtpURLJobTest::commandLine_data()
@@ -161,34 +102,6 @@ void MountSFtpURLJobTest::homeAndRootAreTwoMounts()
                                recordedMount(u"sftp://host/~/"_s, mountDir(u"/sftp/host~"_s))}));
 }
 
-void MountSFtpURLJobTest::unsafeUrls_data()
-{
-    QTest::addColumn<QString>("url");
-    QTest::newRow("no host") << u"sftp:///a"_s;
-    QTest::newRow("user alone") << u"sftp://bob@/a"_s;
-    QTest::newRow("host is an option") << u"sftp://-oProxyCommand=x/a"_s;
-    QTest::newRow("host is a flag") << u"sftp://bob@-f/a"_s;
-    QTest::newRow("user is an option") << u"sftp://-oProxyCommand=x@host/a"_s;
-    QTest::newRow("encoded option") << u"sftp://%2doProxyCommand=x@host/a"_s;
-    QTest::newRow("option in brackets") << u"sftp://%5B-oProxyCommand=x%5D@host/a"_s;
-    QTest::newRow("no port") << u"sftp://host:99999/a"_s;
-    QTest::newRow("host goes up") << u"sftp://../a"_s;
-    QTest::newRow("slash in the user") << u"sftp://..%2f..%2fbob@host/a"_s;
-    QTest::newRow("newline in the user") << u"sftp://bob%0aann@host/a"_s;
-    QTest::newRow("zero byte in the user") << u"sftp://bob%00ann@host/a"_s;
-}
-
-void MountSFtpURLJobTest::unsafeUrls()
-{
-    QFETCH(QString, url);
-    const auto job = makeJob<MountSFtpURLJob>(url);
-    startToEnd(job.get());
-    verifyFailed(job.get());
-    QCOMPARE(auth->calls, QStringList());
-    QVERIFY(!QFileInfo::exists(mountDir(QString())));
-    QCOMPARE(recordedMounts(), QStringList());
-}
-
 void MountSFtpURLJobTest::missingToolIsAFailure()
 {
     const QByteArray path = qgetenv("PATH");
@@ -196,13 +109,9 @@ void MountSFtpURLJobTest::missingToolIsAFailure()
     const auto job = makeJob<MountSFtpURLJob>(u"sftp://host"_s);
     startToEnd(job.get());
     qputenv("PATH", path);
-    verifyFailed(job.get());
+    QCOMPARE(job->error(), 5);
+    QCOMPARE(job->errorString(), u"Mounting sftp resource failed"_s);
     QVERIFY(!isMountDir(u"/sftp/host"_s));
-}
-
-void MountSFtpURLJobTest::cleanupTestCase()
-{
-    QCOMPARE(service->violations(), QStringList());
 }
 
 QTEST_GUILESS_MAIN(MountSFtpURLJobTest)
