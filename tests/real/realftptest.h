@@ -16,6 +16,16 @@ inline void useCurlftpfsAdapter()
     ::qputenv("PATH", VEYFM_CURLFTPFS_FOLDER ":" + qgetenv("PATH"));
 }
 
+/// Nothing of what served FTP mounts is left. For cleanup() of each test.
+inline void verifyNoRclone()
+{
+    QTRY_VERIFY(processesNamed("rclone").isEmpty());
+    QVERIFY(processesNamed("curlftpfs").isEmpty());
+    // Nothing of rclone's own is read or written.
+    QVERIFY(!QDir::home().exists(u".config/rclone"_s));
+    QVERIFY(!QDir::home().exists(u".cache/rclone"_s));
+}
+
 /**
  * A sandbox with two FTP servers:
  *

@@ -66,8 +66,6 @@ private Q_SLOTS:
     void initTestCase();
     void init();
     void cleanup();
-    void logsIn_data();
-    void logsIn();
     void anonymous();
     void givenUp_data();
     void givenUp();
@@ -124,71 +122,7 @@ void RealFtpTest::cleanup()
         return;
     }
     endScene();
-    QTRY_VERIFY(processesNamed("rclone").isEmpty());
-    QVERIFY(processesNamed("curlftpfs").isEmpty());
-    // Nothing of rclone's own is read or written.
-    QVERIFY(!QDir::home().exists(u".config/rclone"_s));
-    QVERIFY(!QDir::home().exists(u".cache/rclone"_s));
-}
-
-void RealFtpTest::logsIn_data()
-{
-    QTest::addColumn<QString>("url");
-    QTest::addColumn<QList<Auth::Answer>>("answers");
-    QTest::addColumn<QStringList>("calls");
-    QTest::addColumn<QString>("user");
-    using Answers = QList<Auth::Answer>;
-    const QString url = u"ftp://alice@server.test/"_s;
-    const QString alice = u"alice"_s;
-    const QString bob = u"bob"_s;
-    const QString rejected = u"rejected alice"_s;
-    const auto lost = Auth::password(u"lost"_s);
-
-    QTest::newRow("right password")
-        << url << Answers{password(Sandbox::alice)} << QStringList{asked(alice), accepted} << alice;
-    QTest::newRow("wrong, then right")
-        << url << Answers{wrongPassword(), lost, password(Sandbox::alice)}
-        << QStringList{asked(alice), rejected, asked(alice), asked(alice), accepted} << alice;
-    QTest::newRow("empty, then right")
-        << url << Answers{Auth::password(QString()), lost, password(Sandbox::alice)}
-        << QStringList{asked(alice), rejected, asked(alice), asked(alice), accepted} << alice;
-    QTest::newRow("wrong twice")
-        << url
-        << Answers{wrongPassword(), lost, password(Sandbox::bob), lost, password(Sandbox::alice)}
-        << QStringList{asked(alice), rejected,     asked(alice), asked(alice),
-                       rejected,     asked(alice), asked(alice), accepted}
-        << alice;
-    QTest::newRow("changed name") << url << Answers{Auth::changeUser(bob), password(Sandbox::bob)}
-                                  << QStringList{asked(alice), asked(bob), accepted} << bob;
-    QTest::newRow("changed name after a refusal")
-        << url << Answers{wrongPassword(), Auth::changeUser(bob), password(Sandbox::bob)}
-        << QStringList{asked(alice), rejected, asked(alice), asked(bob), accepted} << bob;
-    // Of whoever has no name nothing is rejected.
-    QTest::newRow("no visitors, then a name")
-        << u"ftp://server.test/"_s << Answers{Auth::changeUser(alice), password(Sandbox::alice)}
-        << QStringList{asked(u""_s), asked(alice), accepted} << alice;
-}
-
-void RealFtpTest::logsIn()
-{
-    QFETCH(QString, url);
-    QFETCH(QList<Auth::Answer>, answers);
-    QFETCH(QStringList, calls);
-    QFETCH(QString, user);
-    auth->answers = answers;
-    const auto job = makeJob<MountFtpURLJob>(url);
-    QVERIFY(finishes(job.get()));
-    QCOMPARE(auth->calls, calls);
-    QCOMPARE(job->errorString(), QString());
-    QCOMPARE(job->error(), 0);
-    const QString account = user + u"@server.test"_s;
-    QCOMPARE(job->url(), u"ftp://%1/"_s.arg(account));
-    const QString directory = mountDir(u"/ftp/"_s + account);
-    QCOMPARE(mountDirs(), QStringList(directory));
-    QCOMPARE(job->localPath(), directory + u"//"_s);
-    QCOMPARE(recordedMounts(), QStringList(recordedMount(job->url(), directory)));
-    QCOMPARE(fileContents(job->localPath() + u"name.txt"_s), user.toLatin1());
-    QCOMPARE(directories(), QStringList(account));
+    verifyNoRclone();
 }
 
 void RealFtpTest::anonymous()

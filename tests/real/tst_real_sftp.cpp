@@ -2,8 +2,8 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "jobs/mountsftpurljob.h"
+#include "real/knownhosts.h"
 #include "real/realmounttest.h"
-#include "real/sshserver.h"
 
 #include <QDeadlineTimer>
 
@@ -15,8 +15,6 @@
 #include <unistd.h>
 
 using namespace VeyFM;
-
-Q_DECLARE_METATYPE(QList<ScriptedAuthenticator::Answer>)
 
 namespace {
 
@@ -60,8 +58,6 @@ private Q_SLOTS:
     void initTestCase();
     void init();
     void cleanup();
-    void logsIn_data();
-    void logsIn();
     void unknownKeyWithYes();
     void unknownKeyWithNo();
     void wrongPasswordBehindTheKey();
@@ -73,19 +69,6 @@ private Q_SLOTS:
     void otherPromptIsWaitedFor();
 
 private:
-    static QString knownHosts()
-    {
-        return QDir::homePath() + u"/.ssh/known_hosts"_s;
-    }
-
-    static void trust(const char* host)
-    {
-        QDir::home().mkpath(u".ssh"_s);
-        QFile file(knownHosts());
-        QVERIFY(file.open(QIODevice::Append));
-        file.write(QByteArray(host) + ' ' + SshServer::publicKey(host) + '\n');
-    }
-
     /// Everything happens inside start(). True when it said that it has ended.
     static bool starts(MountSFtpURLJob* job)
     {
@@ -127,7 +110,7 @@ void RealSftpTest::init()
 {
     SKIP_WITHOUT_SANDBOX();
     startScene();
-    trust(Sandbox::serverHost);
+    KnownHosts::add(Sandbox::serverHost);
 }
 
 void RealSftpTest::cleanup()
@@ -138,97 +121,33 @@ void RealSftpTest::cleanup()
     endScene();
     QTRY_VERIFY(processesNamed("ssh").isEmpty());
     QTRY_VERIFY(processesNamed("sshfs").isEmpty());
-    QFile::remove(knownHosts());
-}
-
-void RealSftpTest::logsIn_data()
-{
-    QTest::addColumn<QString>("url");
-    QTest::addColumn<QList<Auth::Answer>>("answers");
-    QTest::addColumn<QStringList>("calls");
-    QTest::addColumn<QString>("user");
-    using Answers = QList<Auth::Answer>;
-    const QString url = u"sftp://alice@server.test/~/"_s;
-    const QString alice = u"alice"_s;
-    const QString bob = u"bob"_s;
-    const QString rejected = u"rejected alice"_s;
-    const auto lost = Auth::password(u"lost"_s);
-
-    QTest::newRow("right password")
-        << url << Answers{password(Sandbox::alice)} << QStringList{asked(alice), accepted} << alice;
-    QTest::newRow("wrong, then right")
-        << url << Answers{wrongPassword(), lost, password(Sandbox::alice)}
-        << QStringList{asked(alice), rejected, asked(alice), asked(alice), accepted} << alice;
-    QTest::newRow("empty, then right")
-        << url << Answers{Auth::password(QString()), lost, password(Sandbox::alice)}
-        << QStringList{asked(alice), rejected, asked(alice), asked(alice), accepted} << alice;
-    QTest::newRow("wrong twice")
-        << url
-        << Answers{wrongPassword(), lost, password(Sandbox::bob), lost, password(Sandbox::alice)}
-        << QStringList{asked(alice), rejected,     asked(alice), asked(alice),
-                       rejected,     asked(alice), asked(alice), accepted}
-        << alice;
-    QTest::newRow("changed name") << url << Answers{Auth::changeUser(bob), password(Sandbox::bob)}
-                                  << QStringList{asked(alice), asked(bob), accepted} << bob;
-    QTest::newRow("changed name after a refusal")
-        << url << Answers{wrongPassword(), Auth::changeUser(bob), password(Sandbox::bob)}
-        << QStringList{asked(alice), rejected, asked(alice), asked(bob), accepted} << bob;
-    // Of whoever has no name in the URL nothing is rejected.
-    QTest::newRow("no name") << u"sftp://server.test/~/"_s
-                             << Answers{wrongPassword(), lost, password(Sandbox::tester)}
-                             << QStringList{asked(u""_s), asked(u""_s), asked(u""_s), accepted}
-                             << u"tester"_s;
-}
-
-void RealSftpTest::logsIn()
-{
-    QFETCH(QString, url);
-    QFETCH(QList<Auth::Answer>, answers);
-    QFETCH(QStringList, calls);
-    QFETCH(QString, user);
-    auth->answers = answers;
-    const auto job = makeJob<MountSFtpURLJob>(url);
-    QVERIFY(starts(job.get()));
-    QCOMPARE(auth->calls, calls);
-    QCOMPARE(job->errorString(), QString());
-    QCOMPARE(job->error(), 0);
-    const QString account = url.contains(QLatin1Char('@')) ? user + u"@"_s : QString();
-    QCOMPARE(job->url(), u"sftp://%1server.test/~/"_s.arg(account));
-    const QString directory = mountDir(u"/sftp/%1server.test~"_s.arg(account));
-    QCOMPARE(mountDirs(), QStringList(directory));
-    QCOMPARE(job->localPath(), directory + u"//"_s);
-    QCOMPARE(recordedMounts(), QStringList(recordedMount(job->url(), directory)));
-    QCOMPARE(fileContents(job->localPath() + u"name.txt"_s), user.toLatin1());
-    // Of the directories of other users none stays.
-    QCOMPARE(
-        QDir(mountDir(u"/sftp"_s)).entryList(QDir::Dirs | QDir::NoDotAndDotDot),
-        QStringList(QFileInfo(directory).fileName()));
+    KnownHosts::clear();
 }
 
 void RealSftpTest::unknownKeyWithYes()
 {
-    QFile::remove(knownHosts());
+    KnownHosts::clear();
     auth->questionAnswers = {true};
     auth->answers = {password(Sandbox::alice)};
     QVERIFY(starts(makeJob<MountSFtpURLJob>(u"sftp://alice@server.test/"_s).get()));
     QVERIFY(SshServer::fingerprint(Sandbox::serverHost).startsWith(u"SHA256:"_s));
     QCOMPARE(auth->calls, QStringList({askedForKey(), asked(u"alice"_s), accepted}));
     QCOMPARE(mountDirs(), QStringList(mountDir(u"/sftp/alice@server.test"_s)));
-    QVERIFY(QFile::exists(knownHosts()));
+    QVERIFY(QFile::exists(KnownHosts::path()));
 }
 
 void RealSftpTest::unknownKeyWithNo()
 {
-    QFile::remove(knownHosts());
+    KnownHosts::clear();
     auth->questionAnswers = {false};
     verifySilentEnd(u"sftp://alice@server.test/"_s);
     QCOMPARE(auth->calls, QStringList(askedForKey()));
-    QVERIFY(!QFile::exists(knownHosts()));
+    QVERIFY(!QFile::exists(KnownHosts::path()));
 }
 
 void RealSftpTest::wrongPasswordBehindTheKey()
 {
-    QFile::remove(knownHosts());
+    KnownHosts::clear();
     auth->questionAnswers = {true};
     auth->answers = {wrongPassword()};
     verifySilentEnd(u"sftp://alice@server.test/"_s);
@@ -330,7 +249,7 @@ void RealSftpTest::cannotConnect()
 // "(alice@other.test) Password: " is a prompt that the job does not know.
 void RealSftpTest::otherPromptIsWaitedFor()
 {
-    trust(Sandbox::otherHost);
+    KnownHosts::add(Sandbox::otherHost);
     const auto job = makeJob<MountSFtpURLJob>(u"sftp://alice@other.test/"_s);
     std::atomic<bool> prompted = false;
     std::atomic<bool> ended = false;

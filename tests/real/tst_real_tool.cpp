@@ -1,9 +1,9 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
+#include "real/knownhosts.h"
 #include "real/realftptest.h"
 #include "real/smbserver.h"
-#include "real/sshserver.h"
 #include "support/terminalsession.h"
 #include "support/toolscene.h"
 
@@ -69,14 +69,6 @@ private:
         return result;
     }
 
-    static void trust(const char* host)
-    {
-        QDir::home().mkpath(u".ssh"_s);
-        QFile file(QDir::homePath() + u"/.ssh/known_hosts"_s);
-        QVERIFY(file.open(QIODevice::WriteOnly));
-        file.write(QByteArray(host) + ' ' + SshServer::publicKey(host) + '\n');
-    }
-
     std::unique_ptr<ToolScene> m_service;
 };
 
@@ -87,7 +79,7 @@ void RealToolTest::init()
         {u"remember"_s, true},
         {u"values"_s, QJsonObject{{u"SmbBrowser.smbNetworkLocalPath"_s, sambaDir(QString())}}}});
     QVERIFY(m_service->isReady());
-    QFile::remove(QDir::homePath() + u"/.ssh/known_hosts"_s);
+    KnownHosts::clear();
 }
 
 void RealToolTest::cleanup()
@@ -158,7 +150,7 @@ void RealToolTest::keyRefused()
 
 void RealToolTest::wrongPasswords()
 {
-    trust(Sandbox::serverHost);
+    KnownHosts::add(Sandbox::serverHost);
     const auto session = onTerminal("mount sftp://alice@server.test/");
     for (int i = 1; i <= 3; ++i) {
         QVERIFY(session->waitFor("Password for alice on sftp://server.test: ", i));
@@ -174,7 +166,7 @@ void RealToolTest::wrongPasswords()
 
 void RealToolTest::otherUser()
 {
-    trust(Sandbox::serverHost);
+    KnownHosts::add(Sandbox::serverHost);
     const auto session = onTerminal("mount sftp://server.test/~/name.txt");
     QVERIFY(session->waitFor("User name for sftp://server.test [tester]: "));
     session->type("bob\n");
@@ -212,7 +204,7 @@ void RealToolTest::cannotConnect()
 void RealToolTest::morePromptsThanPasswords()
 {
     // The question of this server is none that a job knows.
-    trust(Sandbox::otherHost);
+    KnownHosts::add(Sandbox::otherHost);
     const auto session = onTerminal("mount --timeout 2 sftp://alice@other.test/");
     QCOMPARE(session->waitForEnd(), 1);
     QCOMPARE(
@@ -227,7 +219,7 @@ void RealToolTest::morePromptsThanPasswords()
 
 void RealToolTest::interrupted()
 {
-    trust(Sandbox::serverHost);
+    KnownHosts::add(Sandbox::serverHost);
     const auto session = onTerminal("mount sftp://alice@server.test/");
     QVERIFY(session->waitFor("Password for alice on sftp://server.test: "));
     QVERIFY(!processesNamed("ssh").isEmpty());
@@ -243,7 +235,7 @@ void RealToolTest::interrupted()
 
 void RealToolTest::fromDescriptor()
 {
-    trust(Sandbox::serverHost);
+    KnownHosts::add(Sandbox::serverHost);
     QProcess process;
     process.setProcessEnvironment(m_service->environment());
     process.start(

@@ -4,32 +4,8 @@
 #ifndef VEYFM_TESTS_FUSEMOUNTJOBTEST_H
 #define VEYFM_TESTS_FUSEMOUNTJOBTEST_H
 
-#include "jobs/mountftpurljob.h"
-#include "jobs/mountsftpurljob.h"
+#include "support/fusemountjob.h"
 #include "support/mountjobtest.h"
-
-#include <functional>
-
-/// A job of either protocol with its results, which the two have in common, but no class for it.
-struct FuseMountJob
-{
-    template <typename MadeJob>
-    explicit FuseMountJob(std::unique_ptr<MadeJob> made)
-        : url([job = made.get()] { return job->url(); })
-        , localPath([job = made.get()] { return job->localPath(); })
-        , job(std::move(made))
-    {
-    }
-
-    VeyFM::Job* operator->() const
-    {
-        return job.get();
-    }
-
-    std::function<QString()> url;
-    std::function<QString()> localPath;
-    std::unique_ptr<VeyFM::Job> job;
-};
 
 /// What sets the two protocols apart in the tests that they have in common.
 struct FuseProtocol
@@ -92,11 +68,9 @@ protected:
     {
     }
 
-    FuseMountJob makeMountJob(const QString& url)
+    FuseMountJob makeMountJob(const QString& url) const
     {
-        return protocol.scheme == QLatin1String("ftp")
-                   ? FuseMountJob(makeJob<VeyFM::MountFtpURLJob>(url))
-                   : FuseMountJob(makeJob<VeyFM::MountSFtpURLJob>(url));
+        return FuseMountJob::make(protocol.scheme, auth, url);
     }
 
     /// Runs a job to its end, which comes once and where the protocol has it.
