@@ -68,6 +68,16 @@ bool FuseMount::isSafe(const QString& target) const
            isHarmless(host());
 }
 
+bool FuseMount::prepareRun(const QString& target) const
+{
+    if (!isSafe(target)) {
+        removeMountDirectory();
+        return false;
+    }
+    authenticator->setResource(scheme, QString(), host(), QString());
+    return true;
+}
+
 QString FuseMount::registeredMountPath() const
 {
     return VFS::ptr()->fuseMountsManager()->mounts().value(MountPaths::mountRootUrl(url));

@@ -27,12 +27,10 @@ public:
     /// "user@host", or "host" without a user.
     QString account() const;
 
-    /**
-     * Whether user and host may be handed to a tool whose first argument is @p target. One that
-     * begins with a dash would be an option of the tool, which can run commands; a slash would
-     * leave the mount directory.
-     */
-    bool isSafe(const QString& target) const;
+    /// Tells the authenticator what it will be asked about. False, with the directory of an
+    /// earlier attempt removed, if user and host must not be handed to a tool whose first argument
+    /// is @p target.
+    bool prepareRun(const QString& target) const;
 
     /// Where the service says that the URL's root is mounted already; empty if nowhere. Its word
     /// is taken as it stands.
@@ -67,6 +65,10 @@ public:
 
 private:
     Q_DISABLE_COPY(FuseMount)
+
+    // A user or host that begins with a dash would be an option of the tool, which can run
+    // commands; a slash would leave the mount directory.
+    bool isSafe(const QString& target) const;
 
     bool m_isAsking = false;
 };

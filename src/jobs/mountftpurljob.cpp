@@ -3,9 +3,7 @@
 
 #include "jobs/mountftpurljob.h"
 
-#include "core/mountpaths.h"
-#include "jobs/fusemount_p.h"
-#include "jobs/job_p.h"
+#include "jobs/fusemountjob_p.h"
 #include "vfs/vfs.h"
 #include "vfs/vfssettings.h"
 
@@ -17,21 +15,20 @@
 
 namespace VeyFM {
 
-class MountFtpURLJobPrivate : public JobPrivate
+class MountFtpURLJobPrivate : public FuseMountJobPrivate
 {
 public:
-    MountFtpURLJobPrivate(const QString& url, QSharedPointer<Authenticator> authenticator)
-        : mount(url, std::move(authenticator))
+    using FuseMountJobPrivate::FuseMountJobPrivate;
+
+    FuseMount::Answer requestPassword(QString* password) override
     {
+        // The title says so on the very first question too.
+        return mount.requestPassword(
+            q_ptr, MountFtpURLJob::tr("Access denied"),
+            MountFtpURLJob::tr("Enter host password for user:"), password);
     }
 
-    FuseMount mount;
-    QString localPath;
     QProcess* process = nullptr; // Child of the job, and used again.
-    // Each is consumed by the end of the tool.
-    bool accessDenied = false;
-    bool restartRequested = false;
-    bool cancelled = false;
 
     // What the tool has done and nobody has looked at. An authenticator may run an event loop, so
     // the tool may speak on, and end, while a question is open: that waits for the answer.
@@ -95,12 +92,10 @@ void MountFtpURLJob::start()
 bool MountFtpURLJob::checkAlreadyMounted()
 {
     Q_D(MountFtpURLJob);
-    const QString mounted = d->mount.registeredMountPath();
-    if (mounted.isEmpty()) {
+    // The whole path, which brings a slash of its own, so that there are two.
+    if (!d->takeRegisteredMount(d->mount.url.path(QUrl::FullyDecoded))) {
         return false;
     }
-    // The path brings a slash of its own, so that there are two.
-    d->localPath = mounted + slash + d->mount.url.path(QUrl::FullyDecoded);
     finishedOk();
     return true;
 }
@@ -119,13 +114,10 @@ void MountFtpURLJob::updateMountPath()
 void MountFtpURLJob::run()
 {
     Q_D(MountFtpURLJob);
-    if (!d->mount.isSafe(d->mount.host())) {
-        d->mount.removeMountDirectory();
+    if (!d->mount.prepareRun(d->mount.host())) {
         finishedWithError(5, tr("Mounting ftp resource failed"));
         return;
     }
-    d->mount.authenticator->setResource(
-        QStringLiteral("ftp"), QString(), d->mount.host(), QString());
     updateMountPath();
 
     QStringList arguments;
@@ -200,9 +192,7 @@ void MountFtpURLJob::handleOutput(const QByteArray& output)
         return;
     }
     QString password;
-    // The title says so on the very first question too.
-    switch (d->mount.requestPassword(
-        this, tr("Access denied"), tr("Enter host password for user:"), &password)) {
+    switch (d->requestPassword(&password)) {
     case FuseMount::JobDeleted:
         break;
     case FuseMount::Cancelled:
@@ -225,46 +215,26 @@ void MountFtpURLJob::handleOutput(const QByteArray& output)
 void MountFtpURLJob::handleEnd(int exitCode)
 {
     Q_D(MountFtpURLJob);
-    if (d->cancelled) {
-        d->cancelled = false;
-        d->mount.removeMountDirectory();
-        return; // The job has finished before.
-    }
-    if (d->restartRequested) {
-        d->restartRequested = false;
-        // The new user may have a mount already.
+    switch (d->takeEnd(exitCode)) {
+    case FuseMountJobPrivate::Over:
+        break; // The job has finished before, where the user gave up at the prompt.
+    case FuseMountJobPrivate::UserChanged:
         if (!checkAlreadyMounted()) {
             run();
         }
-        return;
-    }
-    if (d->accessDenied) {
-        d->accessDenied = false;
-        // This answer goes nowhere, since the tool has ended: the new run asks again. An
-        // authenticator that remembers asks its user once.
-        QString password;
-        const FuseMount::Answer answer = d->mount.requestPassword(
-            this, tr("Access denied"), tr("Enter host password for user:"), &password);
-        if (answer == FuseMount::JobDeleted) {
-            return;
-        }
-        if (answer == FuseMount::Cancelled) {
-            d->mount.removeMountDirectory();
-            finishedWithError(2, tr("Accessing ftp resource was cancelled"));
-        } else if (answer != FuseMount::UserChanged || !checkAlreadyMounted()) {
-            run();
-        }
-        return;
-    }
-    if (exitCode != 0 && !d->mount.mountPath.isEmpty()) {
-        d->mount.removeMountDirectory();
+        break;
+    case FuseMountJobPrivate::RunAgain:
+        run();
+        break;
+    case FuseMountJobPrivate::GivenUp:
+        finishedWithError(2, tr("Accessing ftp resource was cancelled"));
+        break;
+    case FuseMountJobPrivate::Failed:
         finishedWithError(5, tr("Mounting ftp resource failed"));
-        return;
-    }
-    d->localPath = d->mount.mountPath + slash + MountPaths::mountRootRelativePath(d->mount.url);
-    d->mount.registerMount();
-    if (d->mount.credentialsAccepted(this)) {
+        break;
+    case FuseMountJobPrivate::Mounted:
         finishedOk();
+        break;
     }
 }
 

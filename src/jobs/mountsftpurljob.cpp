@@ -4,8 +4,7 @@
 #include "jobs/mountsftpurljob.h"
 
 #include "core/mountpaths.h"
-#include "jobs/fusemount_p.h"
-#include "jobs/job_p.h"
+#include "jobs/fusemountjob_p.h"
 #include "vfs/vfs.h"
 #include "vfs/vfssettings.h"
 
@@ -19,22 +18,21 @@
 
 namespace VeyFM {
 
-class MountSFtpURLJobPrivate : public JobPrivate
+class MountSFtpURLJobPrivate : public FuseMountJobPrivate
 {
 public:
-    MountSFtpURLJobPrivate(const QString& url, QSharedPointer<Authenticator> authenticator)
-        : mount(url, std::move(authenticator))
+    using FuseMountJobPrivate::FuseMountJobPrivate;
+
+    FuseMount::Answer requestPassword(QString* password) override
     {
+        // The title says so on the very first question too.
+        return mount.requestPassword(
+            q_ptr, MountSFtpURLJob::tr("Access denied"),
+            MountSFtpURLJob::tr("Enter host password for user:"), password);
     }
 
-    FuseMount mount;
-    QString localPath;
     // Made by the first run, and used again. Goes, with the tool, before the directory may.
     std::unique_ptr<VeySu::PtyProcess> process;
-    // Each is consumed by the end of the tool.
-    bool accessDenied = false;
-    bool restartRequested = false;
-    bool cancelled = false;
 };
 
 namespace {
@@ -91,11 +89,9 @@ void MountSFtpURLJob::start()
 bool MountSFtpURLJob::checkAlreadyMounted()
 {
     Q_D(MountSFtpURLJob);
-    const QString mounted = d->mount.registeredMountPath();
-    if (mounted.isEmpty()) {
+    if (!d->takeRegisteredMount(MountPaths::mountRootRelativePath(d->mount.url))) {
         return false;
     }
-    d->localPath = mounted + slash + MountPaths::mountRootRelativePath(d->mount.url);
     finishedOk();
     return true;
 }
@@ -125,13 +121,10 @@ void MountSFtpURLJob::run()
 bool MountSFtpURLJob::runOnce()
 {
     Q_D(MountSFtpURLJob);
-    if (!d->mount.isSafe(d->mount.account())) {
-        d->mount.removeMountDirectory();
+    if (!d->mount.prepareRun(d->mount.account())) {
         finishedWithError(5, tr("Mounting sftp resource failed"));
         return false;
     }
-    d->mount.authenticator->setResource(
-        QStringLiteral("sftp"), QString(), d->mount.host(), QString());
     updateMountPath();
 
     // Always the whole tree; the path below it is added to the result alone.
@@ -215,9 +208,7 @@ bool MountSFtpURLJob::answerPasswordPrompt()
 {
     Q_D(MountSFtpURLJob);
     QString password;
-    // The title says so on the very first question too.
-    switch (d->mount.requestPassword(
-        this, tr("Access denied"), tr("Enter host password for user:"), &password)) {
+    switch (d->requestPassword(&password)) {
     case FuseMount::JobDeleted:
         return false;
     case FuseMount::Cancelled:
@@ -244,42 +235,22 @@ bool MountSFtpURLJob::answerPasswordPrompt()
 bool MountSFtpURLJob::processFinished(int status)
 {
     Q_D(MountSFtpURLJob);
-    if (d->cancelled) {
-        // Silently: whoever waits for finished() goes on waiting. Callers know.
-        d->cancelled = false;
-        d->mount.removeMountDirectory();
-        return false;
-    }
-    if (d->restartRequested) {
-        d->restartRequested = false;
+    switch (d->takeEnd(status)) {
+    case FuseMountJobPrivate::Over:
+        break; // Silently: whoever waits for finished() goes on waiting. Callers know.
+    case FuseMountJobPrivate::UserChanged:
         return !checkAlreadyMounted();
-    }
-    if (d->accessDenied) {
-        d->accessDenied = false;
-        // This answer goes nowhere, since the tool has ended: the new run asks again. An
-        // authenticator that remembers asks its user once.
-        QString password;
-        const FuseMount::Answer answer = d->mount.requestPassword(
-            this, tr("Access denied"), tr("Enter host password for user:"), &password);
-        if (answer == FuseMount::JobDeleted) {
-            return false;
-        }
-        if (answer == FuseMount::Cancelled) {
-            d->mount.removeMountDirectory();
-            finishedWithError(2, tr("Accessing sftp resource was cancelled"));
-            return false;
-        }
-        return answer != FuseMount::UserChanged || !checkAlreadyMounted();
-    }
-    if (status != 0 && !d->mount.mountPath.isEmpty()) {
-        d->mount.removeMountDirectory();
+    case FuseMountJobPrivate::RunAgain:
+        return true;
+    case FuseMountJobPrivate::GivenUp:
+        finishedWithError(2, tr("Accessing sftp resource was cancelled"));
+        break;
+    case FuseMountJobPrivate::Failed:
         finishedWithError(5, tr("Mounting sftp resource failed"));
-        return false;
-    }
-    d->localPath = d->mount.mountPath + slash + MountPaths::mountRootRelativePath(d->mount.url);
-    d->mount.registerMount();
-    if (d->mount.credentialsAccepted(this)) {
+        break;
+    case FuseMountJobPrivate::Mounted:
         finishedOk();
+        break;
     }
     return false;
 }
