@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "core/fuse.h"
 #include "jobs/mountfuseentryjob.h"
 #include "jobs/mounturljob.h"
 #include "support/mountjobtest.h"
@@ -64,10 +63,7 @@ private:
 
 void MountFuseEntryJobTest::initTestCase()
 {
-    if (!Fuse::isInFuseGroup()) {
-        QSKIP("needs root, or a user in the group \"fuse\"");
-    }
-    QVERIFY2(startVfs("{}"), qPrintable(service.errorString()));
+    startVfsInGroup("{}");
 }
 
 void MountFuseEntryJobTest::init()
@@ -78,8 +74,7 @@ void MountFuseEntryJobTest::init()
 
 void MountFuseEntryJobTest::cleanup()
 {
-    checkScene();
-    QDir(mountDir(QString())).removeRecursively();
+    endScene();
 }
 
 void MountFuseEntryJobTest::rootIsMounted_data()
@@ -104,9 +99,7 @@ void MountFuseEntryJobTest::rootIsMounted()
     QFETCH(QString, path);
     setNetworkMounts({{key, QJsonArray{u"SFTP/m"_s, u"/mnt"_s, int(TypeSFtpSharePlace)}}});
     const auto job = makeJob<MountFuseEntryJob>(url);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 0);
     QCOMPARE(job->path(), path);
     QVERIFY(!job->findChild<MountURLJob*>());
@@ -130,9 +123,7 @@ void MountFuseEntryJobTest::urlIsMountedByNow()
     setNetworkMounts({{url, QJsonArray{u"SFTP/m"_s, u"/mnt"_s, int(TypeSFtpSharePlace)}}});
     tool->expect({});
     const auto job = makeJob<MountFuseEntryJob>(url);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 0);
     QCOMPARE(job->path(), path);
     QCOMPARE(registrations(), QStringList());
@@ -278,9 +269,7 @@ void MountFuseEntryJobTest::smbMakesNoEntry()
     service->setValue(u"SmbBrowser.smbNetworkLocalPath"_s, u"/net"_s);
     tool->expect({"out Total number of bytes: 1\\n"});
     const auto job = makeJob<MountFuseEntryJob>(u"smb://localhost/share"_s);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 1);
     QCOMPARE(job->errorString(), u"Can't create entry for url"_s);
     QCOMPARE(registrations(), QStringList());
@@ -312,9 +301,7 @@ void MountFuseEntryJobTest::errorsPassThrough()
         auth->answers = {Auth::cancel()};
     }
     const auto job = makeJob<MountFuseEntryJob>(url);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), code);
     QCOMPARE(job->errorString(), error);
     QCOMPARE(registrations(), QStringList());
@@ -340,12 +327,8 @@ void MountFuseEntryJobTest::outsideTheGroup()
         {{u"sftp://mounted/"_s, QJsonArray{u"SFTP/m"_s, u"/mnt"_s, int(TypeSFtpSharePlace)}}});
     const auto job = makeJob<MountFuseEntryJob>(url);
     QSignalSpy finished(job.get(), &Job::finished);
-    {
-        const OutsideGroup outside;
-        if (Fuse::isInFuseGroup()) {
-            QSKIP("can't leave the group \"fuse\"");
-        }
-        job->start();
+    if (!startOutsideGroup(job.get())) {
+        QSKIP("can't leave the group \"fuse\"");
     }
     QCOMPARE(finished.count(), 1);
     QCOMPARE(job->error(), 2);

@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "core/fuse.h"
 #include "jobs/checksmbshareauthjob.h"
 #include "jobs/mountftpurljob.h"
 #include "jobs/mountfuseentryjob.h"
@@ -63,16 +62,12 @@ private:
 
 void MountJobLifetimeTest::initTestCase()
 {
-    if (!Fuse::isInFuseGroup()) {
-        QSKIP("needs root, or a user in the group \"fuse\"");
-    }
-    QVERIFY2(startVfs("{}"), qPrintable(service.errorString()));
+    startVfsInGroup("{}");
 }
 
 void MountJobLifetimeTest::cleanup()
 {
-    checkScene();
-    QDir(mountDir(QString())).removeRecursively();
+    endScene();
 }
 
 void MountJobLifetimeTest::jobIsDeletedDuringAQuestion_data()

@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "core/fuse.h"
 #include "jobs/mounturljob.h"
 #include "support/mountjobtest.h"
 
@@ -70,18 +69,12 @@ private:
 
 void MountSecretsTest::initTestCase()
 {
-    if (!Fuse::isInFuseGroup()) {
-        QSKIP("needs root, or a user in the group \"fuse\"");
-    }
-    QVERIFY2(
-        startVfs(R"({"values": {"SmbBrowser.smbNetworkLocalPath": "/net"}})"),
-        qPrintable(service.errorString()));
+    startVfsInGroup(R"({"values": {"SmbBrowser.smbNetworkLocalPath": "/net"}})");
 }
 
 void MountSecretsTest::cleanup()
 {
-    checkScene();
-    QDir(mountDir(QString())).removeRecursively();
+    endScene();
 }
 
 void MountSecretsTest::passwordReachesTheToolAlone_data()

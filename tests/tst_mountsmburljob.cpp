@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "core/fuse.h"
 #include "jobs/mountsmburljob.h"
 #include "support/mountjobtest.h"
 #include "support/outsidegroup.h"
@@ -41,10 +40,7 @@ private Q_SLOTS:
 
 void MountSmbURLJobTest::initTestCase()
 {
-    if (!Fuse::isInFuseGroup()) {
-        QSKIP("needs root, or a user in the group \"fuse\"");
-    }
-    QVERIFY2(startVfs("{}"), qPrintable(service.errorString()));
+    startVfsInGroup("{}");
 }
 
 void MountSmbURLJobTest::init()
@@ -56,7 +52,7 @@ void MountSmbURLJobTest::init()
 
 void MountSmbURLJobTest::cleanup()
 {
-    checkScene();
+    endScene();
 }
 
 void MountSmbURLJobTest::refusedUrls_data()
@@ -88,9 +84,7 @@ void MountSmbURLJobTest::refusedUrls()
     QFETCH(QString, url);
     QFETCH(QString, error);
     const auto job = makeJob<MountSmbURLJob>(url);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 5);
     QCOMPARE(job->errorString(), error);
     QCOMPARE(job->url(), url);
@@ -131,9 +125,7 @@ void MountSmbURLJobTest::path()
     tool->expect(noTicket);
     tool->expect(listed);
     const auto job = makeJob<MountSmbURLJob>(url);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 0);
     QCOMPARE(job->localPath(), path);
     QCOMPARE(job->url(), url);
@@ -157,9 +149,7 @@ void MountSmbURLJobTest::errorsOfTheCheckPassThrough()
     tool->expect(denied);
     auth->answers = {Auth::cancel(), Auth::cancel()};
     const auto job = makeJob<MountSmbURLJob>(u"smb://LOCALHOST/share"_s);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 2);
     QCOMPARE(job->errorString(), u"Login cancelled"_s);
     QVERIFY(job->localPath().isEmpty());
@@ -179,9 +169,7 @@ void MountSmbURLJobTest::noNetworkPath()
     service->setRules(networkPath, array(rule));
     tool->expect(listed);
     const auto job = makeJob<MountSmbURLJob>(u"smb://LOCALHOST/share"_s);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 5);
     QCOMPARE(job->errorString(), u"Can't get local path for samba network"_s);
     QVERIFY(job->localPath().isEmpty());
@@ -200,12 +188,8 @@ void MountSmbURLJobTest::checkIsAChildThatGoes()
 void MountSmbURLJobTest::outsideTheGroup()
 {
     const auto job = makeJob<MountSmbURLJob>(u"smb://LOCALHOST/share"_s);
-    {
-        const OutsideGroup outside;
-        if (Fuse::isInFuseGroup()) {
-            QSKIP("can't leave the group \"fuse\"");
-        }
-        job->start();
+    if (!startOutsideGroup(job.get())) {
+        QSKIP("can't leave the group \"fuse\"");
     }
     QCOMPARE(job->error(), 4);
     QCOMPARE(job->errorString(), u"You must be in 'fuse' group in order to browse samba shares!"_s);

@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "core/fuse.h"
 #include "jobs/mountftpurljob.h"
 #include "jobs/mountsftpurljob.h"
 #include "jobs/mountsmburljob.h"
@@ -43,18 +42,12 @@ private Q_SLOTS:
 
 void MountURLJobTest::initTestCase()
 {
-    if (!Fuse::isInFuseGroup()) {
-        QSKIP("needs root, or a user in the group \"fuse\"");
-    }
-    QVERIFY2(
-        startVfs(R"({"values": {"SmbBrowser.smbNetworkLocalPath": "/net"}})"),
-        qPrintable(service.errorString()));
+    startVfsInGroup(R"({"values": {"SmbBrowser.smbNetworkLocalPath": "/net"}})");
 }
 
 void MountURLJobTest::cleanup()
 {
-    checkScene();
-    QDir(mountDir(QString())).removeRecursively();
+    endScene();
 }
 
 void MountURLJobTest::unsupported_data()
@@ -72,9 +65,7 @@ void MountURLJobTest::unsupported()
     QFETCH(QString, url);
     startScene("sshfs");
     const auto job = makeJob<MountURLJob>(url);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 5);
     QCOMPARE(job->errorString(), u"This network protocol is not supported"_s);
     QCOMPARE(job->url(), url);
@@ -89,9 +80,7 @@ void MountURLJobTest::smbEndsInStart()
     tool->expect(listed);
     const QString url = u"smb://WG;bob@localhost/share/a%20b"_s;
     const auto job = makeJob<MountURLJob>(url);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 0);
     QCOMPARE(job->url(), url);
     QCOMPARE(job->localPath(), u"/net/localhost/share/a%20b"_s);
@@ -104,9 +93,7 @@ void MountURLJobTest::sftpEndsInStart()
     tool->expect(asks);
     auth->answers = {Auth::password(u"x"_s)};
     const auto job = makeJob<MountURLJob>(u"sftp://host/a"_s);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 0);
     QCOMPARE(job->localPath(), mountDir(u"/sftp/host//a"_s));
     QVERIFY(job->findChild<MountSFtpURLJob*>());
@@ -204,12 +191,8 @@ void MountURLJobTest::smbOutsideTheGroup()
     startScene("smbclient");
     const auto job = makeJob<MountURLJob>(u"smb://localhost/share"_s);
     QSignalSpy finished(job.get(), &Job::finished);
-    {
-        const OutsideGroup outside;
-        if (Fuse::isInFuseGroup()) {
-            QSKIP("can't leave the group \"fuse\"");
-        }
-        job->start();
+    if (!startOutsideGroup(job.get())) {
+        QSKIP("can't leave the group \"fuse\"");
     }
     QCOMPARE(finished.count(), 1);
     QCOMPARE(job->error(), 4);

@@ -137,8 +137,7 @@ void UpdateJobsTest::init()
 
 void UpdateJobsTest::cleanup()
 {
-    checkScene();
-    QDir(mountDir(QString())).removeRecursively();
+    endScene();
 }
 
 void UpdateJobsTest::noBookmark_data()
@@ -154,9 +153,7 @@ void UpdateJobsTest::noBookmark()
     QFETCH(QString, path);
     const Entry entry = path.isEmpty() ? Entry() : place(path);
     const auto job = makePlaceJob(entry);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 5);
     QCOMPARE(job->errorString(), u"Can't find entry for network place"_s);
     QCOMPARE(job->netPlaceEntry(), entry);
@@ -165,9 +162,7 @@ void UpdateJobsTest::noBookmark()
 void UpdateJobsTest::bookmarkWithALocalPath()
 {
     const auto job = makePlaceJob(place(u"Network/Mounted"_s));
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 0);
     QVERIFY(job->children().isEmpty());
     QCOMPARE(service->takeCalls(), QStringList());
@@ -278,9 +273,7 @@ void UpdateJobsTest::bookmarkErrorsPassThrough()
         auth->answers.append(Auth::cancel());
     }
     const auto job = makePlaceJob(place(path));
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), code);
     QCOMPARE(job->errorString(), error);
     QCOMPARE(service->takeCalls(), QStringList());
@@ -290,12 +283,8 @@ void UpdateJobsTest::bookmarkOutsideTheGroup()
 {
     const auto job = makePlaceJob(place(u"Network/Smb"_s));
     QSignalSpy finished(job.get(), &Job::finished);
-    {
-        const OutsideGroup outside;
-        if (Fuse::isInFuseGroup()) {
-            QSKIP("can't leave the group \"fuse\"");
-        }
-        job->start();
+    if (!startOutsideGroup(job.get())) {
+        QSKIP("can't leave the group \"fuse\"");
     }
     QCOMPARE(finished.count(), 1);
     QCOMPARE(job->error(), 4);
@@ -327,9 +316,7 @@ void UpdateJobsTest::noSambaEntry()
     QFETCH(QString, path);
     const Entry entry = path.isEmpty() ? Entry() : place(path);
     const auto job = makeSmbJob(entry);
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 1);
     QCOMPARE(job->errorString(), u"Not a samba entry"_s);
     QCOMPARE(job->smbEntry(), entry);
@@ -445,9 +432,7 @@ void UpdateJobsTest::shareWithALocalPath()
 {
     const auto job = makeSmbJob(
         makeEntry(u"Samba/WG/localhost/home"_s, u"/mnt/home"_s, int(TypeSambaSharePlace)));
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 0);
     QCOMPARE(service->takeCalls(), QStringList());
     QVERIFY(auth->protocol().isEmpty());
@@ -495,9 +480,7 @@ void UpdateJobsTest::shareErrorsPassThrough()
     tool->expect(denied);
     auth->answers = {Auth::cancel(), Auth::cancel()};
     const auto job = makeSmbJob(place(u"Samba/WG/localhost/pub"_s));
-    QSignalSpy finished(job.get(), &Job::finished);
-    job->start();
-    QCOMPARE(finished.count(), 1);
+    startToEnd(job.get());
     QCOMPARE(job->error(), 2);
     QCOMPARE(job->errorString(), u"Login cancelled"_s);
     QCOMPARE(service->takeCalls(), QStringList());
@@ -509,12 +492,8 @@ void UpdateJobsTest::shareOutsideTheGroup()
 {
     const auto job = makeSmbJob(place(u"Samba/WG/localhost/pub"_s));
     QSignalSpy finished(job.get(), &Job::finished);
-    {
-        const OutsideGroup outside;
-        if (Fuse::isInFuseGroup()) {
-            QSKIP("can't leave the group \"fuse\"");
-        }
-        job->start();
+    if (!startOutsideGroup(job.get())) {
+        QSKIP("can't leave the group \"fuse\"");
     }
     QCOMPARE(finished.count(), 1);
     QCOMPARE(job->error(), 4);

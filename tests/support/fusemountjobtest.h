@@ -128,8 +128,7 @@ private Q_SLOTS:
     }
     void cleanup()
     {
-        checkScene();
-        QDir(mountDir(QString())).removeRecursively();
+        endScene();
     }
     void cleanupTestCase()
     {

@@ -4,6 +4,7 @@
 #ifndef VEYFM_TESTS_MOUNTJOBTEST_H
 #define VEYFM_TESTS_MOUNTJOBTEST_H
 
+#include "core/fuse.h"
 #include "jobs/job.h"
 #include "support/scriptedauthenticator.h"
 #include "support/standin.h"
@@ -21,6 +22,15 @@ class MountJobTest : public VfsTest
 protected:
     using Auth = ScriptedAuthenticator;
 
+    /// For initTestCase(), as its last act: without the group "fuse" all tests are skipped.
+    void startVfsInGroup(const QByteArray& script)
+    {
+        if (!VeyFM::Fuse::isInFuseGroup()) {
+            QSKIP("needs root, or a user in the group \"fuse\"");
+        }
+        QVERIFY2(startVfs(script), qPrintable(service.errorString()));
+    }
+
     /// For init() of each test.
     void startScene(const QByteArray& toolName)
     {
@@ -33,9 +43,10 @@ protected:
     }
 
     /// For cleanup() of each test: every run that was expected came, and no other, and every
-    /// answer was asked for.
-    void checkScene()
+    /// answer was asked for. What was made below the root of all mounts goes.
+    void endScene()
     {
+        QDir(mountDir(QString())).removeRecursively();
         QCOMPARE(tool->runs(), tool->expected());
         QVERIFY(auth->answers.isEmpty());
         QVERIFY(auth->questionAnswers.isEmpty());

@@ -4,6 +4,9 @@
 #ifndef VEYFM_TESTS_OUTSIDEGROUP_H
 #define VEYFM_TESTS_OUTSIDEGROUP_H
 
+#include "core/fuse.h"
+#include "jobs/job.h"
+
 #include <QtGlobal>
 
 #include <cerrno>
@@ -53,5 +56,16 @@ private:
     const bool m_wasRoot = geteuid() == 0;
     std::vector<gid_t> m_groups;
 };
+
+/// Starts a job outside the group "fuse"; false where that can't be left.
+inline bool startOutsideGroup(VeyFM::Job* job)
+{
+    const OutsideGroup outside;
+    if (VeyFM::Fuse::isInFuseGroup()) {
+        return false;
+    }
+    job->start();
+    return true;
+}
 
 #endif
