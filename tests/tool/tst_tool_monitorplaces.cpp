@@ -16,7 +16,8 @@ const QString storage = QStringLiteral("StoragePlacesManager");
 class Monitor
 {
 public:
-    Monitor(const ToolScene& scene, const QStringList& arguments)
+    Monitor(ToolScene& scene, const QStringList& arguments)
+        : m_scene(scene)
     {
         m_process.setProcessEnvironment(scene.environment());
         m_process.start(toolPath(), QStringList(QStringLiteral("monitor")) + arguments);
@@ -26,6 +27,13 @@ public:
     {
         m_process.kill();
         m_process.waitForFinished();
+    }
+
+    /// Whether the service is asked something. The place is opened so; from then on there are news.
+    bool hasAsked(const char* call)
+    {
+        return QTest::qWaitFor(
+            [&] { return m_scene.service().calls().contains(QLatin1String(call)); }, 20000);
     }
 
     QByteArray nextLine()
@@ -51,6 +59,7 @@ public:
     }
 
 private:
+    ToolScene& m_scene;
     QProcess m_process;
 };
 
@@ -77,11 +86,7 @@ void ToolMonitorPlacesTest::devices()
     QVERIFY(scene.isReady());
     scene.service().takeCalls();
     Monitor monitor(scene, {QStringLiteral("Storage devices")});
-    // The place is opened first; from then on there are news.
-    QTRY_VERIFY_WITH_TIMEOUT(
-        scene.service().calls().contains(
-            QStringLiteral("StoragePlacesManager.availableStoragePlaces[]")),
-        20000);
+    QVERIFY(monitor.hasAsked("StoragePlacesManager.availableStoragePlaces[]"));
     const QString udi = QStringLiteral("/udi/1");
     const QString name = QStringLiteral("sdb1");
     scene.service().emitSignal(
@@ -118,10 +123,7 @@ void ToolMonitorPlacesTest::devicesJson()
         QJsonArray{deviceRecord(name, 3, udi)}));
     QVERIFY(scene.isReady());
     Monitor monitor(scene, {QStringLiteral("--json"), QStringLiteral("Storage devices")});
-    QTRY_VERIFY_WITH_TIMEOUT(
-        scene.service().calls().contains(
-            QStringLiteral("StoragePlacesManager.availableStoragePlaces[]")),
-        20000);
+    QVERIFY(monitor.hasAsked("StoragePlacesManager.availableStoragePlaces[]"));
     scene.service().emitSignal(
         storage, QStringLiteral("storagePlaceUpdated"),
         oneArgument(deviceRecord(name, 3, udi, QStringLiteral("/tmp"))));
@@ -141,9 +143,7 @@ void ToolMonitorPlacesTest::favourites()
     QVERIFY(scene.isReady());
     scene.service().takeCalls();
     Monitor monitor(scene, {QStringLiteral("Favourites")});
-    QTRY_VERIFY_WITH_TIMEOUT(
-        scene.service().calls().contains(QStringLiteral("NetworkPlacesManager.networkPlaces[]")),
-        20000);
+    QVERIFY(monitor.hasAsked("NetworkPlacesManager.networkPlaces[]"));
     QCOMPARE(scene.run("bookmark add /usr").exitCode, 0);
     QCOMPARE(monitor.nextLine(), QByteArray("created     Favourites/usr\n"));
     scene.service().setValue(
@@ -160,9 +160,7 @@ void ToolMonitorPlacesTest::networkBookmarks()
     QVERIFY(scene.isReady());
     scene.service().takeCalls();
     Monitor monitor(scene, {QStringLiteral("Network")});
-    QTRY_VERIFY_WITH_TIMEOUT(
-        scene.service().calls().contains(QStringLiteral("NetworkPlacesManager.networkPlaces[]")),
-        20000);
+    QVERIFY(monitor.hasAsked("NetworkPlacesManager.networkPlaces[]"));
     const QString manager = QStringLiteral("NetworkPlacesManager");
     const QString name = QStringLiteral("work");
     const QString url = QStringLiteral("sftp://host");
@@ -188,9 +186,7 @@ void ToolMonitorPlacesTest::mounts()
     QVERIFY(scene.isReady());
     scene.service().takeCalls();
     Monitor monitor(scene, {QStringLiteral("Network")});
-    QTRY_VERIFY_WITH_TIMEOUT(
-        scene.service().calls().contains(QStringLiteral("NetworkPlacesManager.networkPlaces[]")),
-        20000);
+    QVERIFY(monitor.hasAsked("NetworkPlacesManager.networkPlaces[]"));
     const QString manager = QStringLiteral("NetworkMountsManager");
     scene.service().emitSignal(
         manager, QStringLiteral("mountAdded"),
@@ -219,9 +215,7 @@ void ToolMonitorPlacesTest::samba()
     Monitor monitor(
         scene,
         {QStringLiteral("Samba"), QStringLiteral("Samba/WG"), QStringLiteral("Samba/WG/HOST")});
-    QTRY_VERIFY_WITH_TIMEOUT(
-        scene.service().calls().contains(QStringLiteral("SmbBrowser.shares[\"HOST\",\"WG\"]")),
-        20000);
+    QVERIFY(monitor.hasAsked("SmbBrowser.shares[\"HOST\",\"WG\"]"));
     const QString smb = QStringLiteral("SmbBrowser");
     scene.service().setValue(
         QStringLiteral("SmbBrowser.workgroups"),
@@ -253,9 +247,7 @@ void ToolMonitorPlacesTest::onlyWhatWasAskedFor()
     QVERIFY(scene.isReady());
     scene.service().takeCalls();
     Monitor monitor(scene, {QStringLiteral("Network")});
-    QTRY_VERIFY_WITH_TIMEOUT(
-        scene.service().calls().contains(QStringLiteral("NetworkPlacesManager.networkPlaces[]")),
-        20000);
+    QVERIFY(monitor.hasAsked("NetworkPlacesManager.networkPlaces[]"));
     scene.service().emitSignal(
         QStringLiteral("FavouritePlacesManager"), QStringLiteral("favouritePlaceAdded"),
         oneArgument(QJsonArray{QStringLiteral("usr"), QStringLiteral("/usr")}));
