@@ -12,6 +12,24 @@
 
 using VeyFM::InotifyWatcher;
 
+namespace {
+
+// Watches "dir", and in it "link" to "target".
+bool watchLinkInDirectory(WatchScene& scene)
+{
+    return scene.makeDir("dir") && scene.makeDir("target") &&
+           scene.makeLink("target", "dir/link") && scene.add("dir") && scene.add("dir/link");
+}
+
+// Watches "link1" and "link2" to "target", whose directory nobody watches.
+bool watchTwoLinks(WatchScene& scene)
+{
+    return scene.makeDir("target") && scene.makeLink("target", "link1") &&
+           scene.makeLink("target", "link2") && scene.add("link1") && scene.add("link2");
+}
+
+} // namespace
+
 // What becomes of a watched link that is deleted. Calling notifyDeletedSymlinks() by hand ends
 // the wait at once.
 class TestInotifyWatcherGrace : public QObject
@@ -67,9 +85,7 @@ void TestInotifyWatcherGrace::recreatedLink()
 void TestInotifyWatcherGrace::recreatedAsFile()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("dir") && scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "dir/link"));
-    QVERIFY(scene.add("dir") && scene.add("dir/link"));
+    QVERIFY(watchLinkInDirectory(scene));
     QVERIFY(scene.unlink("dir/link"));
     QCOMPARE(scene.processedLogWithoutAttributes(), QStringList());
     QVERIFY(scene.makeDir("dir/link"));
@@ -83,9 +99,7 @@ void TestInotifyWatcherGrace::recreatedAsFile()
 void TestInotifyWatcherGrace::deletedLink()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("dir") && scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "dir/link"));
-    QVERIFY(scene.add("dir") && scene.add("dir/link"));
+    QVERIFY(watchLinkInDirectory(scene));
     QSignalSpy unregistered(scene.watcher.get(), &InotifyWatcher::pathUnregistered);
     QVERIFY(scene.unlink("dir/link"));
     QElapsedTimer elapsed;
@@ -122,9 +136,7 @@ void TestInotifyWatcherGrace::deletedLinkWithoutDirectory()
 void TestInotifyWatcherGrace::allToldBeforeForgotten()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "link1") && scene.makeLink("target", "link2"));
-    QVERIFY(scene.add("link1") && scene.add("link2"));
+    QVERIFY(watchTwoLinks(scene));
     QVERIFY(scene.unlink("link1") && scene.unlink("link2"));
     QCOMPARE(scene.processedLogWithoutAttributes(), QStringList());
     QVERIFY(scene.call("notifyDeletedSymlinks"));
@@ -154,9 +166,7 @@ void TestInotifyWatcherGrace::linkOfDeletedLink()
 void TestInotifyWatcherGrace::movedLink()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("dir") && scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "dir/link"));
-    QVERIFY(scene.add("dir") && scene.add("dir/link"));
+    QVERIFY(watchLinkInDirectory(scene));
     QVERIFY(scene.rename("dir/link", "elsewhere"));
     QCOMPARE(scene.processedLog(), lines({"deleted dir|link", "deleted dir/link|"}));
     QVERIFY(!scene.isRegistered("dir/link"));
@@ -168,9 +178,7 @@ void TestInotifyWatcherGrace::movedLink()
 void TestInotifyWatcherGrace::linkMovedInDuringGrace()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("dir") && scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "dir/link") && scene.makeLink("target", "spare"));
-    QVERIFY(scene.add("dir") && scene.add("dir/link"));
+    QVERIFY(watchLinkInDirectory(scene) && scene.makeLink("target", "spare"));
     QVERIFY(scene.unlink("dir/link"));
     QCOMPARE(scene.processedLogWithoutAttributes(), QStringList());
     // Only a link that is created ends the wait, so it is declared dead all the same.
@@ -183,9 +191,7 @@ void TestInotifyWatcherGrace::linkMovedInDuringGrace()
 void TestInotifyWatcherGrace::overwrittenLink()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("dir") && scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "dir/link") && scene.makeLink("target", "spare"));
-    QVERIFY(scene.add("dir") && scene.add("dir/link"));
+    QVERIFY(watchLinkInDirectory(scene) && scene.makeLink("target", "spare"));
     // The directory tells of an arrival, the overwritten link of its own end.
     QVERIFY(scene.rename("spare", "dir/link"));
     QCOMPARE(scene.processedLogWithoutAttributes(), lines({"created dir|link"}));
@@ -236,9 +242,7 @@ void TestInotifyWatcherGrace::clearDuringGrace()
 void TestInotifyWatcherGrace::firstTimerSettlesAll()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "link1") && scene.makeLink("target", "link2"));
-    QVERIFY(scene.add("link1") && scene.add("link2"));
+    QVERIFY(watchTwoLinks(scene));
     QVERIFY(scene.unlink("link1"));
     QCOMPARE(scene.processedLogWithoutAttributes(), QStringList());
     QVERIFY(scene.unlink("link2"));
@@ -252,9 +256,7 @@ void TestInotifyWatcherGrace::firstTimerSettlesAll()
 void TestInotifyWatcherGrace::everyRunStartsTimer()
 {
     WatchScene scene;
-    QVERIFY(scene.makeDir("target"));
-    QVERIFY(scene.makeLink("target", "link1") && scene.makeLink("target", "link2"));
-    QVERIFY(scene.add("link1") && scene.add("link2"));
+    QVERIFY(watchTwoLinks(scene));
     QVERIFY(scene.unlink("link1"));
     QCOMPARE(scene.processedLogWithoutAttributes(), QStringList());
 
