@@ -55,9 +55,11 @@ void MountFtpURLJobQuestionsTest::addConversations()
     QTest::newRow("asked twice in one run")
         << bob << Runs{{prompt, "read", prompt, "read"}} << Answers{Auth::password(u"x"_s), right}
         << QStringList{askBob, askBob, u"accepted"_s} << bob << QByteArray("x\nright\n");
+    // Two words make a refusal, whatever else is said.
     QTest::newRow("refused twice in one run")
-        << bob << Runs{{ftp.refusal, "drained", ftp.refusal, "exit 1"}, {}} << Answers{right}
-        << QStringList{rejected, rejected, askBob, u"accepted"_s} << bob << QByteArray();
+        << bob << Runs{{ftp.refusal, "drained", "err Access denied", "exit 1"}, {}}
+        << Answers{right} << QStringList{rejected, rejected, askBob, u"accepted"_s} << bob
+        << QByteArray();
     // The question wins where both come in one read, so that no refusal is seen.
     QTest::newRow("refusal and question at once")
         << bob << Runs{{"err Access denied\\nEnter host password for user:", "read"}}
