@@ -30,7 +30,6 @@ private Q_SLOTS:
     void terminalBesidePipes();
     void echoComesBack_data();
     void echoComesBack();
-    void goesOnAfterStop();
     void showsThatItWaits();
 };
 
@@ -373,25 +372,6 @@ void ToolMountTerminalTest::echoComesBack()
     session.type(keys);
     QVERIFY2(session.waitFor("end\n"), session.output().constData());
     QVERIFY2(session.output().contains(" echo "), session.output().constData());
-}
-
-void ToolMountTerminalTest::goesOnAfterStop()
-{
-    MountScene scene("sshfs");
-    scene.tool.expect(Said::sshPassword() + Said::success());
-    TerminalSession session(
-        QStringLiteral("/bin/dash"),
-        {QStringLiteral("-mc"), QStringLiteral("\"$0\" mount sftp://me@host/; echo stopped; fg"),
-         toolPath()},
-        QDir::rootPath(), scene.environment(), 200);
-    QVERIFY(session.waitFor("Password for me on sftp://host: "));
-    session.type("\032");
-    QVERIFY2(session.waitFor("stopped\n"), session.output().constData());
-    QVERIFY(session.waitFor("Password for me on sftp://host: ", 2));
-    session.type("geheim\n");
-    QCOMPARE(session.waitForEnd(), 0);
-    QCOMPARE(scene.tool.input(1), QByteArray("geheim\n"));
-    QVERIFY(!session.output().contains("geheim"));
 }
 
 void ToolMountTerminalTest::showsThatItWaits()

@@ -9,12 +9,14 @@
 
 #include <array>
 #include <cerrno>
+#include <chrono>
 #include <fcntl.h>
 #include <mutex>
 #include <poll.h>
 #include <signal.h>
 #include <sys/eventfd.h>
 #include <termios.h>
+#include <thread>
 #include <unistd.h>
 
 namespace VeyFM {
@@ -22,9 +24,14 @@ namespace Tool {
 
 namespace {
 
-// Signals that stop or end the program, which would leave the terminal without its echo. Those
-// that the program ends on by itself come back as cancel().
-constexpr std::array<int, 2> watchedSignals = {SIGTSTP, SIGQUIT};
+// Signals that stop or end the program, which would leave the terminal without its echo, and the
+// one that comes when it goes on after a stop that can't be seen, with other modes of the terminal
+// perhaps. Those that the program ends on by itself come back as cancel().
+constexpr std::array<int, 3> watchedSignals = {SIGTSTP, SIGQUIT, SIGCONT};
+
+// A stop without effect is tried again so often, at this pace.
+constexpr int mostStops = 20;
+constexpr std::chrono::milliseconds pace(100);
 
 // All that the handler touches.
 std::atomic<int> pendingSignal{0};
@@ -42,7 +49,10 @@ void wake(int descriptor)
 void noteSignal(int number)
 {
     const int error = errno;
-    pendingSignal = number;
+    // SIGCONT comes along with others, and says the least.
+    int none = 0;
+    if (!pendingSignal.compare_exchange_strong(none, number) && number != SIGCONT)
+        pendingSignal = number;
     wake(wakeDescriptor);
     errno = error;
 }
@@ -76,50 +86,73 @@ private:
     std::array<struct sigaction, watchedSignals.size()> m_before = {};
 };
 
+/// Whether the terminal is for this program now, and not for the shell that has started it.
+bool isInForeground(int terminal)
+{
+    return ::tcgetpgrp(terminal) == ::getpgrp();
+}
+
 class HiddenInput;
 
 std::mutex hiddenLock; // For what follows.
-const HiddenInput* hiddenInput = nullptr;
+HiddenInput* hiddenInput = nullptr;
 
-/// The terminal without its echo, as long as the object lives.
+/**
+ * The terminal without its echo, between hide() and putBack().
+ *
+ * In the background its modes are those of another program: they are neither read nor changed,
+ * which would stop this one.
+ */
 class HiddenInput
 {
 public:
     explicit HiddenInput(int terminal)
         : m_terminal(terminal)
-        , m_changed(::tcgetattr(terminal, &m_before) == 0)
     {
-        if (!m_changed)
-            return;
         const std::lock_guard<std::mutex> lock(hiddenLock);
-        termios hidden = m_before;
-        hidden.c_lflag &= ~tcflag_t(ECHO | ECHOE | ECHOK | ECHONL);
-        m_changed = ::tcsetattr(terminal, TCSAFLUSH, &hidden) == 0;
         hiddenInput = this;
     }
     ~HiddenInput()
     {
         const std::lock_guard<std::mutex> lock(hiddenLock);
         hiddenInput = nullptr;
-        putBack();
     }
     HiddenInput(const HiddenInput&) = delete;
     HiddenInput& operator=(const HiddenInput&) = delete;
 
-    bool isHidden() const
+    bool hide()
     {
-        return m_changed;
+        const std::lock_guard<std::mutex> lock(hiddenLock);
+        // Where they could not be put back, the terminal may still have those without an echo.
+        if (!m_isOwed && ::tcgetattr(m_terminal, &m_before) != 0)
+            return false;
+        termios hidden = m_before;
+        hidden.c_lflag &= ~tcflag_t(ECHO | ECHOE | ECHOK | ECHONL);
+        m_isOwed = true;
+        return ::tcsetattr(m_terminal, TCSAFLUSH, &hidden) == 0;
     }
-    void putBack() const
+    void putBack()
     {
-        if (m_changed)
-            ::tcsetattr(m_terminal, TCSAFLUSH, &m_before);
+        const std::lock_guard<std::mutex> lock(hiddenLock);
+        putBackLocked();
+    }
+    static void putBackFromElsewhere()
+    {
+        const std::lock_guard<std::mutex> lock(hiddenLock);
+        if (hiddenInput)
+            hiddenInput->putBackLocked();
     }
 
 private:
+    void putBackLocked()
+    {
+        if (m_isOwed && isInForeground(m_terminal))
+            m_isOwed = ::tcsetattr(m_terminal, TCSAFLUSH, &m_before) != 0;
+    }
+
     const int m_terminal;
     termios m_before = {};
-    bool m_changed;
+    bool m_isOwed = false; ///< m_before, to the terminal.
 };
 
 void writeAll(int descriptor, const QByteArray& bytes)
@@ -170,25 +203,45 @@ void Prompt::show(const QString& lines)
 bool Prompt::ask(const QString& question, Echo echo, Secret& answer)
 {
     const QByteArray bytes = escaped(question).toLocal8Bit();
-    while (true) {
-        int signalNumber = 0;
+    HiddenInput input(m_terminal);
+    while (waitForForeground()) {
         bool answered = false;
         {
             const SignalWatch signals(m_wake);
-            const HiddenInput hidden(echo == Hidden ? m_terminal : -1);
-            if (echo == Hidden && !hidden.isHidden())
+            if (echo == Hidden && !input.hide())
                 return false;
             writeAll(m_terminal, bytes);
             answered = readLine(m_terminal, answer);
-            signalNumber = pendingSignal;
             if (echo == Hidden || !answered)
                 writeAll(m_terminal, QByteArrayLiteral("\n"));
+            input.putBack();
         }
-        if (signalNumber == 0)
-            return answered;
+        const int signalNumber = pendingSignal;
         // Now for real. What was stopped goes on here, with the question again.
-        ::raise(signalNumber);
+        if (signalNumber != 0)
+            ::raise(signalNumber);
+        if (answered || signalNumber == 0)
+            return answered;
     }
+    return false;
+}
+
+/// In the background stops the program, as reading would do, until the terminal is for it. False
+/// when it won't be.
+bool Prompt::waitForForeground()
+{
+    for (int stops = 0; stops < mostStops; ++stops) {
+        if (m_cancelled)
+            return false;
+        if (isInForeground(m_terminal))
+            return true;
+        // A shell looks after the group as a whole.
+        ::kill(0, SIGTTIN);
+        // A signal that came with the one to go on may be on its way to cancel() yet.
+        std::this_thread::sleep_for(pace);
+    }
+    m_isOutOfReach = true;
+    return false;
 }
 
 bool Prompt::readLine(int descriptor, Secret& answer)
@@ -223,14 +276,17 @@ void Prompt::cancel()
 
 void Prompt::restoreTerminal()
 {
-    const std::lock_guard<std::mutex> lock(hiddenLock);
-    if (hiddenInput)
-        hiddenInput->putBack();
+    HiddenInput::putBackFromElsewhere();
 }
 
 bool Prompt::isCancelled() const
 {
     return m_cancelled;
+}
+
+bool Prompt::isOutOfReach() const
+{
+    return m_isOutOfReach;
 }
 
 void Prompt::restart()

@@ -17,7 +17,8 @@ namespace Tool {
  * Asks the person at the controlling terminal, wherever standard input and output go.
  *
  * While a password is typed the terminal shows nothing; it is put back as it was at the end, and
- * also while the program is stopped (Ctrl-Z) and before a signal ends it.
+ * also while the program is stopped (Ctrl-Z) and before a signal ends it. A question is asked in
+ * the foreground only: in the background the program stops until a shell brings it there.
  */
 class Prompt
 {
@@ -45,17 +46,23 @@ public:
     bool isCancelled() const;
     void restart();
 
+    /// Whether a question was given up since the program is in the background and nobody can bring
+    /// it to the foreground.
+    bool isOutOfReach() const;
+
     /// Puts the terminal back before the program is cut off. From any thread.
     static void restoreTerminal();
 
 private:
     Q_DISABLE_COPY(Prompt)
 
+    bool waitForForeground();
     bool waitForInput(int descriptor) const;
 
     int m_terminal = -1;
     int m_wake = -1; ///< An eventfd, readable after cancel() and signals.
     std::atomic<bool> m_cancelled{false};
+    bool m_isOutOfReach = false;
 };
 
 } // namespace Tool

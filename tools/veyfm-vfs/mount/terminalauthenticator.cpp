@@ -281,6 +281,14 @@ QString TerminalAuthenticator::whyNoAnswer(const QString& needed, const QString&
     return why + QLatin1String(": use ") + options;
 }
 
+QString TerminalAuthenticator::whyNotAnswered() const
+{
+    return m_prompt.isOutOfReach()
+               ? QStringLiteral("asking needs the terminal, and no shell can bring the program "
+                                "from the background to the foreground")
+               : wasCancelled();
+}
+
 /// Why there is no name; else it goes into @p user, which stays as it is when that is meant.
 QString TerminalAuthenticator::whyNoUserName(QString& user)
 {
@@ -299,7 +307,7 @@ QString TerminalAuthenticator::whyNoUserName(QString& user)
         Secret line;
         const QString question = QStringLiteral("User name for %1 [%2]: ").arg(resource(), offered);
         if (!m_prompt.ask(question, Prompt::Shown, line))
-            return wasCancelled();
+            return whyNotAnswered();
         const QString typed = line.text().trimmed();
         if (typed.isEmpty() && protocol() == sftp)
             return QString();
@@ -337,7 +345,7 @@ QString TerminalAuthenticator::whyNoPassword(const QString& user, Secret& passwo
     while (true) {
         const QString question = QStringLiteral("Password for %1: ").arg(whose);
         if (!m_prompt.ask(question, Prompt::Hidden, password))
-            return wasCancelled();
+            return whyNotAnswered();
         const QString why = whyUnfit(password, protocol());
         if (why.isEmpty())
             return QString();
@@ -364,7 +372,7 @@ bool TerminalAuthenticator::askQuestion(const QString& title, const QString& tex
     while (true) {
         Secret line;
         if (!m_prompt.ask(QStringLiteral("Type yes or no: "), Prompt::Shown, line)) {
-            m_whyGivenUp = wasCancelled();
+            m_whyGivenUp = whyNotAnswered();
             return false;
         }
         const QString answer = line.text().trimmed();

@@ -82,6 +82,7 @@ private:
     bool isPersonAsked() const;
     bool isUserAsked(const QString& user, bool isUsed) const;
     QString whyNoAnswer(const QString& needed, const QString& options) const;
+    QString whyNotAnswered() const;
     QString whyNoMoreTries(bool isUsed) const;
     QString whyNoUserName(QString& user);
     QString whyNoPassword(const QString& user, Secret& password);
