@@ -4,6 +4,8 @@
 #ifndef VEYFM_TOOL_INTERRUPT_H
 #define VEYFM_TOOL_INTERRUPT_H
 
+#include "signalpipe.h"
+
 #include <QByteArray>
 
 #include <atomic>
@@ -48,16 +50,8 @@ private:
 
     void watch();
 
-    struct Handled
-    {
-        int number;
-        struct sigaction before;
-    };
-
-    Handled m_handled[2] = {};
-    int m_handledCount = 0;
     sigset_t m_maskBefore = {};
-    int m_pipe[2] = {-1, -1};
+    SignalPipe m_pipe;
     const int m_exitCode;
     const std::function<void()> m_stop;
     std::atomic<bool> m_requested{false};

@@ -15,9 +15,6 @@
 #include <QProcess>
 
 #include <algorithm>
-#include <cerrno>
-#include <fcntl.h>
-#include <poll.h>
 #include <unistd.h>
 
 namespace VeyFM {
@@ -33,43 +30,7 @@ constexpr std::chrono::milliseconds graceOfSignals(500); // timeout(1) sends eac
 constexpr std::chrono::seconds parting(2);
 constexpr int paceMilliseconds = 100;
 
-constexpr char signalByte = 's';
-constexpr char changeByte = 'c';
-constexpr char endByte = 'e';
-
-// All that the handler touches.
-std::atomic<int> handlerDescriptor{-1};
-static_assert(std::atomic<int>::is_always_lock_free);
-
 std::atomic<bool> hadToStop{false};
-
-void sendByte(int descriptor, char byte)
-{
-    if (::write(descriptor, &byte, 1) < 0) {
-        // The pipe is full of what wakes the reader just as well.
-    }
-}
-
-void handleSignal(int)
-{
-    const int error = errno;
-    sendByte(handlerDescriptor, signalByte);
-    errno = error;
-}
-
-/// The next byte of the pipe, or 0 when none comes in time. -1 waits for ever.
-char nextByte(int descriptor, int milliseconds)
-{
-    pollfd poll = {descriptor, POLLIN, 0};
-    int ready = 0;
-    do {
-        ready = ::poll(&poll, 1, milliseconds);
-    } while (ready < 0 && errno == EINTR);
-    char byte = 0;
-    if (ready < 1 || ::read(descriptor, &byte, 1) != 1)
-        return 0;
-    return byte;
-}
 
 bool hasRunningTool(const Job& job)
 {
@@ -122,35 +83,19 @@ JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int time
     : m_authenticator(std::move(authenticator))
     , m_timeoutSeconds(timeoutSeconds)
 {
-    if (::pipe2(m_pipe, O_CLOEXEC) != 0)
+    if (!m_pipe.isOpen())
         qFatal("no pipe for the watch of a job");
-    handlerDescriptor = m_pipe[1];
     m_thread = std::thread([this] { watch(); });
-
-    struct sigaction action = {};
-    action.sa_handler = handleSignal;
-    action.sa_flags = SA_RESTART;
-    for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
-        Handled& handled = m_handled[m_handledCount];
-        handled.number = number;
-        ::sigaction(number, nullptr, &handled.before);
-        if (handled.before.sa_handler == SIG_IGN)
-            continue;
-        ::sigaction(number, &action, nullptr);
-        ++m_handledCount;
-    }
+    m_pipe.catchSignals({SIGINT, SIGTERM, SIGHUP}, SA_RESTART);
 }
 
 JobWatch::~JobWatch()
 {
-    sendByte(m_pipe[1], endByte);
+    m_pipe.send(SignalPipe::End);
     m_thread.join();
     // Behind a signal the verb ends, and another may be on its way: it does nothing any more.
-    for (int i = 0; i < m_handledCount && !m_interrupted; ++i)
-        ::sigaction(m_handled[i].number, &m_handled[i].before, nullptr);
-    handlerDescriptor = -1;
-    ::close(m_pipe[0]);
-    ::close(m_pipe[1]);
+    if (!m_interrupted)
+        m_pipe.releaseSignals();
 }
 
 void JobWatch::setCutOff(const QString& what, const std::function<void()>& cleanUp)
@@ -263,7 +208,7 @@ void JobWatch::setState(State state, bool clockRuns)
         m_clockRuns = clockRuns && m_timeoutSeconds > 0;
         m_deadline = Clock::now() + std::chrono::seconds(m_timeoutSeconds);
     }
-    sendByte(m_pipe[1], changeByte);
+    m_pipe.send(SignalPipe::Change);
 }
 
 JobWatch::State JobWatch::state()
@@ -290,10 +235,10 @@ void JobWatch::watch()
     while (true) {
         const int milliseconds = millisecondsLeft();
         if (milliseconds != 0) {
-            const char byte = nextByte(m_pipe[0], milliseconds);
-            if (byte == endByte)
+            const SignalPipe::Byte byte = m_pipe.next(milliseconds);
+            if (byte == SignalPipe::End)
                 return;
-            if (byte != signalByte)
+            if (byte != SignalPipe::Signal)
                 continue;
             m_interrupted = true;
         }
@@ -319,14 +264,14 @@ bool JobWatch::stop()
             quitLoop();
             tools.end();
         }
-        const char byte = nextByte(m_pipe[0], paceMilliseconds);
-        if (byte == endByte)
+        const SignalPipe::Byte byte = m_pipe.next(paceMilliseconds);
+        if (byte == SignalPipe::End)
             return false;
         const Clock::time_point time = Clock::now();
-        if (byte == signalByte && !m_interrupted) {
+        if (byte == SignalPipe::Signal && !m_interrupted) {
             m_interrupted = true;
             signalled = time;
-        } else if (byte == signalByte && time - signalled >= graceOfSignals) {
+        } else if (byte == SignalPipe::Signal && time - signalled >= graceOfSignals) {
             cutOff();
         }
         if (time - begin >= grace || (now == InCall && time - begin >= graceOfCalls))

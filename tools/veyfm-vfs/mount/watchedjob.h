@@ -5,6 +5,7 @@
 #define VEYFM_TOOL_WATCHEDJOB_H
 
 #include "mount/terminalauthenticator.h"
+#include "signalpipe.h"
 
 #include <QSharedPointer>
 
@@ -13,8 +14,6 @@
 #include <functional>
 #include <mutex>
 #include <thread>
-
-#include <signal.h>
 
 class QEventLoop;
 
@@ -103,12 +102,6 @@ private:
 
     enum State { Idle, InJob, InCall };
 
-    struct Handled
-    {
-        int number;
-        struct sigaction before;
-    };
-
     JobResult resultOf(Job& job);
     bool wasStopped() const;
     void setState(State state, bool clockRuns);
@@ -121,9 +114,7 @@ private:
 
     const QSharedPointer<TerminalAuthenticator> m_authenticator;
     const int m_timeoutSeconds;
-    int m_pipe[2] = {-1, -1};
-    Handled m_handled[3] = {};
-    int m_handledCount = 0;
+    SignalPipe m_pipe;
     std::atomic<bool> m_interrupted{false};
     std::atomic<bool> m_timedOut{false};
 
