@@ -87,6 +87,15 @@ public:
             environment());
     }
 
+    /// As run(), to be waited for.
+    void start(QProcess& process, const char* line) const
+    {
+        process.setProcessEnvironment(environment());
+        process.start(
+            QStringLiteral("setsid"),
+            QStringList({QStringLiteral("--wait"), toolPath()}) + words(line));
+    }
+
     /// Runs a line of the shell without a terminal; $0 is the program, and $1 a file with the text.
     ToolResult runShell(const char* line, const QByteArray& text) const
     {

@@ -138,6 +138,12 @@ public:
         return QFile::exists(path(run, "finished"));
     }
 
+    /// The process that has started a run.
+    qint64 parentId(int run) const
+    {
+        return status(run, "PPid:").toLongLong();
+    }
+
     /// The process that a run has started by "fork"; 0 before it has.
     qint64 childId(int run) const
     {
