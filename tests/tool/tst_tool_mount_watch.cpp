@@ -23,6 +23,7 @@ private Q_SLOTS:
     void stubbornTool();
     void toolThatTidiesUp();
     void answeringTakesNoTime();
+    void beingStoppedTakesNoTime();
     void silentDescriptor();
     void hungSambaTool();
     void silentService();
@@ -103,6 +104,24 @@ void ToolMountWatchTest::answeringTakesNoTime()
     QTest::qWait(1500);
     session->type("geheim\n");
     QCOMPARE(session->waitForEnd(), 0);
+}
+
+void ToolMountWatchTest::beingStoppedTakesNoTime()
+{
+    MountScene scene("sshfs");
+    scene.tool.expect(QByteArrayList{"block 10", "finish", "await 10"} + Said::success());
+    QProcess process;
+    scene.start(process, "mount --timeout 3 sftp://me@host/");
+    QTRY_VERIFY_WITH_TIMEOUT(scene.tool.hasFinished(1), patience);
+    const pid_t tool = pid_t(scene.tool.parentId(1));
+    ::kill(tool, SIGSTOP);
+    // Longer than the tool may take.
+    QTest::qWait(3500);
+    ::kill(tool, SIGCONT);
+    ::kill(pid_t(scene.tool.processId(1)), SIGUSR1);
+    QVERIFY(process.waitForFinished(patience));
+    QCOMPARE(process.exitCode(), 0);
+    QCOMPARE(process.readAllStandardOutput(), scene.line(QStringLiteral("sftp/me@host")));
 }
 
 void ToolMountWatchTest::silentDescriptor()

@@ -206,7 +206,7 @@ void JobWatch::setState(State state, bool clockRuns)
         const std::lock_guard<std::mutex> lock(m_lock);
         m_state = state;
         m_clockRuns = clockRuns && m_timeoutSeconds > 0;
-        m_deadline = Clock::now() + std::chrono::seconds(m_timeoutSeconds);
+        m_isNew = true;
     }
     m_pipe.send(SignalPipe::Change);
 }
@@ -217,25 +217,46 @@ JobWatch::State JobWatch::state()
     return m_state;
 }
 
-/// Of the time of a job or call; -1 where nothing bounds it. When there is none left it has timed
+/// How long to wait; -1 where nothing bounds a job or call. When there is no time left it has timed
 /// out.
-int JobWatch::millisecondsLeft()
+int JobWatch::millisecondsToWait()
 {
     const std::lock_guard<std::mutex> lock(m_lock);
+    if (m_isNew)
+        m_deadline = runningTime() + std::chrono::seconds(m_timeoutSeconds);
+    m_isNew = false;
     if (m_state == Idle || !m_clockRuns)
         return -1;
     const auto left =
-        std::chrono::duration_cast<std::chrono::milliseconds>(m_deadline - Clock::now()).count();
+        std::chrono::duration_cast<std::chrono::milliseconds>(m_deadline - runningTime()).count();
     m_timedOut = left < 0;
-    return left < 0 ? 0 : int(left) + 1;
+    return left < 0 ? 0 : int(std::min<qint64>(left + 1, paceMilliseconds));
+}
+
+/// A clock that stands while the program is stopped.
+JobWatch::Clock::time_point JobWatch::runningTime() const
+{
+    return Clock::now() - m_lost;
+}
+
+/// The next byte of the pipe. A wait that takes longer than it may shows that the program was
+/// stopped meanwhile (Ctrl-Z).
+SignalPipe::Byte JobWatch::nextByte(int milliseconds)
+{
+    const Clock::time_point latest = Clock::now() + std::chrono::milliseconds(milliseconds);
+    const SignalPipe::Byte byte = m_pipe.next(milliseconds);
+    const Clock::time_point time = Clock::now();
+    if (milliseconds >= 0 && time > latest)
+        m_lost += time - latest;
+    return byte;
 }
 
 void JobWatch::watch()
 {
     while (true) {
-        const int milliseconds = millisecondsLeft();
+        const int milliseconds = millisecondsToWait();
         if (milliseconds != 0) {
-            const SignalPipe::Byte byte = m_pipe.next(milliseconds);
+            const SignalPipe::Byte byte = nextByte(milliseconds);
             if (byte == SignalPipe::End)
                 return;
             if (byte != SignalPipe::Signal)
@@ -251,7 +272,7 @@ void JobWatch::watch()
 bool JobWatch::stop()
 {
     hadToStop = true;
-    const Clock::time_point begin = Clock::now();
+    const Clock::time_point begin = runningTime();
     Clock::time_point signalled = begin;
     Descendants tools;
     while (true) {
@@ -264,10 +285,10 @@ bool JobWatch::stop()
             quitLoop();
             tools.end();
         }
-        const SignalPipe::Byte byte = m_pipe.next(paceMilliseconds);
+        const SignalPipe::Byte byte = nextByte(paceMilliseconds);
         if (byte == SignalPipe::End)
             return false;
-        const Clock::time_point time = Clock::now();
+        const Clock::time_point time = runningTime();
         if (byte == SignalPipe::Signal && !m_interrupted) {
             m_interrupted = true;
             signalled = time;

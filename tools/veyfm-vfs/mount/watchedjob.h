@@ -60,14 +60,15 @@ void boundParting();
  * Runs the jobs of a verb, one after the other, and sees to it that each comes to an end: jobs
  * may by their contract stay unfinished for ever, and some block their thread.
  *
- * A job gets so many seconds in which neither it ends nor somebody is asked. When they are over,
- * or on SIGINT, SIGTERM or SIGHUP, a thread of this object has the authenticator cancel every
- * question, and ends the tools that the job has started and starts, until it comes back. One that
- * does not is cut off after five seconds: the cleaning is done, the reason is reported, and the
- * program exits. As long as the object lives signals end only jobs, so a verb can clean up behind
- * them. Another signal, half a second behind the first or later, cuts off what is left of that.
- * When the object has ended behind a signal, others have no effect: see boundParting().
- * Signals that are ignored when the object is made stay ignored.
+ * A job gets so many seconds in which neither it ends nor somebody is asked; those that the
+ * program is stopped (Ctrl-Z) don't count. When they are over, or on SIGINT, SIGTERM or SIGHUP, a
+ * thread of this object has the authenticator cancel every question, and ends the tools that the
+ * job has started and starts, until it comes back. One that does not is cut off after five seconds:
+ * the cleaning is done, the reason is reported, and the program exits. As long as the object lives
+ * signals end only jobs, so a verb can clean up behind them. Another signal, half a second behind
+ * the first or later, cuts off what is left of that. When the object has ended behind a signal,
+ * others have no effect: see boundParting(). Signals that are ignored when the object is made stay
+ * ignored.
  *
  * The signals are not blocked, and programs that are started meanwhile don't have them blocked.
  * One object at a time, and none beside an Interrupt.
@@ -106,7 +107,9 @@ private:
     bool wasStopped() const;
     void setState(State state, bool clockRuns);
     State state();
-    int millisecondsLeft();
+    int millisecondsToWait();
+    Clock::time_point runningTime() const;
+    SignalPipe::Byte nextByte(int milliseconds);
     void watch();
     bool stop();
     void quitLoop();
@@ -121,10 +124,14 @@ private:
     std::mutex m_lock; ///< For what follows.
     State m_state = Idle;
     bool m_clockRuns = false;
-    Clock::time_point m_deadline;
+    bool m_isNew = false; ///< Its time begins when the thread takes note.
     QEventLoop* m_loop = nullptr;
     QString m_what;
     std::function<void()> m_cleanUp;
+
+    // Of the thread alone.
+    Clock::duration m_lost{0}; ///< The time that the program was stopped.
+    Clock::time_point m_deadline;
 
     std::thread m_thread;
 };
