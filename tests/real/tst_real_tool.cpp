@@ -194,7 +194,7 @@ void RealToolTest::cannotConnect()
     QCOMPARE(session->waitForEnd(), 1);
     // Now and then ssh has ended before sshfs writes to it, and the job sees another failure.
     const QByteArray line = "veyfm-vfs: sftp://alice@" + host + "/: ";
-    const QByteArray help = "look with 'ssh " + host + "' whether the host answers";
+    const QByteArray help = "look with 'ssh alice@" + host + "' whether the host answers";
     QVERIFY2(session->output().startsWith(line), session->output().constData());
     QVERIFY2(session->output().contains(help), session->output().constData());
     QCOMPARE(session->output().count('\n'), 1);
@@ -210,8 +210,8 @@ void RealToolTest::morePromptsThanPasswords()
     QCOMPARE(
         session->output(),
         QByteArray("veyfm-vfs: sftp://alice@other.test/: no progress within 2 s: sshfs may be "
-                   "waiting for more than a password; look with 'ssh other.test' whether the host "
-                   "answers and lets you in\n"));
+                   "waiting for more than a password; look with 'ssh alice@other.test' whether the "
+                   "host answers and lets you in\n"));
     QTRY_VERIFY(processesNamed("ssh").isEmpty());
     QVERIFY(processesNamed("sshfs").isEmpty());
     QVERIFY(!QFile::exists(mountDir(QString())));

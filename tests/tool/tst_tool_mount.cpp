@@ -167,7 +167,7 @@ void ToolMountTest::toolFails()
     QCOMPARE(
         result.err,
         failure(
-            "sftp://me@host/", "Mounting sftp resource failed: look with 'ssh host' whether the "
+            "sftp://me@host/", "Mounting sftp resource failed: look with 'ssh me@host' whether the "
                                "host answers and lets you in"));
     QVERIFY(!QFile::exists(scene.directory(QStringLiteral("sftp/me@host"))));
     QVERIFY(QFile::exists(scene.directory(QStringLiteral("sftp/other"))));

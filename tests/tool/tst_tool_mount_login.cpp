@@ -7,7 +7,7 @@ namespace {
 
 const QByteArray noKey =
     "the key of the host is not known, and nobody could be asked about it: connect once with 'ssh "
-    "host', which asks";
+    "me@host', which asks";
 
 } // namespace
 

@@ -16,7 +16,9 @@ private Q_SLOTS:
     void refusedOnce();
     void refusedWithoutUser();
     void threeTries();
+    void neverAskedByServer_data();
     void neverAskedByServer();
+    void otherUserNeverAsked();
     void anonymousRefused();
     void ftpRefusedOnce();
     void unfitUserName();
@@ -146,18 +148,50 @@ void ToolMountTerminalTest::threeTries()
     QVERIFY(scene.isClean());
 }
 
+void ToolMountTerminalTest::neverAskedByServer_data()
+{
+    QTest::addColumn<QByteArray>("url");
+    QTest::addColumn<QByteArray>("command");
+    const auto row = [](const char* url, const char* command) {
+        QTest::newRow(url) << QByteArray(url) << QByteArray(command);
+    };
+    row("sftp://me@host/", "ssh me@host");
+    row("sftp://host/", "ssh host");
+    row("sftp://me%40example.org@host/", "ssh me@example.org@host");
+    // A shell would take these for something else.
+    row("sftp://WG%5Cme@host/", "ssh host");
+    row("sftp://~me@host/", "ssh host");
+    row("sftp://me%23@host/", "ssh host");
+}
+
 void ToolMountTerminalTest::neverAskedByServer()
 {
     // An unknown host, a server that has gone and one that takes keys alone all read like this.
+    QFETCH(const QByteArray, url);
+    QFETCH(const QByteArray, command);
     MountScene scene("sshfs");
     scene.tool.expect(Said::sshRefusal());
-    const auto session = scene.onTerminal("mount sftp://me@host/");
+    const auto session = scene.onTerminal("mount " + url);
     QCOMPARE(session->waitForEnd(), 1);
     QCOMPARE(
         session->output(),
-        QByteArray("veyfm-vfs: sftp://me@host/: the connection ended before a password was asked "
-                   "for: look with 'ssh host' whether the host answers, and lets you in\n"));
+        failure(
+            url, "the connection ended before a password was asked for: look with '" + command +
+                     "' whether the host answers, and lets you in"));
     QCOMPARE(scene.tool.runs(), 1);
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountTerminalTest::otherUserNeverAsked()
+{
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::sshPassword("root") + QByteArrayList{"exit 1"});
+    scene.tool.expect(Said::sshRefusal());
+    const auto session = scene.onTerminal("mount sftp://host/");
+    QVERIFY(session->waitFor("User name for sftp://host [root]: "));
+    session->type("you\n");
+    QCOMPARE(session->waitForEnd(), 1);
+    QVERIFY2(session->output().contains("look with 'ssh you@host'"), session->output().constData());
     QVERIFY(scene.isClean());
 }
 

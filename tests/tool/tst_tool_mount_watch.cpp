@@ -49,7 +49,7 @@ void ToolMountWatchTest::hungTool_data()
     QTest::addColumn<QByteArray>("why");
     QTest::newRow("sftp") << QByteArray("sshfs") << QByteArray("sftp://me@host/")
                           << QByteArray("sshfs may be waiting for more than a password; look with "
-                                        "'ssh host' whether the host answers and lets you in");
+                                        "'ssh me@host' whether the host answers and lets you in");
     QTest::newRow("ftp") << QByteArray("curlftpfs") << QByteArray("ftp://me@host/")
                          << QByteArray("curlftpfs waits for the server");
 }

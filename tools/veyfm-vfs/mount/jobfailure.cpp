@@ -59,8 +59,8 @@ bool isFuseGroupThere()
 
 QString lookWithSsh(const TerminalAuthenticator& authenticator)
 {
-    return QStringLiteral("look with 'ssh %1' whether the host answers and lets you in")
-        .arg(authenticator.server());
+    return QStringLiteral("look with '%1' whether the host answers and lets you in")
+        .arg(authenticator.sshCommand());
 }
 
 QString whyNoProgress(const QString& scheme, const TerminalAuthenticator& authenticator)

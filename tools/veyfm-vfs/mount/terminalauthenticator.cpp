@@ -9,6 +9,7 @@
 #include "spinner.h"
 #include "terminal.h"
 
+#include <QRegularExpression>
 #include <QStringList>
 
 #include <sys/prctl.h>
@@ -118,6 +119,21 @@ void TerminalAuthenticator::beginJob()
     m_keyConfirmed = false;
     m_passwordGiven = false;
     m_userChangedLast = false;
+}
+
+void TerminalAuthenticator::setUser(const QString& user)
+{
+    m_user = user;
+}
+
+QString TerminalAuthenticator::sshCommand() const
+{
+    // Other names would have to be quoted.
+    static const QRegularExpression plain(
+        QStringLiteral("^[\\w.@+-]+$"), QRegularExpression::UseUnicodePropertiesOption);
+    const QString host = server();
+    return QStringLiteral("ssh ") +
+           (plain.match(m_user).hasMatch() ? m_user + QLatin1Char('@') + host : host);
 }
 
 bool TerminalAuthenticator::wasAccepted() const
@@ -233,6 +249,7 @@ QString TerminalAuthenticator::requestPassword(
 
 void TerminalAuthenticator::noteChangedUser(const QString& user)
 {
+    m_user = user;
     m_wasRefused = false;
     m_userChangedLast = true;
     const std::lock_guard<std::mutex> lock(m_changedUsersLock);
@@ -250,8 +267,8 @@ QString TerminalAuthenticator::whyNoMoreTries(bool isUsed) const
         return QStringLiteral("the password was refused");
     if (protocol() == sftp && !isUsed && !m_passwordGiven) {
         return QStringLiteral("the connection ended before a password was asked for: look with "
-                              "'ssh %1' whether the host answers, and lets you in")
-            .arg(server());
+                              "'%1' whether the host answers, and lets you in")
+            .arg(sshCommand());
     }
     return QString();
 }
@@ -364,8 +381,8 @@ bool TerminalAuthenticator::askQuestion(const QString& title, const QString& tex
         sayLines(text);
         m_whyGivenUp =
             QStringLiteral("the key of the host is not known, and nobody could be asked about it: "
-                           "connect once with 'ssh %1', which asks")
-                .arg(server());
+                           "connect once with '%1', which asks")
+                .arg(sshCommand());
         return false;
     }
     m_prompt.show(text);

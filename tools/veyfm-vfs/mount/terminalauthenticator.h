@@ -45,6 +45,12 @@ public:
     /// resource are counted on.
     void beginJob();
 
+    /// Whom the URL of the next job names; may be empty. Its questions may change that.
+    void setUser(const QString& user);
+
+    /// What a person types to look at the host of an SFTP job.
+    QString sshCommand() const;
+
     /// Whether the job told that a login has worked.
     bool wasAccepted() const;
 
@@ -91,6 +97,7 @@ private:
 
     const Login m_login;
     Prompt m_prompt;
+    QString m_user;
     std::function<void(bool)> m_askingHandler;
 
     QString m_triedResource; ///< What the next two are about.

@@ -61,7 +61,9 @@ public:
     QString run(const Url& url, const Take& take)
     {
         while (true) {
-            MadeJob job(m_authenticator, url());
+            const QString jobUrl = url();
+            m_authenticator->setUser(userOf(jobUrl));
+            MadeJob job(m_authenticator, jobUrl);
             const JobResult result = m_watch.run(job, m_doing);
             m_wasStopped =
                 result.end == JobResult::TimedOut || result.end == JobResult::Interrupted;
