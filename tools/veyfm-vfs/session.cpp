@@ -160,17 +160,21 @@ bool waitUntil(const QString& doing, int seconds, const std::function<bool()>& c
     return changed();
 }
 
+QString whyNoNews(const QString& news, int seconds)
+{
+    return QStringLiteral("asked for, but the service told of no %1 within %2 s")
+        .arg(news)
+        .arg(seconds);
+}
+
 int waitForNews(
     const Invocation& invocation, const QString& what, const std::function<bool()>& changed)
 {
     const int seconds = secondsToWait(invocation);
     if (waitUntil(QStringLiteral("Waiting for the news of the change"), seconds, changed))
         return Done;
-    if (!wasInterrupted()) {
-        report(
-            what, QStringLiteral("asked for, but the service told of no change within %1 s")
-                      .arg(seconds));
-    }
+    if (!wasInterrupted())
+        report(what, whyNoNews(QStringLiteral("change"), seconds));
     return Failed;
 }
 

@@ -40,6 +40,9 @@ int secondsToWait(const Invocation& invocation, int otherwise = 10);
  */
 bool waitUntil(const QString& doing, int seconds, const std::function<bool()>& changed);
 
+/// The words for news that the service did not tell: "change", say.
+QString whyNoNews(const QString& news, int seconds);
+
 /// Waits for --timeout or ten seconds. When no news come, that is reported of @p what. An ExitCode.
 int waitForNews(
     const Invocation& invocation, const QString& what, const std::function<bool()>& changed);

@@ -17,6 +17,11 @@ ScanJob::ScanJob(const Entry& entry)
 
 ScanJob::~ScanJob() = default;
 
+QString ScanJob::news()
+{
+    return QStringLiteral("end of the scan");
+}
+
 QStringList ScanJob::added() const
 {
     return m_added;

@@ -27,6 +27,9 @@ public:
 
     void start() override;
 
+    /// What its end is called, for whyNoNews().
+    static QString news();
+
     /// The names that have come and gone. @{
     QStringList added() const;
     QStringList removed() const;

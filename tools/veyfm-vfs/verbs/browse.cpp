@@ -208,10 +208,7 @@ int runRescan(Invocation& invocation)
         return printNews(invocation, level, job);
     if (wasInterrupted())
         return Failed;
-    return fail(
-        invocation,
-        QStringLiteral("asked for, but the service told of no end of the scan within %1 s")
-            .arg(seconds));
+    return fail(invocation, whyNoNews(ScanJob::news(), seconds));
 }
 
 Verb browseVerb(const char* name, const char* operands, int count, const char* summary)

@@ -79,7 +79,7 @@ private:
         if (mounted.localPath == place.localPath())
             return {};
         RecordJob job(entry, mounted.localPath);
-        return runJob(job, "change");
+        return runJob(job, QStringLiteral("change"));
     }
 
     QString whyNoLoginFor(const QString& url) const
@@ -121,19 +121,17 @@ private:
     Outcome scan(const Entry& entry)
     {
         ScanJob job(entry);
-        return runJob(job, "end of the scan");
+        return runJob(job, ScanJob::news());
     }
 
     /// Runs a job that waits for the service alone.
-    Outcome runJob(Job& job, const char* news)
+    Outcome runJob(Job& job, const QString& news)
     {
         JobWatch watch(QSharedPointer<TerminalAuthenticator>::create(m_login), m_timeout);
         watch.setCutOff(m_operand);
         const JobResult result = watch.run(job, doing());
         if (result.end == JobResult::TimedOut)
-            return {QStringLiteral("asked for, but the service told of no %1 within %2 s")
-                        .arg(QLatin1String(news))
-                        .arg(m_timeout)};
+            return {whyNoNews(news, m_timeout)};
         return {result.isOk() ? QString() : watch.whyStopped(), watch.wasInterrupted()};
     }
 
