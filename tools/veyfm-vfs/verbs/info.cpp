@@ -4,7 +4,7 @@
 #include "commandline.h"
 #include "describe.h"
 #include "locate.h"
-#include "report.h"
+#include "verbs/describeeach.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 
@@ -128,28 +128,13 @@ void print(Output& output, const Entry& entry)
 
 int run(Invocation& invocation)
 {
-    Output& output = invocation.output();
-    JsonArray json(output);
-    int exitCode = Done;
-    bool first = true;
-    const QStringList operands = invocation.operands();
-    for (const QString& operand : operands) {
-        const Located located = locate(operand);
-        if (!located.why.isEmpty()) {
-            report(operand, located.why);
-            exitCode = Failed;
-        } else if (invocation.json()) {
-            json.append(describe(located.entry));
-        } else {
-            if (!first)
-                output.write(QByteArrayLiteral("\n"));
-            print(output, located.entry);
-            first = false;
-        }
-    }
-    if (invocation.json())
-        json.end();
-    return exitCode;
+    const auto describeEntry = [](const QString&, const Entry& entry) {
+        return describe(entry);
+    };
+    const auto printEntry = [](Output& output, const QString&, const Entry& entry) {
+        print(output, entry);
+    };
+    return describeEach(invocation, {locate, describeEntry, printEntry});
 }
 
 } // namespace

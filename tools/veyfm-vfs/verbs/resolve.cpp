@@ -4,7 +4,7 @@
 #include "commandline.h"
 #include "describe.h"
 #include "locate.h"
-#include "report.h"
+#include "verbs/describeeach.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 
@@ -31,38 +31,19 @@ void print(Output& output, const QString& text, const Entry& entry)
     textLine("exists", entry.isExists() ? QStringLiteral("yes") : QStringLiteral("no"));
 }
 
+QJsonObject describe(const QString& text, const Entry& entry)
+{
+    QJsonObject object = toJson(entry);
+    object.insert(QStringLiteral("text"), text);
+    object.insert(QStringLiteral("url"), textOrNull(urlOf(entry).toString(QUrl::FullyEncoded)));
+    object.insert(QStringLiteral("networkUrl"), textOrNull(VFS::ptr()->getUrlForEntry(entry)));
+    object.insert(QStringLiteral("exists"), entry.isExists());
+    return object;
+}
+
 int run(Invocation& invocation)
 {
-    Output& output = invocation.output();
-    JsonArray json(output);
-    int exitCode = Done;
-    bool first = true;
-    const QStringList operands = invocation.operands();
-    for (const QString& operand : operands) {
-        const Located located = resolveText(operand);
-        const Entry& entry = located.entry;
-        if (!located.why.isEmpty()) {
-            report(operand, located.why);
-            exitCode = Failed;
-        } else if (invocation.json()) {
-            QJsonObject object = toJson(entry);
-            object.insert(QStringLiteral("text"), operand);
-            object.insert(
-                QStringLiteral("url"), textOrNull(urlOf(entry).toString(QUrl::FullyEncoded)));
-            object.insert(
-                QStringLiteral("networkUrl"), textOrNull(VFS::ptr()->getUrlForEntry(entry)));
-            object.insert(QStringLiteral("exists"), entry.isExists());
-            json.append(object);
-        } else {
-            if (!first)
-                output.write(QByteArrayLiteral("\n"));
-            print(output, operand, entry);
-            first = false;
-        }
-    }
-    if (invocation.json())
-        json.end();
-    return exitCode;
+    return describeEach(invocation, {resolveText, describe, print});
 }
 
 } // namespace
