@@ -134,6 +134,15 @@ bool wasInterrupted()
     return serviceInterrupt().wasRequested();
 }
 
+bool hasFailed(const Invocation& invocation, const QString& why)
+{
+    if (wasInterrupted())
+        return true;
+    if (!why.isEmpty())
+        report(invocation.verb().name, why);
+    return !why.isEmpty();
+}
+
 int secondsToWait(const Invocation& invocation, int otherwise)
 {
     const QString option = QStringLiteral("timeout");

@@ -29,6 +29,9 @@ int runWithService(Invocation& invocation, int (*run)(Invocation& invocation));
 /// nothing: that it was interrupted is told for it.
 bool wasInterrupted();
 
+/// For a list that came back empty: whether Ctrl-C or @p why is the reason, which is reported then.
+bool hasFailed(const Invocation& invocation, const QString& why);
+
 /// The value of --timeout, or what stands for it, in seconds.
 int secondsToWait(const Invocation& invocation, int otherwise = 10);
 

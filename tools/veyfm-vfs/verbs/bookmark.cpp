@@ -50,15 +50,8 @@ QString whyNoFavourites()
 int runList(Invocation& invocation)
 {
     const QList<Favourite> all = favourites();
-    if (all.isEmpty()) {
-        const QString why = whyNoFavourites();
-        if (wasInterrupted())
-            return Failed;
-        if (!why.isEmpty()) {
-            report(invocation.verb().name, why);
-            return Failed;
-        }
-    }
+    if (all.isEmpty() && hasFailed(invocation, whyNoFavourites()))
+        return Failed;
     Output& output = invocation.output();
     if (invocation.json()) {
         JsonArray json(output);

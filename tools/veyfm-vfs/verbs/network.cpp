@@ -43,15 +43,8 @@ QString whyNoBookmarks()
 int runList(Invocation& invocation)
 {
     const QList<NetworkPlace> places = VFS::ptr()->networkPlacesManager()->networkPlaces();
-    if (places.isEmpty()) {
-        const QString why = whyNoBookmarks();
-        if (wasInterrupted())
-            return Failed;
-        if (!why.isEmpty()) {
-            report(invocation.verb().name, why);
-            return Failed;
-        }
-    }
+    if (places.isEmpty() && hasFailed(invocation, whyNoBookmarks()))
+        return Failed;
     Output& output = invocation.output();
     if (invocation.json()) {
         JsonArray json(output);

@@ -54,14 +54,7 @@ QJsonObject toJson(const Device& device)
 int runList(Invocation& invocation)
 {
     const QList<Device> devices = readDevices();
-    if (devices.isEmpty()) {
-        const QString why = wasInterrupted() ? QString() : whyNoDevices();
-        if (!why.isEmpty()) {
-            report(invocation.verb().name, why);
-            return Failed;
-        }
-    }
-    if (wasInterrupted())
+    if (wasInterrupted() || (devices.isEmpty() && hasFailed(invocation, whyNoDevices())))
         return Failed;
     Output& output = invocation.output();
     if (invocation.json()) {
