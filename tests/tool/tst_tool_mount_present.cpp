@@ -24,6 +24,7 @@ private Q_SLOTS:
     void pathIsMissing();
     void deadMount();
     void silentMount();
+    void homeOnFuse();
     void staleRegistration();
     void stalePlace();
     void staleRegistrationOfOtherUser();
@@ -151,6 +152,19 @@ void ToolMountPresentTest::silentMount()
         result.err.contains("it was mounted before, but is dead (it does not answer): run "),
         result.err.constData());
     QVERIFY(mounted.progress() > 0);
+}
+
+void ToolMountPresentTest::homeOnFuse()
+{
+    // One that is encrypted, say. This one takes no new directories, so there the tool fails.
+    MountScene scene("sshfs");
+    const SlowDirectory home(SlowDirectory::Endless, QFileInfo(scene.directory()).path());
+    QCOMPARE(home.problem(), QString());
+    scene.tool.expect({"exit 1"});
+    const ToolResult result = scene.run("mount sftp://me@host/");
+    QCOMPARE(result.exitCode, 1);
+    QVERIFY2(result.err.contains("Mounting sftp resource failed"), result.err.constData());
+    QCOMPARE(scene.tool.runs(), 1);
 }
 
 void ToolMountPresentTest::staleRegistration()

@@ -140,16 +140,19 @@ QString fuseDirectory(const QUrl& url)
 
 bool isOnFuseMount(const QString& path, const MountInfo& kernel)
 {
+    const auto holds = [](const KernelMount& mount, const QString& directory) {
+        return mount.directory == directory || mount.directory == slash ||
+               directory.startsWith(mount.directory + slash);
+    };
     const QString place = kernelDirectory(path);
     const QVector<KernelMount> mounts = kernel.mounts();
     const KernelMount* holder = nullptr;
     for (const KernelMount& mount : mounts) {
-        const bool holds = mount.directory == place || mount.directory == slash ||
-                           place.startsWith(mount.directory + slash);
-        if (holds && (!holder || mount.directory.size() >= holder->directory.size()))
+        if (holds(mount, place) && (!holder || mount.directory.size() >= holder->directory.size()))
             holder = &mount;
     }
-    return holder && holder->isFuse();
+    // The home may lie on one itself, as an encrypted one does.
+    return holder && holder->isFuse() && !holds(*holder, kernelDirectory(mountRoot()));
 }
 
 QString whyDead(const QString& directory, int seconds)

@@ -19,7 +19,8 @@ class MountInfo;
 /// The directory on which the jobs mount the root of an ftp or sftp URL.
 QString fuseDirectory(const QUrl& url);
 
-/// Whether the path lies on a FUSE mount. The mount is not looked at.
+/// Whether the path lies on a FUSE mount that does not hold the root of all mounts, too. The mount
+/// is not looked at.
 bool isOnFuseMount(const QString& path, const MountInfo& kernel);
 
 /// Why the file system of a directory is of no use, or empty. One that does not answer is given
