@@ -20,6 +20,7 @@ private Q_SLOTS:
     void initTestCase();
     void mountedAlready();
     void mountedUnknownToService();
+    void mountedRefusedByService();
     void mountedWithoutService();
     void pathIsMissing();
     void deadMount();
@@ -87,6 +88,25 @@ void ToolMountPresentTest::mountedUnknownToService()
         calls.filter(fuseRegister),
         QStringList(registration(QStringLiteral("sftp://me@host/"), directory)));
     QCOMPARE(calls.filter(placeRegister).size(), 1);
+}
+
+void ToolMountPresentTest::mountedRefusedByService()
+{
+    // Nothing is mounted on top of what works.
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    const QString directory = scene.directory(QStringLiteral("sftp/me@host"));
+    QVERIFY(QDir().mkpath(directory));
+    const SlowDirectory mounted(SlowDirectory::Endless, directory);
+    const ToolResult result = scene.run("mount sftp://me@host/a");
+    QCOMPARE(scene.tool.runs(), 0);
+    QCOMPARE(
+        result.err, failure(
+                        "sftp://me@host/a", "other programs don't see this mount: the file manager "
+                                            "service did not take it"));
+    QCOMPARE(result.exitCode, 0);
+    QCOMPARE(result.out, scene.line(QStringLiteral("sftp/me@host/a")));
 }
 
 void ToolMountPresentTest::mountedWithoutService()

@@ -150,7 +150,7 @@ public:
         }
         result.state = wasThere() ? UrlMount::Present : UrlMount::New;
         if (result.state == UrlMount::New && !m_whyAlone.isEmpty())
-            report(m_shown, QStringLiteral("other programs don't see this mount: ") + m_whyAlone);
+            reportAlone(m_whyAlone);
         result.url = m_url.toString(QUrl::FullyEncoded);
         result.localPath =
             QDir::cleanPath(m_directory + slash + MountPaths::mountRootRelativePath(m_url));
@@ -245,9 +245,21 @@ private:
     {
         if (!m_whyAlone.isEmpty() || m_hasPlace)
             return QString();
-        if (!m_isRegistered)
+        if (!m_isRegistered) {
             registerAs(m_directory);
+            find();
+        }
+        if (!m_isRegistered && !m_runner.watch().wasInterrupted()) {
+            // The job would mount once more, on top.
+            reportAlone(QStringLiteral("the file manager service did not take it"));
+            return QString();
+        }
         return runJob<MountFuseEntryJob>();
+    }
+
+    void reportAlone(const QString& why) const
+    {
+        report(m_shown, QStringLiteral("other programs don't see this mount: ") + why);
     }
 
     /// What is registered but not mounted is no help: a job would take it for a mount.
