@@ -92,6 +92,7 @@ private Q_SLOTS:
     void ofToolThatAsksLaterRefused();
     void processStays();
     void processIsNoTool();
+    void childrenAreIgnored();
 };
 
 void ToolMountOthersTest::initTestCase()
@@ -268,6 +269,20 @@ void ToolMountOthersTest::processIsNoTool()
     QCOMPARE(session.waitForEnd(), 0);
     QCOMPARE(session.output().count("Password for"), 2);
     QCOMPARE(scene.tool.input(2), QByteArray("right\n"));
+}
+
+void ToolMountOthersTest::childrenAreIgnored()
+{
+    // By who started the program: nobody would learn how a tool has ended.
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::success());
+    const ToolResult result = runProgram(
+        QStringLiteral("/usr/bin/env"),
+        {QStringLiteral("--ignore-signal=CHLD"), toolPath(), QStringLiteral("mount"),
+         QStringLiteral("sftp://me@host/")},
+        QString(), scene.environment());
+    QVERIFY2(result.exitCode == 0, result.err.constData());
+    QCOMPARE(result.out, scene.line(QStringLiteral("sftp/me@host")));
 }
 
 QTEST_GUILESS_MAIN(ToolMountOthersTest)

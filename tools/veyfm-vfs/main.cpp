@@ -7,8 +7,12 @@
 
 #include <QCoreApplication>
 
+#include <signal.h>
+
 int main(int argc, char* argv[])
 {
+    // Where the caller ignores it, nobody learns how the tools end.
+    ::signal(SIGCHLD, SIG_DFL);
     VeyFM::Tool::leaveInheritedChildren();
     VeyFM::Tool::installLogging();
     QCoreApplication application(argc, argv);
