@@ -86,6 +86,7 @@ private Q_SLOTS:
     void duringQuestionOfRefusedMount();
     void besideFailingTool();
     void besideHungTool();
+    void besideSilentService();
     void ofKilledTool();
     void ofToolThatAsksLater_data();
     void ofToolThatAsksLater();
@@ -186,6 +187,29 @@ void ToolMountOthersTest::besideHungTool()
     QVERIFY(other.stands());
     QVERIFY(process.waitForFinished(patience));
     QCOMPARE(process.exitCode(), 1);
+    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
+}
+
+void ToolMountOthersTest::besideSilentService()
+{
+    // The job asks it before it starts the tool, and is cut off there.
+    ToolScene service;
+    QVERIFY(service.isReady());
+    const QString mounts = QStringLiteral("FuseMountsManager.mounts");
+    service.service().setRules(
+        mounts, {QJsonObject{{QStringLiteral("value"), QJsonObject()}},
+                 QJsonObject{{QStringLiteral("silent"), true}}});
+    MountScene scene("sshfs", &service);
+    QVERIFY(QDir().mkpath(scene.directory(QStringLiteral("sftp/me@host"))));
+    QProcess process;
+    process.setProcessEnvironment(scene.environment());
+    process.start(toolPath(), MountScene::words("mount --timeout 1 sftp://me@host/"));
+    QTRY_COMPARE_WITH_TIMEOUT(service.service().calls().filter(mounts).size(), 2, patience);
+    const OtherMount other("fuse", scene.directory(QStringLiteral("sftp/me@host")));
+    QVERIFY(other.stands());
+    QVERIFY(process.waitForFinished(patience));
+    QCOMPARE(process.exitCode(), 1);
+    QCOMPARE(scene.tool.runs(), 0);
     QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
 }
 

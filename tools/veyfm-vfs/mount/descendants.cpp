@@ -14,6 +14,7 @@
 #include <vector>
 
 #include <signal.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -96,6 +97,13 @@ void leaveInheritedChildren()
 bool hasRunningDescendants()
 {
     return !runningDescendants().empty();
+}
+
+long usageOfEndedChildren()
+{
+    rusage usage = {};
+    ::getrusage(RUSAGE_CHILDREN, &usage);
+    return usage.ru_minflt; // There is no process without page faults.
 }
 
 Descendants::~Descendants()

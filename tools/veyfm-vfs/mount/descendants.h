@@ -21,6 +21,10 @@ void leaveInheritedChildren();
 /// Whether a process runs that this one has started, or that such a one has.
 bool hasRunningDescendants();
 
+/// What the children have used that this process has waited for. When it is more than before,
+/// another one has ended. From any thread.
+long usageOfEndedChildren();
+
 /**
  * Ends the processes that this one has started, and those that they have. Each is asked to end
  * (SIGTERM) when it is first seen, and made to (SIGKILL) when it is still there a second later,

@@ -7,6 +7,7 @@
 #include "core/smburl.h"
 #include "jobs/mountfuseentryjob.h"
 #include "jobs/mounturljob.h"
+#include "mount/descendants.h"
 #include "mount/fusedirectory.h"
 #include "mount/jobfailure.h"
 #include "mount/mountauthenticator.h"
@@ -28,7 +29,6 @@
 #include <QUrl>
 
 #include <algorithm>
-#include <atomic>
 
 namespace VeyFM {
 namespace Tool {
@@ -124,9 +124,11 @@ public:
             else
                 m_trace.resume();
         });
-        // A job is cut off in a call to the service, when its tool has done well.
+        // A job is cut off in a call to the service, before its tool runs or when that has done
+        // well.
         m_runner.watch().setCutOff(m_shown, [this] {
-            m_trace.remove(directories(), m_hasRunJob ? FuseTrace::AllMounts : FuseTrace::NoMounts);
+            m_trace.remove(
+                directories(), hasRunTool() ? FuseTrace::AllMounts : FuseTrace::NoMounts);
         });
     }
 
@@ -187,6 +189,12 @@ private:
             m_directory = fuseDirectory(m_url);
     }
 
+    /// From any thread.
+    bool hasRunTool() const
+    {
+        return usageOfEndedChildren() > m_usageBefore || hasRunningDescendants();
+    }
+
     bool wasThere() const
     {
         return isOnFuseMount(m_directory, m_before);
@@ -222,7 +230,6 @@ private:
     template <typename MadeJob>
     QString runJob()
     {
-        m_hasRunJob = true;
         const auto url = [this] {
             takeUser();
             return rootUrl();
@@ -347,7 +354,7 @@ private:
     QString m_directory;         ///< That of the root.
     bool m_isRegistered = false; ///< Whether the service takes the directory for a mount.
     bool m_hasPlace = false;
-    std::atomic<bool> m_hasRunJob{false};
+    const long m_usageBefore = usageOfEndedChildren();
     JobRunner m_runner; ///< Ends first, with the thread that cleans up.
 };
 
