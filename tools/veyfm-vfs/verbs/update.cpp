@@ -179,16 +179,17 @@ int run(Invocation& invocation)
     int exitCode = Done;
     const QStringList operands = invocation.operands();
     for (const QString& operand : operands) {
+        const QString shown = shownUrl(operand);
         Located located;
         Outcome outcome;
-        outcome.why = askService(operand, timeout, [&] { located = openedEntry(operand); });
+        outcome.why = askService(shown, timeout, [&] { located = openedEntry(operand); });
         outcome.wasInterrupted = !outcome.why.isEmpty();
         if (outcome.why.isEmpty())
             outcome.why = located.why;
         if (outcome.why.isEmpty())
-            outcome = Update(operand, login, timeout).run(located.entry);
+            outcome = Update(shown, login, timeout).run(located.entry);
         if (!outcome.why.isEmpty()) {
-            report(operand, outcome.why);
+            report(shown, outcome.why);
             exitCode = Failed;
             if (outcome.wasInterrupted)
                 break;
