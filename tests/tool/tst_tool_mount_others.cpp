@@ -88,6 +88,7 @@ private Q_SLOTS:
     void besideHungTool();
     void besideSilentService();
     void ofKilledTool();
+    void ofKilledToolInUse();
     void ofToolThatAsksLater_data();
     void ofToolThatAsksLater();
     void ofToolThatAsksLaterRefused();
@@ -220,6 +221,26 @@ void ToolMountOthersTest::ofKilledTool()
     const ToolResult result = scene.run("mount --timeout 1 sftp://me@host/");
     QCOMPARE(result.exitCode, 1);
     QVERIFY2(result.err.contains("no progress within 1 s"), result.err.constData());
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountOthersTest::ofKilledToolInUse()
+{
+    // By somebody who looks into it, which keeps it from going at once.
+    MountScene scene("sshfs");
+    scene.tool.expect({"block 15", "mount", "hang"});
+    QProcess process;
+    process.setProcessEnvironment(scene.environment());
+    process.start(toolPath(), MountScene::words("mount --timeout 0 sftp://me@host/"));
+    QTRY_VERIFY_WITH_TIMEOUT(!scene.mounts().isEmpty(), patience);
+    const QByteArray path = QFile::encodeName(scene.directory(QStringLiteral("sftp/me@host")));
+    const int user = ::open(path.constData(), O_PATH | O_CLOEXEC);
+    QVERIFY(user >= 0);
+    process.terminate();
+    const bool ended = process.waitForFinished(patience);
+    ::close(user);
+    QVERIFY(ended);
+    QCOMPARE(process.exitCode(), 1);
     QVERIFY(scene.isClean());
 }
 

@@ -25,6 +25,7 @@ private Q_SLOTS:
     void pathIsMissing();
     void deadMount();
     void silentMount();
+    void hiddenMount();
     void homeOnFuse();
     void staleRegistration();
     void stalePlace();
@@ -172,6 +173,24 @@ void ToolMountPresentTest::silentMount()
         result.err.contains("it was mounted before, but is dead (it does not answer): run "),
         result.err.constData());
     QVERIFY(mounted.progress() > 0);
+}
+
+void ToolMountPresentTest::hiddenMount()
+{
+    // By another file system on top of it.
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::success());
+    const QString directory = scene.directory(QStringLiteral("sftp/me@host"));
+    QVERIFY(QDir().mkpath(directory));
+    const SlowDirectory mounted(SlowDirectory::Endless, directory);
+    const QByteArray path = QFile::encodeName(directory);
+    QCOMPARE(::mount("other", path.constData(), "tmpfs", 0, nullptr), 0);
+    const ToolResult result = scene.run("mount --json sftp://me@host/");
+    while (scene.mounts().size() > 1)
+        ::umount2(path.constData(), MNT_DETACH);
+    QCOMPARE(
+        result.json().at(0).toObject().value(QStringLiteral("alreadyMounted")), QJsonValue(false));
+    QCOMPARE(scene.tool.runs(), 1);
 }
 
 void ToolMountPresentTest::homeOnFuse()
