@@ -23,6 +23,7 @@ private Q_SLOTS:
     void linkedDirectory();
     void toolMountsNothing();
     void toolFails();
+    void toolFailsBesideService();
     void toolIsMissing_data();
     void toolIsMissing();
     void toolCannotRun();
@@ -171,6 +172,18 @@ void ToolMountTest::toolFails()
                                "host answers and lets you in"));
     QVERIFY(!QFile::exists(scene.directory(QStringLiteral("sftp/me@host"))));
     QVERIFY(QFile::exists(scene.directory(QStringLiteral("sftp/other"))));
+}
+
+void ToolMountTest::toolFailsBesideService()
+{
+    // What others have registered meanwhile is not touched.
+    ToolScene service;
+    QVERIFY(service.isReady());
+    MountScene scene("sshfs", &service);
+    scene.tool.expect({"exit 1"});
+    QCOMPARE(scene.run("mount sftp://me@host/").exitCode, 1);
+    QCOMPARE(scene.tool.runs(), 1);
+    QCOMPARE(service.service().calls().filter(fuseRegister), QStringList());
 }
 
 void ToolMountTest::toolIsMissing_data()

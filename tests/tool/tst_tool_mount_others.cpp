@@ -86,9 +86,11 @@ private Q_SLOTS:
     void duringQuestionOfRefusedMount();
     void besideFailingTool();
     void besideHungTool();
+    void besideSilentService_data();
     void besideSilentService();
     void ofKilledTool();
     void ofKilledToolInUse();
+    void ofKilledToolOfOtherUser();
     void ofToolThatAsksLater_data();
     void ofToolThatAsksLater();
     void ofToolThatAsksLaterRefused();
@@ -191,9 +193,17 @@ void ToolMountOthersTest::besideHungTool()
     QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
 }
 
+void ToolMountOthersTest::besideSilentService_data()
+{
+    QTest::addColumn<bool>("isMounted");
+    QTest::newRow("mount") << true;
+    QTest::newRow("directory") << false;
+}
+
 void ToolMountOthersTest::besideSilentService()
 {
     // The job asks it before it starts the tool, and is cut off there.
+    QFETCH(const bool, isMounted);
     ToolScene service;
     QVERIFY(service.isReady());
     const QString mounts = QStringLiteral("FuseMountsManager.mounts");
@@ -201,17 +211,24 @@ void ToolMountOthersTest::besideSilentService()
         mounts, {QJsonObject{{QStringLiteral("value"), QJsonObject()}},
                  QJsonObject{{QStringLiteral("silent"), true}}});
     MountScene scene("sshfs", &service);
-    QVERIFY(QDir().mkpath(scene.directory(QStringLiteral("sftp/me@host"))));
+    const QString directory = scene.directory(QStringLiteral("sftp/me@host"));
+    QVERIFY(QDir().mkpath(directory));
     QProcess process;
     process.setProcessEnvironment(scene.environment());
-    process.start(toolPath(), MountScene::words("mount --timeout 1 sftp://me@host/"));
+    process.start(toolPath(), MountScene::words("mount --timeout 0 sftp://me@host/"));
     QTRY_COMPARE_WITH_TIMEOUT(service.service().calls().filter(mounts).size(), 2, patience);
-    const OtherMount other("fuse", scene.directory(QStringLiteral("sftp/me@host")));
-    QVERIFY(other.stands());
+    std::unique_ptr<OtherMount> other;
+    if (isMounted) {
+        other = std::make_unique<OtherMount>("fuse", directory);
+        QVERIFY(other->stands());
+    }
+    process.terminate();
     QVERIFY(process.waitForFinished(patience));
     QCOMPARE(process.exitCode(), 1);
     QCOMPARE(scene.tool.runs(), 0);
-    QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
+    QCOMPARE(scene.mounts().size(), isMounted ? 1 : 0);
+    if (!isMounted)
+        QVERIFY(QFile::exists(directory));
 }
 
 void ToolMountOthersTest::ofKilledTool()
@@ -241,6 +258,22 @@ void ToolMountOthersTest::ofKilledToolInUse()
     ::close(user);
     QVERIFY(ended);
     QCOMPARE(process.exitCode(), 1);
+    QVERIFY(scene.isClean());
+}
+
+void ToolMountOthersTest::ofKilledToolOfOtherUser()
+{
+    MountScene scene("sshfs");
+    scene.tool.expect(Said::sshPassword("root") + QByteArrayList{"exit 1"});
+    scene.tool.expect({"block 15", "mount", "hang"});
+    const auto session = scene.onTerminal("mount --timeout 0 sftp://host/");
+    QVERIFY(session->waitFor("User name for sftp://host [root]: "));
+    session->type("you\n");
+    QTRY_COMPARE_WITH_TIMEOUT(
+        scene.mounts(), QStringList(QStringLiteral("sftp/you@host")), patience);
+    session->type("\003");
+    QCOMPARE(session->waitForEnd(), 1);
+    QCOMPARE(scene.tool.runs(), 2);
     QVERIFY(scene.isClean());
 }
 

@@ -14,6 +14,7 @@ class ToolUpdateWatchTest : public QObject
 
 private Q_SLOTS:
     void initTestCase();
+    void interrupted_data();
     void interrupted();
     void questionBehindHungTool();
     void interruptedScan();
@@ -29,21 +30,32 @@ void ToolUpdateWatchTest::initTestCase()
         QSKIP(qPrintable(problem));
 }
 
+void ToolUpdateWatchTest::interrupted_data()
+{
+    QTest::addColumn<QByteArray>("tool");
+    QTest::addColumn<QByteArray>("entry");
+    QTest::newRow("sftp") << QByteArray("sshfs") << QByteArray("Network/work");
+    QTest::newRow("Samba") << QByteArray("smbclient") << QByteArray("Network/share");
+}
+
 void ToolUpdateWatchTest::interrupted()
 {
+    QFETCH(const QByteArray, tool);
+    QFETCH(const QByteArray, entry);
     ToolScene service(known());
     QVERIFY(service.isReady());
-    MountScene scene("sshfs", &service);
+    MountScene scene(tool, &service);
+    scene.tool.alsoStandFor("curlftpfs");
     scene.tool.expect({"hang"});
-    const auto session = scene.onTerminal("update Network/work Network/home");
+    const auto session = scene.onTerminal("update " + entry + " Network/files");
     QTRY_VERIFY(MountScene::isRunning(scene.tool.processId(1)));
     session->type("\003");
     QCOMPARE(session->waitForEnd(), 1);
     QVERIFY2(
-        session->output().endsWith("veyfm-vfs: Network/work: interrupted\n"),
+        session->output().endsWith("veyfm-vfs: " + entry + ": interrupted\n"),
         session->output().constData());
     // The others are left alone, and nothing stays behind.
-    QCOMPARE(scene.tool.runs(), 1);
+    QCOMPARE(scene.tool.allRuns().filter(QStringLiteral("curlftpfs")), QStringList());
     QVERIFY(scene.isClean());
     QTRY_VERIFY(!MountScene::isRunning(scene.tool.processId(1)));
 }
