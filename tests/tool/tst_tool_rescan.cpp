@@ -35,6 +35,8 @@ private Q_SLOTS:
     void nothingNew_data();
     void nothingNew();
     void waitsForItsOwnEnd();
+    void endOfOthers_data();
+    void endOfOthers();
     void fails_data();
     void fails();
     void interrupted();
@@ -199,6 +201,44 @@ void ToolRescanTest::waitsForItsOwnEnd()
     QCOMPARE(result.exitCode, 0);
     QVERIFY2(result.out.contains("removed  Samba/WG/HOST/old\n"), result.out.constData());
     QVERIFY2(result.out.contains("added    Samba/WG/HOST/data\n"), result.out.constData());
+}
+
+void ToolRescanTest::endOfOthers_data()
+{
+    QTest::addColumn<QByteArray>("operands");
+    QTest::addColumn<QString>("request");
+    QTest::addColumn<QJsonArray>("end");
+    const QString workgroup = QStringLiteral("rescanWorkgroup");
+    const QString host = QStringLiteral("rescanHost");
+    for (const bool isNew : {false, true}) {
+        QTest::addRow("workgroup, %d", isNew)
+            << QByteArray("WG") << workgroup << QJsonArray{QStringLiteral("A\nB"), isNew};
+        QTest::addRow("host, %d", isNew)
+            << QByteArray("WG HOST") << host
+            << QJsonArray{QStringLiteral("OTHER"), QStringLiteral("WG"), isNew};
+    }
+}
+
+void ToolRescanTest::endOfOthers()
+{
+    QFETCH(QByteArray, operands);
+    QFETCH(const QString, request);
+    QFETCH(const QJsonArray, end);
+    ToolScene scene(network());
+    QVERIFY(scene.isReady());
+    scene.service().setValue(
+        QStringLiteral("SmbBrowser.hosts WG"),
+        QJsonArray{QStringLiteral("HOST"), QStringLiteral("OTHER")});
+    const QJsonArray signal = {
+        QStringLiteral("SmbBrowser"), request + QStringLiteral("Finished"), end};
+    scene.service().setRules(
+        QStringLiteral("SmbBrowser.") + request,
+        {QJsonObject{{QStringLiteral("signals"), oneArgument(signal)}}});
+    const ToolResult result = scene.run("network rescan --timeout=1 " + operands);
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(
+        result.err, "veyfm-vfs: " + operands.replace(' ', '/') +
+                        ": asked for, but the service told of no end of the scan within 1 s\n");
 }
 
 void ToolRescanTest::fails_data()

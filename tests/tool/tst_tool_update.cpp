@@ -198,6 +198,14 @@ void ToolUpdateTest::bookmarkWithoutNews()
     MountScene scene("smbclient", &service);
     scene.tool.expect(noTicket);
     scene.tool.expect(listed);
+    // Others have some.
+    const auto updated = [](const QJsonArray& place) {
+        return signalOf("NetworkPlacesManager", "networkPlaceUpdated", oneArgument(place));
+    };
+    service.service().setRules(
+        record, rule(
+                    {updated(bookmark("work", "sftp://me@host/dir", QStringLiteral("/tmp"))),
+                     updated(bookmark("share", "smb://HOST/pub/dir"))}));
     const ToolResult result = scene.run("update --timeout=1 Network/share");
     QCOMPARE(
         result.err, QByteArray("veyfm-vfs: Network/share: asked for, but the service told of no "
@@ -382,6 +390,11 @@ void ToolUpdateTest::shareWithoutNews()
     MountScene scene("smbclient", &service);
     scene.tool.expect(noTicket);
     scene.tool.expect(listed);
+    // Others have some.
+    service.service().setRules(
+        attach, rule(
+                    {shareUpdated(QStringLiteral("other"), QStringLiteral("/smb/other")),
+                     shareUpdated(QStringLiteral("pub"), QString())}));
     const ToolResult result = scene.run("update --timeout=1 Samba/WG/HOST/pub");
     QCOMPARE(result.exitCode, 1);
     QCOMPARE(
