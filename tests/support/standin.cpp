@@ -195,6 +195,9 @@ void play(const std::string& line)
         finishSlowly();
     } else if (verb == "mount") {
         mountDirectory();
+    } else if (verb == "interrupt") {
+        kill(getppid(), SIGINT);
+        raise(SIGINT);
     } else if (verb == "kill") {
         raise(std::atoi(rest.c_str()));
     } else if (verb == "exit") {

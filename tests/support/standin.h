@@ -27,6 +27,7 @@
  *   finish               runs a process that needs a third of a second; see hasFinished()
  *   mount                mounts a dead file system on the directory among its arguments
  *   kill N, exit N       ends
+ *   interrupt            ends by a SIGINT, which its parent gets first, as Ctrl-C is for both
  *
  * At the end of the lines it exits with 0. A run that nobody expects exits with 93, and shows in
  * runs() like any other.

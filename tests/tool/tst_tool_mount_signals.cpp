@@ -30,6 +30,7 @@ private Q_SLOTS:
     void interruptedAgain();
     void interruptedTool_data();
     void interruptedTool();
+    void interruptedWithItsTool();
     void interruptedService();
     void interruptedWhereServiceNeverAnswers();
     void ignoredSignal();
@@ -159,6 +160,23 @@ void ToolMountSignalsTest::interruptedTool()
     QVERIFY(!MountScene::isRunning(scene.tool.processId(1)));
     QTRY_VERIFY(!MountScene::isRunning(scene.tool.childId(1)));
     QVERIFY(scene.isClean());
+}
+
+void ToolMountSignalsTest::interruptedWithItsTool()
+{
+    // smbclient that ends by the same Ctrl-C reads as one that was let in.
+    ToolScene service(
+        scriptOf(QStringLiteral("SmbBrowser.smbNetworkLocalPath"), QStringLiteral("/net/smb")));
+    QVERIFY(service.isReady());
+    for (int i = 0; i < 5; ++i) {
+        MountScene scene("smbclient", &service);
+        scene.tool.expect({"exit 1"}); // Without a ticket.
+        scene.tool.expect({"interrupt"});
+        const ToolResult result = scene.run("mount smb://host/share");
+        QCOMPARE(result.err, QByteArray("veyfm-vfs: smb://host/share: interrupted\n"));
+        QCOMPARE(result.exitCode, 1);
+        QCOMPARE(result.out, QByteArray());
+    }
 }
 
 void ToolMountSignalsTest::interruptedService()

@@ -16,7 +16,8 @@ namespace {
 
 // All that the handler touches.
 std::atomic<int> handlerDescriptor{-1};
-static_assert(std::atomic<int>::is_always_lock_free);
+std::atomic<bool> signalCaught{false};
+static_assert(std::atomic<int>::is_always_lock_free && std::atomic<bool>::is_always_lock_free);
 
 void sendByte(int descriptor, SignalPipe::Byte byte)
 {
@@ -28,6 +29,8 @@ void sendByte(int descriptor, SignalPipe::Byte byte)
 void handleSignal(int)
 {
     const int error = errno;
+    // Not with the byte: what else got the signal may have an effect before the pipe is read.
+    signalCaught = true;
     sendByte(handlerDescriptor, SignalPipe::Signal);
     errno = error;
 }
@@ -36,6 +39,7 @@ void handleSignal(int)
 
 SignalPipe::SignalPipe()
 {
+    signalCaught = false;
     if (::pipe2(m_pipe, O_CLOEXEC) == 0)
         handlerDescriptor = m_pipe[1];
 }
@@ -76,6 +80,11 @@ void SignalPipe::releaseSignals()
     for (int i = 0; i < m_handledCount; ++i)
         ::sigaction(m_handled[i].number, &m_handled[i].before, nullptr);
     m_handledCount = 0;
+}
+
+bool SignalPipe::hasCaught() const
+{
+    return signalCaught;
 }
 
 void SignalPipe::send(Byte byte)

@@ -36,6 +36,9 @@ public:
     /// Gives the signals back to what handled them before.
     void releaseSignals();
 
+    /// Whether a signal came, read or not. From any thread.
+    bool hasCaught() const;
+
     /// From any thread.
     void send(Byte byte);
 

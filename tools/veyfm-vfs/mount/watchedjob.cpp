@@ -94,7 +94,7 @@ JobWatch::~JobWatch()
     m_pipe.send(SignalPipe::End);
     m_thread.join();
     // Behind a signal the verb ends, and another may be on its way: it does nothing any more.
-    if (!m_interrupted)
+    if (!wasInterrupted())
         m_pipe.releaseSignals();
 }
 
@@ -107,13 +107,14 @@ void JobWatch::setCutOff(const QString& what, const std::function<void()>& clean
 
 bool JobWatch::wasInterrupted() const
 {
-    return m_interrupted;
+    // Before the watch gets to it: smbclient ends by the same Ctrl-C, which reads as its success.
+    return m_pipe.hasCaught();
 }
 
 QString JobWatch::whyStopped() const
 {
-    return m_interrupted ? QStringLiteral("interrupted")
-                         : QStringLiteral("no progress within %1 s").arg(m_timeoutSeconds);
+    return wasInterrupted() ? QStringLiteral("interrupted")
+                            : QStringLiteral("no progress within %1 s").arg(m_timeoutSeconds);
 }
 
 JobResult JobWatch::run(Job& job, const QString& doing)
@@ -121,7 +122,7 @@ JobResult JobWatch::run(Job& job, const QString& doing)
     job.setDeleteOnFinish(false);
     m_authenticator->beginJob();
     m_timedOut = false;
-    if (m_interrupted)
+    if (wasInterrupted())
         return {JobResult::Interrupted, 0, QString()};
     m_authenticator->setAskingHandler([this, doing](bool asking) {
         setState(InJob, !asking);
@@ -137,7 +138,7 @@ JobResult JobWatch::run(Job& job, const QString& doing)
     }
     m_authenticator->setAskingHandler({});
     // What comes too late does not count: the caller cleans up behind it.
-    if (m_interrupted)
+    if (wasInterrupted())
         result.end = JobResult::Interrupted;
     else if (m_timedOut)
         result.end = JobResult::TimedOut;
@@ -146,7 +147,7 @@ JobResult JobWatch::run(Job& job, const QString& doing)
 
 void JobWatch::call(const std::function<void()>& work)
 {
-    if (m_interrupted)
+    if (wasInterrupted())
         return;
     const Waiting waiting(waitingForService());
     setState(InCall, true);
@@ -197,13 +198,15 @@ JobResult JobWatch::resultOf(Job& job)
 
 bool JobWatch::wasStopped() const
 {
-    return m_interrupted || m_timedOut;
+    return wasInterrupted() || m_timedOut;
 }
 
 void JobWatch::setState(State state, bool clockRuns)
 {
     {
         const std::lock_guard<std::mutex> lock(m_lock);
+        if (m_state == Idle && state != Idle)
+            ++m_turn;
         m_state = state;
         m_clockRuns = clockRuns && m_timeoutSeconds > 0;
         m_isNew = true;
@@ -215,6 +218,12 @@ JobWatch::State JobWatch::state()
 {
     const std::lock_guard<std::mutex> lock(m_lock);
     return m_state;
+}
+
+bool JobWatch::hasNextTurn()
+{
+    const std::lock_guard<std::mutex> lock(m_lock);
+    return m_turn != m_timedOutTurn;
 }
 
 /// How long to wait; -1 where nothing bounds a job or call. When there is no time left it has timed
@@ -230,6 +239,8 @@ int JobWatch::millisecondsToWait()
     const auto left =
         std::chrono::duration_cast<std::chrono::milliseconds>(m_deadline - runningTime()).count();
     m_timedOut = left < 0;
+    if (m_timedOut)
+        m_timedOutTurn = m_turn;
     return left < 0 ? 0 : int(std::min<qint64>(left + 1, paceMilliseconds));
 }
 
@@ -278,7 +289,8 @@ bool JobWatch::stop()
     while (true) {
         // Again and again, since a job may start another tool, or its loop, only now.
         const State now = state();
-        if (now == Idle && !m_interrupted)
+        // The next one may have begun already, and has its own time.
+        if ((now == Idle || hasNextTurn()) && !m_interrupted)
             return true;
         if (now == InJob) {
             m_authenticator->cancel();
@@ -320,7 +332,7 @@ void JobWatch::cutOff()
     Prompt::restoreTerminal();
     if (cleanUp)
         cleanUp();
-    const bool isServiceSilent = state() == InCall && !m_interrupted;
+    const bool isServiceSilent = state() == InCall && !wasInterrupted();
     report(
         what, isServiceSilent
                   ? whyStopped() + QStringLiteral(": the file manager service does not answer")

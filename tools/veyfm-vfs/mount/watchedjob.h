@@ -107,6 +107,7 @@ private:
     bool wasStopped() const;
     void setState(State state, bool clockRuns);
     State state();
+    bool hasNextTurn();
     int millisecondsToWait();
     Clock::time_point runningTime() const;
     SignalPipe::Byte nextByte(int milliseconds);
@@ -118,11 +119,13 @@ private:
     const QSharedPointer<TerminalAuthenticator> m_authenticator;
     const int m_timeoutSeconds;
     SignalPipe m_pipe;
-    std::atomic<bool> m_interrupted{false};
+    std::atomic<bool> m_interrupted{false}; ///< Whether the thread has seen the signal.
     std::atomic<bool> m_timedOut{false};
 
     std::mutex m_lock; ///< For what follows.
     State m_state = Idle;
+    int m_turn = 0;         ///< Counts jobs and calls.
+    int m_timedOutTurn = 0; ///< The last one that had no time left.
     bool m_clockRuns = false;
     bool m_isNew = false; ///< Its time begins when the thread takes note.
     QEventLoop* m_loop = nullptr;
