@@ -367,16 +367,17 @@ UrlMount mountSamba(const QString& url, const Login& login, int timeoutSeconds)
     JobRunner runner(scheme, shownUrl(url), login, timeoutSeconds);
     runner.watch().setCutOff(shownUrl(url));
     runner.watch().call([&result] { result.why = whyNoRunningService(); });
-    if (!result.why.isEmpty()) {
-        result.why.prepend(QStringLiteral("Samba shares are reached through the service: "));
-        return result;
-    }
-    result.why = whyNoTool(scheme);
     if (!result.why.isEmpty())
-        return result;
-    result.why = runner.run<MountURLJob>(
-        [&url] { return url; },
-        [&result](const MountURLJob& job) { result.localPath = QDir::cleanPath(job.localPath()); });
+        result.why.prepend(QStringLiteral("Samba shares are reached through the service: "));
+    else
+        result.why = whyNoTool(scheme);
+    if (result.why.isEmpty()) {
+        result.why = runner.run<MountURLJob>(
+            [&url] { return url; },
+            [&result](const MountURLJob& job) {
+                result.localPath = QDir::cleanPath(job.localPath());
+            });
+    }
     result.wasInterrupted = runner.watch().wasInterrupted();
     return result;
 }
