@@ -54,8 +54,9 @@ void TestInotifyWatcher::metaObject()
 {
     const QMetaObject& meta = InotifyWatcher::staticMetaObject;
     QStringList methods;
-    for (int i = meta.methodOffset(); i < meta.methodCount(); ++i)
+    for (int i = meta.methodOffset(); i < meta.methodCount(); ++i) {
         methods.append(QString::fromLatin1(meta.method(i).methodSignature()));
+    }
     QCOMPARE(
         methods, lines(
                      {"pathUnregistered(QString)", "pathCreated(QString,QString)",
@@ -284,8 +285,9 @@ void TestInotifyWatcher::writeIsReportedOnClose()
     QVERIFY(scene.add("dir"));
     QFile file(scene.path("dir/file"));
     QVERIFY(file.open(QIODevice::Append | QIODevice::Unbuffered));
-    for (int i = 0; i < 3; ++i)
+    for (int i = 0; i < 3; ++i) {
         QCOMPARE(file.write("more"), qint64(4));
+    }
     QCOMPARE(scene.processedLog(), QStringList());
     file.close();
     QCOMPARE(scene.processedLog(), lines({"changed dir|file"}));

@@ -286,8 +286,9 @@ void TestInotifyWatcherLinks::notifySymlinks()
 
     const QString name = QStringLiteral("name");
     for (const char* signal :
-         {"pathCreated", "pathDeleted", "pathChanged", "pathAttributesChanged"})
+         {"pathCreated", "pathDeleted", "pathChanged", "pathAttributesChanged"}) {
         scene.watcher->notifySymlinks(signal, scene.path("target"), name);
+    }
     // Neither the link that waits for its verdict nor the request of the target.
     QCOMPARE(
         scene.takeLog(), lines(
@@ -320,11 +321,13 @@ void TestInotifyWatcherLinks::slotDeletesWatcher()
     QVERIFY(scene.makeLink("target", "link") && scene.makeLink("gone", "to-gone"));
     QVERIFY(scene.makeLink("target", "dir/back"));
     QVERIFY(scene.makeLink("dir", "verdict") && scene.makeLink("verdict", "to-verdict"));
-    for (const char* path : {"dir", "dir/back", "link", "to-gone", "verdict", "to-verdict"})
+    for (const char* path : {"dir", "dir/back", "link", "to-gone", "verdict", "to-verdict"}) {
         scene.add(path);
+    }
     const auto check = [&scene, &last] {
-        if (scene.watcher && scene.log.contains(last))
+        if (scene.watcher && scene.log.contains(last)) {
             scene.watcher.reset();
+        }
     };
     InotifyWatcher* w = scene.watcher.get();
     connect(w, &InotifyWatcher::pathCreated, w, check);

@@ -19,25 +19,32 @@ namespace {
 // 77 if the limit can't be lowered here, else the number of the step that went wrong.
 int runWithThreeWatches(const WatchScene& scene)
 {
-    if (unshare(CLONE_NEWUSER) != 0)
+    if (unshare(CLONE_NEWUSER) != 0) {
         return 77;
+    }
     const int limit = open("/proc/sys/user/max_inotify_watches", O_WRONLY);
-    if (limit == -1 || write(limit, "3", 1) != 1)
+    if (limit == -1 || write(limit, "3", 1) != 1) {
         return 77;
+    }
     close(limit);
 
     InotifyWatcher watcher(nullptr);
-    if (!watcher.addPath(scene.path("a")) || !watcher.addPath(scene.path("b")))
+    if (!watcher.addPath(scene.path("a")) || !watcher.addPath(scene.path("b"))) {
         return 1;
+    }
     // The link takes the last watch, and there is none left for its target.
-    if (watcher.addPath(scene.path("link")) || !watcher.isPathRegistered(scene.path("link")))
+    if (watcher.addPath(scene.path("link")) || !watcher.isPathRegistered(scene.path("link"))) {
         return 2;
-    if (watcher.isSymlinkRegistered(scene.path("link")))
+    }
+    if (watcher.isSymlinkRegistered(scene.path("link"))) {
         return 3;
-    if (watcher.addPath(scene.path("c")) || watcher.isPathRegistered(scene.path("c")))
+    }
+    if (watcher.addPath(scene.path("c")) || watcher.isPathRegistered(scene.path("c"))) {
         return 4;
-    if (!watcher.removePath(scene.path("a")) || !watcher.addPath(scene.path("c")))
+    }
+    if (!watcher.removePath(scene.path("a")) || !watcher.addPath(scene.path("c"))) {
         return 5;
+    }
     return watcher.clear() ? 0 : 6;
 }
 
@@ -105,8 +112,9 @@ void TestInotifyWatcherStress::queueOverflow()
     QFile limitFile(QStringLiteral("/proc/sys/fs/inotify/max_queued_events"));
     QVERIFY(limitFile.open(QIODevice::ReadOnly));
     const int limit = limitFile.readAll().trimmed().toInt();
-    if (limit > 200000)
+    if (limit > 200000) {
         QSKIP("The kernel's event queue is too long to be filled here.");
+    }
 
     WatchScene scene;
     QVERIFY(scene.makeDir("dir"));
@@ -114,8 +122,9 @@ void TestInotifyWatcherStress::queueOverflow()
     QVERIFY(scene.add("dir"));
     const QByteArray a = QFile::encodeName(scene.path("dir/a"));
     const QByteArray b = QFile::encodeName(scene.path("dir/b"));
-    for (int i = 0; i < limit + 100; ++i) // equal events in a row would be merged
+    for (int i = 0; i < limit + 100; ++i) { // equal events in a row would be merged
         QCOMPARE(chmod(i % 2 == 0 ? a.constData() : b.constData(), 0600), 0);
+    }
     const QStringList log = scene.processedLog();
     QCOMPARE(log.size(), limit);
     QCOMPARE(log.count(QStringLiteral("attributes dir|a")), (limit + 1) / 2);
@@ -136,13 +145,15 @@ void TestInotifyWatcherStress::manyWatches()
         QVERIFY(scene.add(name(i).constData()));
     }
     QCOMPARE(WatchScene::kernelWatchCount(), Count);
-    for (int i = 0; i < Count; i += 2)
+    for (int i = 0; i < Count; i += 2) {
         QVERIFY(scene.remove(name(i).constData()));
+    }
     QStringList expected;
     for (int i = 0; i < Count; ++i) {
         QVERIFY(scene.makeDir((name(i) + "/sub").constData()));
-        if (i % 2 == 1)
+        if (i % 2 == 1) {
             expected.append(QStringLiteral("created dir-%1|sub").arg(i));
+        }
     }
     QCOMPARE(scene.processedLog(), expected);
     QVERIFY(scene.watcher->clear());
@@ -235,13 +246,15 @@ void TestInotifyWatcherStress::watchLimit()
     // In a child with a user namespace of its own, since the limit is one of the namespace.
     const pid_t child = fork();
     QVERIFY(child != -1);
-    if (child == 0)
+    if (child == 0) {
         _exit(runWithThreeWatches(scene));
+    }
     int status = 0;
     QCOMPARE(waitpid(child, &status, 0), child);
     QVERIFY(WIFEXITED(status));
-    if (WEXITSTATUS(status) == 77)
+    if (WEXITSTATUS(status) == 77) {
         QSKIP("The watch limit can't be lowered here: no user namespace of one's own.");
+    }
     QCOMPARE(WEXITSTATUS(status), 0);
 }
 

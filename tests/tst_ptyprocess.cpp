@@ -38,8 +38,9 @@ QByteArray readToEnd(PtyProcess& process)
     QByteArray all;
     for (;;) {
         const QByteArray chunk = process.readAll(true);
-        if (chunk.isEmpty())
+        if (chunk.isEmpty()) {
             return all;
+        }
         all += chunk;
     }
 }
@@ -242,8 +243,9 @@ void TestPtyProcess::largeOutput()
     PtyProcess process;
     process.exec("seq", {"200000"});
     QByteArray expected;
-    for (int i = 1; i <= 200000; ++i)
+    for (int i = 1; i <= 200000; ++i) {
         expected += QByteArray::number(i) + '\n';
+    }
     QVERIFY(readToEnd(process) == expected);
     QCOMPARE(process.waitForChild(), 0);
 }
@@ -463,8 +465,9 @@ void TestPtyProcess::leavesNothing()
     for (int i = 0; i < 10; ++i) {
         std::unique_ptr<PtyProcess> process = std::make_unique<PtyProcess>();
         process->exec("echo", {"x"});
-        if (i % 2)
+        if (i % 2) {
             QCOMPARE(process->waitForChild(), 0);
+        }
         process->exec("veyfm-no-such-tool", {});
         process->exec("true", {});
     }
@@ -485,8 +488,9 @@ void TestPtyProcess::closesDescriptors()
     close(plain);
     // 10 and above are the shell's own.
     QCOMPARE(open.mid(0, 3), (QList<QByteArray>{"0", "1", "2"}));
-    for (const QByteArray& fd : open.mid(3))
+    for (const QByteArray& fd : open.mid(3)) {
         QVERIFY2(fd.toInt() >= 10, fd.constData());
+    }
 }
 
 void TestPtyProcess::signalsAsFresh()
@@ -545,10 +549,12 @@ void TestPtyProcess::manyAtOnce()
             }
         });
     }
-    for (std::thread& thread : threads)
+    for (std::thread& thread : threads) {
         thread.join();
-    for (int i = 0; i < 4; ++i)
+    }
+    for (int i = 0; i < 4; ++i) {
         QCOMPARE(seen[size_t(i)], (QByteArray::number(i) + "\n0").repeated(10));
+    }
     QVERIFY(!hasChildren());
 }
 

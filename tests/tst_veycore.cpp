@@ -142,8 +142,9 @@ void TestVeyCore::localEncoding()
 void TestVeyCore::unknown_data()
 {
     QTest::addColumn<int>("value");
-    for (int value : {0, 1, 5, 9, -1, INT_MAX, INT_MIN})
+    for (int value : {0, 1, 5, 9, -1, INT_MAX, INT_MIN}) {
         QTest::addRow("%d", value) << value;
+    }
 }
 
 void TestVeyCore::unknown()
@@ -181,8 +182,9 @@ void TestVeyCore::threads()
             }
         });
     }
-    for (std::thread& thread : threads)
+    for (std::thread& thread : threads) {
         thread.join();
+    }
     QCOMPARE(wrong.load(), 0);
 }
 

@@ -21,8 +21,9 @@ namespace {
 
 QByteArray executablePath(const QByteArray& command)
 {
-    if (command.contains('/'))
+    if (command.contains('/')) {
         return command;
+    }
     return QFile::encodeName(QStandardPaths::findExecutable(QFile::decodeName(command)));
 }
 
@@ -36,8 +37,9 @@ bool openTerminal(UniqueFd& master, UniqueFd& slave)
     }
     slave = UniqueFd(open(name, O_RDWR | O_NOCTTY | O_CLOEXEC));
     termios mode;
-    if (!slave.isValid() || tcgetattr(slave.get(), &mode) != 0)
+    if (!slave.isValid() || tcgetattr(slave.get(), &mode) != 0) {
         return false;
+    }
     // Questions are recognised and shown as the tool wrote them, without \r before each \n.
     mode.c_oflag &= ~tcflag_t(OPOST);
     return tcsetattr(slave.get(), TCSANOW, &mode) == 0;
@@ -50,8 +52,9 @@ void resetSignals()
     struct sigaction action = {};
     action.sa_handler = SIG_DFL;
     // Two numbers belong to the C library, which refuses them.
-    for (int number = 1; number < NSIG; ++number)
+    for (int number = 1; number < NSIG; ++number) {
         sigaction(number, &action, nullptr);
+    }
 
     // At the end of a session leader the kernel sends SIGHUP to its helpers, also when the leader
     // ended only to go on in the background. They inherit this.
@@ -65,13 +68,15 @@ void resetSignals()
 
 bool takeTerminal(int slave)
 {
-    if (setsid() < 0 || ioctl(slave, TIOCSCTTY, 0) != 0)
+    if (setsid() < 0 || ioctl(slave, TIOCSCTTY, 0) != 0) {
         return false;
+    }
     for (int fd = STDIN_FILENO; fd <= STDERR_FILENO; ++fd) {
         // A host without standard streams may get the terminal as one of them, and then dup2()
         // does not clear the flag.
-        if (dup2(slave, fd) < 0 || fcntl(fd, F_SETFD, 0) != 0)
+        if (dup2(slave, fd) < 0 || fcntl(fd, F_SETFD, 0) != 0) {
             return false;
+        }
     }
     return true;
 }
@@ -86,8 +91,9 @@ struct Gate
     bool make()
     {
         int ends[2];
-        if (pipe2(ends, O_CLOEXEC) != 0)
+        if (pipe2(ends, O_CLOEXEC) != 0) {
             return false;
+        }
         child = UniqueFd(ends[0]);
         parent = UniqueFd(ends[1]);
         return true;
@@ -123,8 +129,9 @@ pid_t forkWithoutSignals()
     sigfillset(&all);
     pthread_sigmask(SIG_SETMASK, &all, &before);
     const pid_t pid = fork();
-    if (pid != 0)
+    if (pid != 0) {
         pthread_sigmask(SIG_SETMASK, &before, nullptr);
+    }
     return pid;
 }
 
@@ -136,21 +143,25 @@ PtyChild launchOnPty(const QByteArray& command, const QList<QByteArray>& args)
     PtyChild child;
     UniqueFd slave;
     Gate gate;
-    if (path.isEmpty() || !openTerminal(child.master, slave) || !gate.make())
+    if (path.isEmpty() || !openTerminal(child.master, slave) || !gate.make()) {
         return {};
+    }
 
     std::vector<char*> argv;
     argv.reserve(size_t(args.size()) + 2);
     argv.push_back(const_cast<char*>(command.constData()));
-    for (const QByteArray& arg : args)
+    for (const QByteArray& arg : args) {
         argv.push_back(const_cast<char*>(arg.constData()));
+    }
     argv.push_back(nullptr);
 
     child.pid = forkWithoutSignals();
-    if (child.pid == 0)
+    if (child.pid == 0) {
         becomeTool(gate, slave.get(), path.constData(), argv.data());
-    if (child.pid < 0)
+    }
+    if (child.pid < 0) {
         return {};
+    }
 
     // By number: glibc 2.36 declares pidfd_open() without C linkage. The flag that closes it on
     // exec is always set.

@@ -30,8 +30,9 @@ public:
     }
     ~UniqueFd()
     {
-        if (m_fd >= 0)
+        if (m_fd >= 0) {
             close(m_fd);
+        }
     }
 
     bool isValid() const

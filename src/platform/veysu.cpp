@@ -76,8 +76,9 @@ public:
 bool PtyProcessPrivate::waitForOutput() const
 {
     pollfd wanted[] = {{child.master.get(), POLLIN, 0}, {child.handle.get(), POLLIN, 0}};
-    if (pollForInput(wanted, 2, -1) <= 0)
+    if (pollForInput(wanted, 2, -1) <= 0) {
         return false;
+    }
     // Once more, for what was printed between the two looks. The end of the terminal alone would
     // not do: a helper in the background that holds it open, as its standard error say, would
     // keep it from coming.
@@ -92,8 +93,9 @@ bool PtyProcessPrivate::readInto(QByteArray& output) const
     do {
         count = read(child.master.get(), buffer, sizeof buffer);
     } while (count < 0 && errno == EINTR);
-    if (count <= 0)
+    if (count <= 0) {
         return false;
+    }
     output.append(buffer, int(count));
     return true;
 }
@@ -112,13 +114,16 @@ void PtyProcessPrivate::reap()
 void PtyProcessPrivate::endChild()
 {
     child.master = UniqueFd();
-    if (child.pid < 0)
+    if (child.pid < 0) {
         return;
+    }
     // The process alone and not its group, which may hold helpers of what went to the background.
-    if (!childEnded(0))
+    if (!childEnded(0)) {
         kill(child.pid, SIGTERM);
-    if (!childEnded(TermMs))
+    }
+    if (!childEnded(TermMs)) {
         kill(child.pid, SIGKILL);
+    }
     reap();
 }
 
@@ -142,10 +147,12 @@ QByteArray PtyProcess::readAll(bool block)
 {
     QByteArray output = std::exchange(d_ptr->unread, QByteArray());
     const int master = d_ptr->child.master.get();
-    if (master < 0)
+    if (master < 0) {
         return output;
-    if (block && output.isEmpty() && !d_ptr->waitForOutput())
+    }
+    if (block && output.isEmpty() && !d_ptr->waitForOutput()) {
         return output;
+    }
 
     const QDeadlineTimer limit(GatherMs);
     while (output.size() < ChunkBytes && !limit.hasExpired() &&
@@ -165,12 +172,15 @@ int PtyProcess::WaitSlave()
     while (d_ptr->child.pid >= 0) {
         // The mode read on this side is that of the terminal, which both sides share.
         termios mode;
-        if (tcgetattr(fd(), &mode) != 0)
+        if (tcgetattr(fd(), &mode) != 0) {
             return -1;
-        if ((mode.c_lflag & ECHO) == 0)
+        }
+        if ((mode.c_lflag & ECHO) == 0) {
             return 0;
-        if (limit.hasExpired() || d_ptr->childEnded(EchoCheckMs))
+        }
+        if (limit.hasExpired() || d_ptr->childEnded(EchoCheckMs)) {
             return -1;
+        }
     }
     return -1;
 }

@@ -48,15 +48,17 @@ QString StandardPaths::documentsDirPath()
 QString StandardPaths::toCanonicalHostName(const QString& host)
 {
     const QByteArray ace = QUrl::toAce(host);
-    if (ace.isEmpty())
+    if (ace.isEmpty()) {
         return host;
+    }
 
     // No family and no socket type: the name alone counts, whatever addresses there are.
     addrinfo hints = {};
     hints.ai_flags = AI_CANONNAME;
     addrinfo* found = nullptr;
-    if (getaddrinfo(ace.constData(), nullptr, &hints, &found) != 0 || !found)
+    if (getaddrinfo(ace.constData(), nullptr, &hints, &found) != 0 || !found) {
         return host;
+    }
     const std::unique_ptr<addrinfo, decltype(&freeaddrinfo)> results(found, &freeaddrinfo);
 
     // Only the first result carries the name.

@@ -54,8 +54,9 @@ public:
         : m_size(read(fd, m_stack, sizeof(m_stack)))
     {
         // A read gives as many whole events as fit. Where one more would have fitted, none waits.
-        if (m_size > ssize_t(sizeof(m_stack) - LargestEvent))
+        if (m_size > ssize_t(sizeof(m_stack) - LargestEvent)) {
             readRest(fd);
+        }
     }
 
     const char* data() const
@@ -84,11 +85,13 @@ private:
     {
         int waiting = 0;
         ioctl(fd, FIONREAD, &waiting);
-        if (waiting <= 0)
+        if (waiting <= 0) {
             return;
+        }
         m_heap.reset(static_cast<char*>(std::malloc(size_t(m_size + waiting))));
-        if (!m_heap)
+        if (!m_heap) {
             qBadAlloc();
+        }
         std::memcpy(m_heap.get(), m_stack, size_t(m_size));
         m_size += std::max(ssize_t(0), read(fd, m_heap.get() + m_size, size_t(waiting)));
     }
@@ -104,8 +107,9 @@ bool isSymLink(const QString& path, const QByteArray& localPath)
     char firstByte;
     const bool sameFile = path.startsWith(QLatin1Char('/')) &&
                           std::strlen(localPath.constData()) == size_t(localPath.size());
-    if (sameFile && readlink(localPath.constData(), &firstByte, 1) == -1 && errno == EINVAL)
+    if (sameFile && readlink(localPath.constData(), &firstByte, 1) == -1 && errno == EINVAL) {
         return false;
+    }
     return QFileInfo(path).isSymLink();
 }
 
@@ -127,8 +131,9 @@ public:
 
     ~InotifyWatcherPrivate()
     {
-        if (fd >= 0)
+        if (fd >= 0) {
             close(fd);
+        }
     }
 
     Q_DISABLE_COPY(InotifyWatcherPrivate)
@@ -157,8 +162,9 @@ InotifyWatcher::InotifyWatcher(QObject* parent)
     : QObject(parent)
     , d(std::make_unique<InotifyWatcherPrivate>(this))
 {
-    if (d->fd < 0)
+    if (d->fd < 0) {
         return;
+    }
     auto* notifier = new QSocketNotifier(d->fd, QSocketNotifier::Read, this);
     connect(notifier, &QSocketNotifier::activated, this, &InotifyWatcher::processInotifyMessages);
 }
@@ -167,8 +173,9 @@ InotifyWatcher::~InotifyWatcher() = default;
 
 bool InotifyWatcher::addPath(const QString& path)
 {
-    if (d->fd < 0 || path.isEmpty())
+    if (d->fd < 0 || path.isEmpty()) {
         return false;
+    }
     if (d->watches.contains(path)) {
         d->links.request(path);
         return false;
@@ -176,18 +183,21 @@ bool InotifyWatcher::addPath(const QString& path)
 
     const QByteArray localPath = path.toLocal8Bit();
     const int descriptor = d->addWatch(localPath);
-    if (descriptor == -1)
+    if (descriptor == -1) {
         return false;
+    }
     d->watches.insert(path, descriptor);
-    if (!isSymLink(path, localPath))
+    if (!isSymLink(path, localPath)) {
         return true;
+    }
 
     const QString target = QFileInfo(path).symLinkTarget();
     if (!d->links.isTarget(target)) {
         const int targetDescriptor = d->addWatch(target.toLocal8Bit());
         // The link stays watched, although the caller is told of a failure.
-        if (targetDescriptor == -1)
+        if (targetDescriptor == -1) {
             return false;
+        }
         // A client may have asked for the target before. That request is not carried over to
         // the links: from here on the target counts as watched for their sake alone.
         d->watches.insert(target, targetDescriptor);
@@ -203,34 +213,41 @@ bool InotifyWatcher::removePath(const QString& path)
 
 bool InotifyWatcher::removePath(const QString& path, bool removeWatch)
 {
-    if (d->fd < 0)
+    if (d->fd < 0) {
         return false;
+    }
     const int descriptor = d->watches.descriptor(path);
-    if (descriptor == -1)
+    if (descriptor == -1) {
         return true;
+    }
 
     // The target of the last link stays watched: a later addPath() of the link finds it there.
     d->links.forget(path);
-    if (d->links.isTarget(path))
+    if (d->links.isTarget(path)) {
         return true;
-    if (removeWatch && inotify_rm_watch(d->fd, descriptor) == -1)
+    }
+    if (removeWatch && inotify_rm_watch(d->fd, descriptor) == -1) {
         return false;
+    }
     d->watches.remove(path);
     return true;
 }
 
 bool InotifyWatcher::clear()
 {
-    if (d->fd < 0)
+    if (d->fd < 0) {
         return true;
+    }
     bool allRemoved = true;
     const QList<int> descriptors = d->watches.descriptors();
     for (const int descriptor : descriptors) {
         // The kernel ends a watch once. If several paths share it, only the first of them goes.
-        if (inotify_rm_watch(d->fd, descriptor) == 0)
+        if (inotify_rm_watch(d->fd, descriptor) == 0) {
             d->watches.remove(d->watches.firstPath(descriptor));
-        if (!d->watches.firstPath(descriptor).isEmpty())
+        }
+        if (!d->watches.firstPath(descriptor).isEmpty()) {
             allRemoved = false;
+        }
     }
     d->links.clear();
     return allRemoved;
@@ -252,12 +269,14 @@ void InotifyWatcher::notifySymlinks(
     const QSet<QString> links = d->links.links(path);
     const QPointer<InotifyWatcher> alive(links.isEmpty() ? nullptr : this);
     for (const QString& link : links) {
-        if (d->deletedSymlinks.contains(link))
+        if (d->deletedSymlinks.contains(link)) {
             continue;
+        }
         QMetaObject::invokeMethod(
             this, signal, Qt::AutoConnection, Q_ARG(QString, link), Q_ARG(QString, fileName));
-        if (!alive)
+        if (!alive) {
             return;
+        }
     }
 }
 
@@ -265,14 +284,16 @@ void InotifyWatcher::processInotifyMessages()
 {
     {
         const EventBatch events(d->fd);
-        if (!d->processEvents(events.data(), events.size()))
+        if (!d->processEvents(events.data(), events.size())) {
             return;
+        }
     }
 
     // Each run starts a timer of its own and the first to fire settles all links, so a link that
     // is deleted while a timer runs gets less than the full time.
-    if (!d->deletedSymlinks.isEmpty())
+    if (!d->deletedSymlinks.isEmpty()) {
         QTimer::singleShot(DeletedLinkGraceMs, this, &InotifyWatcher::notifyDeletedSymlinks);
+    }
 }
 
 void InotifyWatcher::notifyDeletedSymlinks()
@@ -283,17 +304,20 @@ void InotifyWatcher::notifyDeletedSymlinks()
     const QSet<QString> deleted = d->deletedSymlinks;
     for (const QString& link : deleted) {
         Q_EMIT pathDeleted(link, QString());
-        if (alive)
+        if (alive) {
             notifySymlinks(Changed.name, link, QString());
-        if (!alive)
+        }
+        if (!alive) {
             return;
+        }
     }
     const QSet<QString> forgotten = d->deletedSymlinks;
     for (const QString& link : forgotten) {
         removePath(link, false);
         Q_EMIT pathUnregistered(link);
-        if (!alive)
+        if (!alive) {
             return;
+        }
     }
     d->deletedSymlinks.clear();
 }
@@ -303,8 +327,9 @@ bool InotifyWatcherPrivate::processEvents(const char* events, ssize_t size)
     ssize_t offset = 0;
     while (offset < size) {
         const auto* event = reinterpret_cast<const inotify_event*>(events + offset);
-        if (!processEvent(*event))
+        if (!processEvent(*event)) {
             return false;
+        }
         offset += ssize_t(sizeof(inotify_event) + event->len);
     }
     return true;
@@ -315,8 +340,9 @@ bool InotifyWatcherPrivate::processEvent(const inotify_event& event)
 {
     // No path: the watch was dropped since, maybe by a slot, or the queue overflowed.
     const QString path = watches.firstPath(event.wd);
-    if (path.isEmpty())
+    if (path.isEmpty()) {
         return true;
+    }
     const QString fileName = event.len == 0 ? QString() : QString::fromLocal8Bit(event.name);
     const uint32_t mask = event.mask;
 
@@ -324,19 +350,25 @@ bool InotifyWatcherPrivate::processEvent(const inotify_event& event)
         const QPointer<InotifyWatcher> alive(q);
         q->removePath(path, false);
         Q_EMIT q->pathUnregistered(path);
-        if (!alive)
+        if (!alive) {
             return false;
+        }
     }
-    if ((mask & (IN_CREATE | IN_MOVED_TO)) && !childAppeared(mask, path, fileName))
+    if ((mask & (IN_CREATE | IN_MOVED_TO)) && !childAppeared(mask, path, fileName)) {
         return false;
-    if ((mask & (IN_DELETE | IN_MOVED_FROM)) && !childWentAway(mask, path, fileName))
+    }
+    if ((mask & (IN_DELETE | IN_MOVED_FROM)) && !childWentAway(mask, path, fileName)) {
         return false;
-    if ((mask & (IN_DELETE_SELF | IN_MOVE_SELF)) && !selfWentAway(mask, path, fileName))
+    }
+    if ((mask & (IN_DELETE_SELF | IN_MOVE_SELF)) && !selfWentAway(mask, path, fileName)) {
         return false;
-    if ((mask & IN_CLOSE_WRITE) && !notify(Changed, path, fileName))
+    }
+    if ((mask & IN_CLOSE_WRITE) && !notify(Changed, path, fileName)) {
         return false;
-    if ((mask & IN_ATTRIB) && !notify(AttributesChanged, path, fileName))
+    }
+    if ((mask & IN_ATTRIB) && !notify(AttributesChanged, path, fileName)) {
         return false;
+    }
     return true;
 }
 
@@ -385,8 +417,9 @@ bool InotifyWatcherPrivate::selfWentAway(
     Q_EMIT q->pathDeleted(path, fileName);
     // The other way round than everywhere else: links are told of the loss of their target
     // itself, and for them that is a change.
-    if (alive && fileName.isEmpty())
+    if (alive && fileName.isEmpty()) {
         q->notifySymlinks(Changed.name, path, fileName);
+    }
     return alive;
 }
 
@@ -396,8 +429,9 @@ bool InotifyWatcherPrivate::notify(
 {
     const QPointer<InotifyWatcher> alive(q);
     Q_EMIT(q->*signal.emitter)(path, fileName);
-    if (alive && !fileName.isEmpty())
+    if (alive && !fileName.isEmpty()) {
         q->notifySymlinks(signal.name, path, fileName);
+    }
     return alive;
 }
 

@@ -33,16 +33,18 @@ void LinkTable::addLink(const QString& link, const QString& target)
 
 void LinkTable::request(const QString& target)
 {
-    if (isTarget(target))
+    if (isTarget(target)) {
         m_requested.insert(target);
+    }
 }
 
 void LinkTable::forget(const QString& path)
 {
     m_requested.remove(path);
     const auto target = m_targets.find(path);
-    if (target == m_targets.end())
+    if (target == m_targets.end()) {
         return;
+    }
     const auto links = m_links.find(*target);
     links->remove(path);
     if (links->isEmpty()) {

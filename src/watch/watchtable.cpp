@@ -33,10 +33,12 @@ void WatchTable::insert(const QString& path, int descriptor)
     const int count = m_descriptors.size();
     int& stored = m_descriptors[path];
     const bool overwritten = m_descriptors.size() == count;
-    if (overwritten && stored == descriptor)
+    if (overwritten && stored == descriptor) {
         return;
-    if (overwritten)
+    }
+    if (overwritten) {
         removeFromIndex(path, stored);
+    }
     stored = descriptor;
     addToIndex(path, descriptor);
 }
@@ -44,8 +46,9 @@ void WatchTable::insert(const QString& path, int descriptor)
 void WatchTable::remove(const QString& path)
 {
     const auto watch = m_descriptors.find(path);
-    if (watch == m_descriptors.end())
+    if (watch == m_descriptors.end()) {
         return;
+    }
     removeFromIndex(path, *watch);
     m_descriptors.erase(watch);
 }
@@ -58,8 +61,9 @@ void WatchTable::addToIndex(const QString& path, int descriptor)
         return;
     }
     QString other = path;
-    if (other < paths.first)
+    if (other < paths.first) {
         qSwap(other, paths.first);
+    }
     QStringList& others = paths.others;
     others.insert(std::lower_bound(others.begin(), others.end(), other), other);
 }
@@ -68,12 +72,13 @@ void WatchTable::removeFromIndex(const QString& path, int descriptor)
 {
     const auto paths = m_paths.find(descriptor);
     QStringList& others = paths->others;
-    if (path != paths->first)
+    if (path != paths->first) {
         others.erase(std::lower_bound(others.begin(), others.end(), path));
-    else if (!others.isEmpty())
+    } else if (!others.isEmpty()) {
         paths->first = others.takeFirst();
-    else
+    } else {
         m_paths.erase(paths);
+    }
 }
 
 } // namespace VeyFM

@@ -55,10 +55,11 @@ void checkFuse(const QUrl& url)
     require(QDir::cleanPath(root) == root, "an account is one directory");
     require(
         isAtOrBelow(below(root, url.path(QUrl::FullyDecoded)), root), "a path stays in its mount");
-    if (url.scheme() == QLatin1String("ftp"))
+    if (url.scheme() == QLatin1String("ftp")) {
         require(
             !user.contains(QLatin1Char(',')) && !user.contains(QLatin1Char('\\')),
             "a user is one mount option");
+    }
 }
 
 } // namespace
@@ -75,12 +76,14 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         require(words.size() == 6 && words.at(3) == text, "a user is one argument");
         require(!text.contains(QLatin1Char('%')), "a user has no password behind it");
     }
-    if (!whyNotMountable(text).isEmpty())
+    if (!whyNotMountable(text).isEmpty()) {
         return 0;
+    }
     require(shown == text, "what is mounted has no password");
-    if (text.startsWith(QLatin1String("smb")))
+    if (text.startsWith(QLatin1String("smb"))) {
         checkShare(SmbUrl(text));
-    else
+    } else {
         checkFuse(QUrl(text));
+    }
     return 0;
 }

@@ -63,8 +63,9 @@ private:
         const QList<QByteArray> lines = fileContents(u"/proc/self/mounts"_s).split('\n');
         for (const QByteArray& line : lines) {
             const QString directory = QFile::decodeName(line.split(' ').value(1));
-            if (directory.startsWith(mountDir(u"/"_s)))
+            if (directory.startsWith(mountDir(u"/"_s))) {
                 result.append(directory);
+            }
         }
         return result;
     }
@@ -84,11 +85,13 @@ void RealToolTest::init()
 
 void RealToolTest::cleanup()
 {
-    if (!Sandbox::isEntered())
+    if (!Sandbox::isEntered()) {
         return;
+    }
     const QStringList mounted = mountDirs();
-    for (const QString& directory : mounted)
+    for (const QString& directory : mounted) {
         QCOMPARE(QProcess::execute(u"fusermount3"_s, {u"-u"_s, directory}), 0);
+    }
     QDir(mountDir(QString())).removeRecursively();
     QTRY_VERIFY(processesNamed("ssh").isEmpty());
     QTRY_VERIFY(processesNamed("sshfs").isEmpty());

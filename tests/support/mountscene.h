@@ -26,8 +26,9 @@
 inline QString keepMountsPrivate()
 {
     if (::access("/dev/fuse", R_OK | W_OK) == 0 && ::unshare(CLONE_NEWNS) == 0 &&
-        ::mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0)
+        ::mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0) {
         return QString();
+    }
     return QStringLiteral("no mounts here: ") + QString::fromLocal8Bit(std::strerror(errno));
 }
 
@@ -44,8 +45,9 @@ public:
     ~MountScene()
     {
         const QStringList mounted = mounts();
-        for (const QString& relative : mounted)
+        for (const QString& relative : mounted) {
             ::umount2(QFile::encodeName(directory(relative)).constData(), MNT_DETACH);
+        }
     }
     MountScene(const MountScene&) = delete;
     MountScene& operator=(const MountScene&) = delete;
@@ -100,8 +102,9 @@ public:
     ToolResult runShell(const char* line, const QByteArray& text) const
     {
         QTemporaryDir directory;
-        if (!createFile(directory.path(), "text", text))
+        if (!createFile(directory.path(), "text", text)) {
             return ToolResult();
+        }
         return runProgram(
             QStringLiteral("setsid"),
             {QStringLiteral("--wait"), QStringLiteral("/bin/sh"), QStringLiteral("-c"),
@@ -126,14 +129,16 @@ public:
     {
         QStringList all;
         QFile file(QStringLiteral("/proc/thread-self/mountinfo"));
-        if (!file.open(QIODevice::ReadOnly))
+        if (!file.open(QIODevice::ReadOnly)) {
             return all;
+        }
         const QList<QByteArray> lines = file.readAll().split('\n');
         for (const QByteArray& line : lines) {
             const QString path = QFile::decodeName(
                 line.split(' ').value(4).replace("\\040", " ").replace("\\134", "\\"));
-            if (path.startsWith(directory() + QLatin1Char('/')))
+            if (path.startsWith(directory() + QLatin1Char('/'))) {
                 all.append(path.mid(directory().size() + 1));
+            }
         }
         return all;
     }

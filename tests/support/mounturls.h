@@ -309,8 +309,9 @@ inline QStringList accepted()
           "sftp://host/$(id);'\"`id`",
           "sftp://host/a:b@c",
           "sftp://me@host/-x/\u200c\u0646",
-          "sftp://host//etc"})
+          "sftp://host//etc"}) {
         all.append(QString::fromUtf8(text));
+    }
     return all;
 }
 

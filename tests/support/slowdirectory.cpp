@@ -41,20 +41,24 @@ SlowDirectory::SlowDirectory(Kind kind, const QString& mountPoint)
     , m_mountPoint(mountPoint)
 {
     m_mounted = mount();
-    if (m_mounted)
+    if (m_mounted) {
         m_thread = std::thread(&SlowDirectory::serve, this);
+    }
 }
 
 SlowDirectory::~SlowDirectory()
 {
     release();
     // The device ends with ENODEV once the last user of the mount has gone.
-    if (m_mounted)
+    if (m_mounted) {
         ::umount2(QFile::encodeName(m_mountPoint).constData(), MNT_DETACH);
-    if (m_thread.joinable())
+    }
+    if (m_thread.joinable()) {
         m_thread.join();
-    if (m_descriptor >= 0)
+    }
+    if (m_descriptor >= 0) {
         ::close(m_descriptor);
+    }
 }
 
 bool SlowDirectory::mount()
@@ -93,8 +97,9 @@ int SlowDirectory::progress() const
 void SlowDirectory::release()
 {
     const quint64 id = m_waiting.exchange(0);
-    if (id != 0)
+    if (id != 0) {
         answer(id, EIO, nullptr, 0);
+    }
 }
 
 void SlowDirectory::answer(quint64 id, int error, const void* data, size_t size)
@@ -105,8 +110,9 @@ void SlowDirectory::answer(quint64 id, int error, const void* data, size_t size)
     header.unique = id;
     iovec parts[] = {{&header, sizeof header}, {const_cast<void*>(data), size}};
     // Who asked may have been killed meanwhile; then there is nobody to answer.
-    if (::writev(m_descriptor, parts, size > 0 ? 2 : 1) < 0)
+    if (::writev(m_descriptor, parts, size > 0 ? 2 : 1) < 0) {
         return;
+    }
 }
 
 void SlowDirectory::answerLookup(quint64 id, const char* name)
@@ -114,10 +120,11 @@ void SlowDirectory::answerLookup(quint64 id, const char* name)
     fuse_entry_out reply = {};
     reply.nodeid = FUSE_ROOT_ID + 1;
     reply.attr = directoryAttributes(reply.nodeid);
-    if (std::strcmp(name, "a") == 0)
+    if (std::strcmp(name, "a") == 0) {
         answer(id, 0, &reply, sizeof reply);
-    else
+    } else {
         answer(id, ENOENT, nullptr, 0);
+    }
 }
 
 void SlowDirectory::answerNames(quint64 id, quint64 offset, size_t size)
@@ -126,8 +133,9 @@ void SlowDirectory::answerNames(quint64 id, quint64 offset, size_t size)
     for (;;) {
         const QByteArray name = "file-" + QByteArray::number(offset + 1);
         const size_t recordSize = FUSE_DIRENT_ALIGN(FUSE_NAME_OFFSET + size_t(name.size()));
-        if (size_t(records.size()) + recordSize > size)
+        if (size_t(records.size()) + recordSize > size) {
             break;
+        }
         fuse_dirent record = {};
         record.ino = offset + 2;
         record.off = ++offset;
@@ -147,10 +155,12 @@ void SlowDirectory::serve()
     alignas(fuse_in_header) char request[FUSE_MIN_READ_BUFFER + 4096];
     for (;;) {
         const ssize_t size = ::read(m_descriptor, request, sizeof request);
-        if (size < 0 && (errno == EINTR || errno == ENOENT || errno == EAGAIN))
+        if (size < 0 && (errno == EINTR || errno == ENOENT || errno == EAGAIN)) {
             continue;
-        if (size < ssize_t(sizeof(fuse_in_header)))
+        }
+        if (size < ssize_t(sizeof(fuse_in_header))) {
             return;
+        }
         const auto* header = reinterpret_cast<const fuse_in_header*>(request);
         switch (header->opcode) {
         case FUSE_INIT: {

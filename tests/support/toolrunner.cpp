@@ -13,8 +13,9 @@
 QList<QByteArray> ToolResult::lines() const
 {
     QList<QByteArray> all = out.split('\n');
-    if (!all.isEmpty() && all.constLast().isEmpty())
+    if (!all.isEmpty() && all.constLast().isEmpty()) {
         all.removeLast();
+    }
     return all;
 }
 
@@ -40,10 +41,11 @@ QProcessEnvironment toolEnvironment(const QMap<QString, QString>& variables)
     environment.remove(QStringLiteral("COLUMNS"));
     environment.insert(QStringLiteral("TERM"), QStringLiteral("xterm"));
     for (auto it = variables.begin(); it != variables.end(); ++it) {
-        if (it.value().isNull())
+        if (it.value().isNull()) {
             environment.remove(it.key());
-        else
+        } else {
             environment.insert(it.key(), it.value());
+        }
     }
     return environment;
 }
@@ -54,13 +56,15 @@ ToolResult runProgram(
 {
     QProcess process;
     process.setProcessEnvironment(environment);
-    if (!directory.isEmpty())
+    if (!directory.isEmpty()) {
         process.setWorkingDirectory(directory);
+    }
     process.setStandardInputFile(QProcess::nullDevice());
     process.start(program, arguments);
     ToolResult result;
-    if (process.waitForFinished(60000) && process.exitStatus() == QProcess::NormalExit)
+    if (process.waitForFinished(60000) && process.exitStatus() == QProcess::NormalExit) {
         result.exitCode = process.exitCode();
+    }
     result.out = process.readAllStandardOutput();
     result.err = process.readAllStandardError();
     return result;
@@ -76,8 +80,9 @@ bool createFile(const QString& directory, const QByteArray& name, const QByteArr
 {
     const QByteArray path = QFile::encodeName(directory) + '/' + name;
     const int descriptor = ::open(path.constData(), O_CREAT | O_WRONLY | O_CLOEXEC, 0644);
-    if (descriptor < 0)
+    if (descriptor < 0) {
         return false;
+    }
     const bool written =
         ::write(descriptor, content.constData(), size_t(content.size())) == content.size();
     return ::close(descriptor) == 0 && written;

@@ -31,8 +31,9 @@ public:
 
     ~ToolScene()
     {
-        if (m_control && m_control->isRunning())
+        if (m_control && m_control->isRunning()) {
             m_control->exit();
+        }
     }
 
     bool isReady() const
@@ -63,15 +64,18 @@ public:
 private:
     ToolScene(const QJsonObject& script, Service service, const QStringList& arguments)
     {
-        if (service != Missing)
+        if (service != Missing) {
             m_bus.installFakeService(script, arguments);
+        }
         m_ready = m_bus.start();
-        if (!m_ready)
+        if (!m_ready) {
             return;
+        }
         m_control = std::make_unique<FakeServiceControl>(m_bus.address());
-        if (service == Running)
+        if (service == Running) {
             m_ready = runTool({QStringLiteral("tree")}, QString(), environment()).exitCode == 0 &&
                       m_control->waitForService();
+        }
     }
 
     PrivateBus m_bus;

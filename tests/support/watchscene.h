@@ -136,8 +136,9 @@ public:
         QStringList result;
         const QStringList all = processedLog();
         for (const QString& line : all) {
-            if (!line.startsWith(QLatin1String("attributes")))
+            if (!line.startsWith(QLatin1String("attributes"))) {
                 result.append(line);
+            }
         }
         return result;
     }
@@ -150,8 +151,9 @@ public:
         const QStringList names = infos.entryList(QDir::Files);
         for (const QString& name : names) {
             QFile info(infos.filePath(name));
-            if (!info.open(QIODevice::ReadOnly))
+            if (!info.open(QIODevice::ReadOnly)) {
                 continue;
+            }
             const QList<QByteArray> lines = info.readAll().split('\n');
             for (const QByteArray& line : lines) {
                 const int mask = line.indexOf(" mask:");
@@ -185,8 +187,9 @@ private:
 
     void note(const char* name, QString path)
     {
-        if (path.startsWith(m_dir.path() + QLatin1Char('/')))
+        if (path.startsWith(m_dir.path() + QLatin1Char('/'))) {
             path.remove(0, m_dir.path().size() + 1);
+        }
         log.append(QLatin1String(name) + QLatin1Char(' ') + path);
     }
 
@@ -201,8 +204,9 @@ public:
 inline QStringList lines(std::initializer_list<const char*> texts)
 {
     QStringList result;
-    for (const char* text : texts)
+    for (const char* text : texts) {
         result.append(QString::fromUtf8(text));
+    }
     return result;
 }
 

@@ -13,8 +13,9 @@ const QString listMethod = QStringLiteral("FavouritePlacesManager.favouritePlace
 QJsonObject favourites(const QList<QStringList>& records)
 {
     QJsonArray array;
-    for (const QStringList& record : records)
+    for (const QStringList& record : records) {
         array.append(QJsonArray::fromStringList(record));
+    }
     return scriptOf(listMethod, array);
 }
 
@@ -24,8 +25,9 @@ QStringList changes(FakeServiceControl& service)
     const QStringList calls = service.calls();
     for (const QString& call : calls) {
         if (call.contains(QLatin1String("addFavourite")) ||
-            call.contains(QLatin1String("removeFavourite")))
+            call.contains(QLatin1String("removeFavourite"))) {
             found.append(call);
+        }
     }
     return found;
 }

@@ -175,8 +175,9 @@ void ToolCompletionTest::scriptsParse()
 {
     QFETCH(const QString, program);
     QFETCH(const QString, script);
-    if (shell(program).isEmpty())
+    if (shell(program).isEmpty()) {
         QSKIP("the shell is not installed");
+    }
     const ToolResult result = runProgram(program, {QStringLiteral("-n"), toolSource(script)});
     QCOMPARE(result.exitCode, 0);
     QCOMPARE(result.err, QByteArray());
@@ -202,8 +203,9 @@ void ToolCompletionTest::bashFunction()
 {
     QFETCH(const QString, words);
     QFETCH(const QByteArray, replies);
-    if (shell(QStringLiteral("bash")).isEmpty())
+    if (shell(QStringLiteral("bash")).isEmpty()) {
         QSKIP("bash is not installed");
+    }
     QTemporaryDir directory;
     // compopt works during a completion only; the test on a terminal has the real one.
     const QString script =
@@ -226,8 +228,9 @@ void ToolCompletionTest::bashFunction()
 void ToolCompletionTest::bashForReal()
 {
     const QString bash = shell(QStringLiteral("bash"));
-    if (bash.isEmpty())
+    if (bash.isEmpty()) {
         QSKIP("bash is not installed");
+    }
     QTemporaryDir directory;
     QVERIFY(createFile(directory.path(), "a long name"));
     TerminalSession session(
@@ -256,8 +259,9 @@ void ToolCompletionTest::bashForReal()
 void ToolCompletionTest::zshForReal()
 {
     const QString zsh = shell(QStringLiteral("zsh"));
-    if (zsh.isEmpty())
+    if (zsh.isEmpty()) {
         QSKIP("zsh is not installed");
+    }
     QTemporaryDir directory;
     QVERIFY(createFile(directory.path(), "a long name"));
     TerminalSession session(

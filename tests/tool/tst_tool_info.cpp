@@ -22,9 +22,10 @@ QStringList texts(const QJsonValue& array)
 {
     QStringList result;
     const QJsonArray elements = array.toArray();
-    for (const QJsonValue& element : elements)
+    for (const QJsonValue& element : elements) {
         result.append(
             element.isObject() ? element[QLatin1String("path")].toString() : element.toString());
+    }
     return result;
 }
 

@@ -48,8 +48,9 @@ void ToolInterruptTest::endlessDirectory()
     QFETCH(const QStringList, arguments);
     QTemporaryDir mountPoint;
     const SlowDirectory directory(SlowDirectory::Endless, mountPoint.path());
-    if (!directory.problem().isEmpty())
+    if (!directory.problem().isEmpty()) {
         QSKIP(qPrintable(QStringLiteral("no slow directory here: ") + directory.problem()));
+    }
 
     QTemporaryDir other;
     QVERIFY(createFile(other.path(), "finished"));
@@ -74,8 +75,9 @@ void ToolInterruptTest::stalledDirectory()
 {
     QTemporaryDir mountPoint;
     SlowDirectory directory(SlowDirectory::Stalled, mountPoint.path());
-    if (!directory.problem().isEmpty())
+    if (!directory.problem().isEmpty()) {
         QSKIP(qPrintable(QStringLiteral("no slow directory here: ") + directory.problem()));
+    }
 
     QProcess process;
     process.start(toolPath(), {QStringLiteral("list"), mountPoint.path()});
@@ -94,8 +96,9 @@ void ToolInterruptTest::stalledDirectory()
 void ToolInterruptTest::stuckOutput()
 {
     QTemporaryDir directory;
-    for (int i = 0; i < 1000; ++i)
+    for (int i = 0; i < 1000; ++i) {
         QVERIFY(createFile(directory.path(), QByteArray(200, 'x') + QByteArray::number(i)));
+    }
     QTemporaryDir pipes;
     const QString fifo = pipes.filePath(QStringLiteral("fifo"));
     QCOMPARE(::mkfifo(fifo.toLocal8Bit().constData(), 0600), 0);
@@ -128,8 +131,9 @@ void ToolInterruptTest::controlC()
 {
     QTemporaryDir mountPoint;
     const SlowDirectory directory(SlowDirectory::Endless, mountPoint.path());
-    if (!directory.problem().isEmpty())
+    if (!directory.problem().isEmpty()) {
         QSKIP(qPrintable(QStringLiteral("no slow directory here: ") + directory.problem()));
+    }
 
     TerminalSession session(
         toolPath(), {QStringLiteral("list"), mountPoint.path()}, mountPoint.path(),
@@ -148,8 +152,9 @@ void ToolInterruptTest::ignoredSignalStaysIgnored()
     // What a shell does to what it starts in the background.
     QTemporaryDir mountPoint;
     SlowDirectory directory(SlowDirectory::Stalled, mountPoint.path());
-    if (!directory.problem().isEmpty())
+    if (!directory.problem().isEmpty()) {
         QSKIP(qPrintable(QStringLiteral("no slow directory here: ") + directory.problem()));
+    }
 
     QProcess process;
     process.start(

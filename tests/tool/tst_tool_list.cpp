@@ -18,8 +18,9 @@ namespace {
 QStringList names(const QJsonArray& array)
 {
     QStringList result;
-    for (const QJsonValue& value : array)
+    for (const QJsonValue& value : array) {
         result.append(value[QLatin1String("name")].toString());
+    }
     return result;
 }
 

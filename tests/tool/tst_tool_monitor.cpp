@@ -19,8 +19,9 @@ class Monitor
 public:
     explicit Monitor(const QStringList& arguments, const QString& directory = QString())
     {
-        if (!directory.isEmpty())
+        if (!directory.isEmpty()) {
             m_process.setWorkingDirectory(directory);
+        }
         m_process.start(toolPath(), QStringList(QStringLiteral("monitor")) + arguments);
     }
 
@@ -52,8 +53,9 @@ public:
     int end(int signalNumber)
     {
         ::kill(pid_t(m_process.processId()), signalNumber);
-        if (!m_process.waitForFinished(20000) || m_process.exitStatus() != QProcess::NormalExit)
+        if (!m_process.waitForFinished(20000) || m_process.exitStatus() != QProcess::NormalExit) {
             return -1;
+        }
         return m_process.exitCode();
     }
 
@@ -76,8 +78,9 @@ private:
         const QStringList names = descriptors.entryList(QDir::Files);
         for (const QString& name : names) {
             QFile file(descriptors.filePath(name));
-            if (file.open(QIODevice::ReadOnly))
+            if (file.open(QIODevice::ReadOnly)) {
                 count += file.readAll().count("inotify wd:");
+            }
         }
         return count;
     }

@@ -40,8 +40,9 @@ private Q_SLOTS:
 void ToolMountTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountTest::withoutService()

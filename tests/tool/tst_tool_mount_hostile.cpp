@@ -20,8 +20,9 @@ QByteArrayList sshfsArguments(const QString& directory, const char* target)
 QByteArrayList curlftpfsArguments(const QString& directory, const char* user)
 {
     QByteArrayList arguments = {"host", QFile::encodeName(directory)};
-    if (user)
+    if (user) {
         arguments = QByteArrayList({"-o", QByteArray("user=") + user}) + arguments;
+    }
     return arguments;
 }
 
@@ -57,8 +58,9 @@ void ToolMountHostileTest::initTestCase()
 
 void ToolMountHostileTest::standForAll(MountScene& scene)
 {
-    for (const char* tool : tools)
+    for (const char* tool : tools) {
         scene.tool.alsoStandFor(tool);
+    }
 }
 
 void ToolMountHostileTest::refused_data()
@@ -71,9 +73,10 @@ void ToolMountHostileTest::refused_data()
         // What no command line can hold.
         const bool fits = !each.text.contains(QChar(QChar::Null)) &&
                           QString::fromLocal8Bit(each.text.toLocal8Bit()) == each.text;
-        if (fits)
+        if (fits) {
             QTest::newRow(QByteArray::number(++number) + ' ' + each.reason.toUtf8())
                 << each.text << each.reason;
+        }
     }
 }
 
@@ -131,8 +134,9 @@ void ToolMountHostileTest::sftp()
     QFETCH(const QByteArray, target);
     QFETCH(const QString, directory);
     QFETCH(const QString, path);
-    if (!m_problem.isEmpty())
+    if (!m_problem.isEmpty()) {
         QSKIP(qPrintable(m_problem));
+    }
     MountScene scene("sshfs");
     standForAll(scene);
     scene.tool.expect(Said::success());
@@ -177,8 +181,9 @@ void ToolMountHostileTest::ftp()
     QFETCH(const QByteArray, user);
     QFETCH(const QString, directory);
     QFETCH(const QString, path);
-    if (!m_problem.isEmpty())
+    if (!m_problem.isEmpty()) {
         QSKIP(qPrintable(m_problem));
+    }
     MountScene scene("curlftpfs");
     standForAll(scene);
     scene.tool.expect(Said::success());

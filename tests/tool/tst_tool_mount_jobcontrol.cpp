@@ -78,8 +78,9 @@ private Q_SLOTS:
 void ToolMountJobControlTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountJobControlTest::stopped()
@@ -227,8 +228,9 @@ void ToolMountJobControlTest::endedWhileStopped()
     const auto session = scene.onTerminal("mount sftp://me@host/");
     QVERIFY(session->waitFor(question));
     QVERIFY(!session->hasEcho());
-    for (const int number : {SIGSTOP, SIGQUIT, SIGCONT})
+    for (const int number : {SIGSTOP, SIGQUIT, SIGCONT}) {
         ::kill(session->processId(), number);
+    }
     QCOMPARE(session->waitForEnd(), -1);
     QCOMPARE(session->processId(), -1);
     QCOMPARE(session->output().count(question), 1);

@@ -67,8 +67,9 @@ private:
 void ToolMountLoginTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountLoginTest::passwordOfDescriptor_data()
@@ -336,8 +337,9 @@ void ToolMountLoginTest::sambaThreeTries()
     QVERIFY(service.isReady());
     MountScene scene("smbclient", &service);
     refuseGuest(scene.tool);
-    for (int i = 0; i < 3; ++i)
+    for (int i = 0; i < 3; ++i) {
         scene.tool.expect({"out NT_STATUS_LOGON_FAILURE\\n", "exit 1"});
+    }
     const auto session = scene.onTerminal("mount --user you smb://host/share");
     for (int i = 1; i <= 3; ++i) {
         QVERIFY(session->waitFor("Password for you on smb://host/share: ", i));

@@ -25,8 +25,9 @@ public:
     }
     ~OtherMount()
     {
-        if (m_device >= 0)
+        if (m_device >= 0) {
             ::close(m_device);
+        }
     }
     OtherMount(const OtherMount&) = delete;
     OtherMount& operator=(const OtherMount&) = delete;
@@ -47,8 +48,9 @@ class OlderSibling
 public:
     ~OlderSibling()
     {
-        if (id() > 0)
+        if (id() > 0) {
             ::kill(id(), SIGKILL);
+        }
     }
 
     /// For a shell: $0 is the program.
@@ -102,8 +104,9 @@ private Q_SLOTS:
 void ToolMountOthersTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountOthersTest::duringQuestion_data()
@@ -227,8 +230,9 @@ void ToolMountOthersTest::besideSilentService()
     QCOMPARE(process.exitCode(), 1);
     QCOMPARE(scene.tool.runs(), 0);
     QCOMPARE(scene.mounts().size(), isMounted ? 1 : 0);
-    if (!isMounted)
+    if (!isMounted) {
         QVERIFY(QFile::exists(directory));
+    }
 }
 
 void ToolMountOthersTest::ofKilledTool()

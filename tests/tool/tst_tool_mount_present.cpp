@@ -36,8 +36,9 @@ private Q_SLOTS:
 void ToolMountPresentTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountPresentTest::mountedAlready()
@@ -186,8 +187,9 @@ void ToolMountPresentTest::hiddenMount()
     const QByteArray path = QFile::encodeName(directory);
     QCOMPARE(::mount("other", path.constData(), "tmpfs", 0, nullptr), 0);
     const ToolResult result = scene.run("mount --json sftp://me@host/");
-    while (scene.mounts().size() > 1)
+    while (scene.mounts().size() > 1) {
         ::umount2(path.constData(), MNT_DETACH);
+    }
     QCOMPARE(
         result.json().at(0).toObject().value(QStringLiteral("alreadyMounted")), QJsonValue(false));
     QCOMPARE(scene.tool.runs(), 1);

@@ -23,8 +23,9 @@ QStringList processesThatShow(const QByteArray& text)
     for (const QString& name : names) {
         for (const char* file : {"cmdline", "environ"}) {
             const QString path = QStringLiteral("/proc/%1/%2").arg(name, QLatin1String(file));
-            if (name.at(0).isDigit() && contents(path).contains(text))
+            if (name.at(0).isDigit() && contents(path).contains(text)) {
                 all.append(path);
+            }
         }
     }
     return all;
@@ -47,8 +48,9 @@ private Q_SLOTS:
 void ToolMountSecretTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountSecretTest::noCoreFile()

@@ -51,8 +51,9 @@ private:
 void ToolMountSignalsTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountSignalsTest::interruptedQuestion_data()
@@ -72,10 +73,11 @@ void ToolMountSignalsTest::interruptedQuestion()
     const auto session = scene.onTerminal("mount sftp://me@host/");
     QVERIFY(session->waitFor("Password for me on sftp://host: "));
     session->type("half");
-    if (number == 0)
+    if (number == 0) {
         session->type("\003");
-    else
+    } else {
         ::kill(session->processId(), number);
+    }
     QCOMPARE(session->waitForEnd(), 1);
     QVERIFY2(
         session->output().endsWith("\nveyfm-vfs: sftp://me@host/: interrupted\n"),

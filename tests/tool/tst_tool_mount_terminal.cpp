@@ -38,8 +38,9 @@ private Q_SLOTS:
 void ToolMountTerminalTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountTerminalTest::password()
@@ -130,8 +131,9 @@ void ToolMountTerminalTest::refusedWithoutUser()
 void ToolMountTerminalTest::threeTries()
 {
     MountScene scene("sshfs");
-    for (int i = 0; i < 3; ++i)
+    for (int i = 0; i < 3; ++i) {
         scene.tool.expect(Said::sshPassword() + Said::sshRefusal());
+    }
     const auto session = scene.onTerminal("mount sftp://me@host/");
     int asked = 0;
     for (const char* password : {"first\n", "second\n", "third\n"}) {

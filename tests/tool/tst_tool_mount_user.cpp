@@ -21,8 +21,9 @@ private Q_SLOTS:
 void ToolMountUserTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountUserTest::outsideTheGroup()

@@ -38,8 +38,9 @@ private Q_SLOTS:
 void ToolMountWatchTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolMountWatchTest::hungTool_data()
@@ -239,8 +240,9 @@ void ToolMountWatchTest::stoppedService()
 void ToolMountWatchTest::serviceNeverAnswers_data()
 {
     QTest::addColumn<QByteArray>("url");
-    for (const char* url : {"sftp://me@host/", "ftp://host/", "smb://host/share"})
+    for (const char* url : {"sftp://me@host/", "ftp://host/", "smb://host/share"}) {
         QTest::newRow(url) << QByteArray(url);
+    }
 }
 
 void ToolMountWatchTest::serviceNeverAnswers()

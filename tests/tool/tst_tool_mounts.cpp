@@ -42,8 +42,9 @@ QJsonObject registered()
 MountInfo kernel(const QByteArrayList& mounts)
 {
     QByteArray text;
-    for (const QByteArray& mount : mounts)
+    for (const QByteArray& mount : mounts) {
         text += "1 2 0:1 / " + mount + " rw\n";
+    }
     return MountInfo(text);
 }
 
@@ -59,8 +60,9 @@ QStringList lines(const RegisteredMounts& registered, const MountInfo& kernel)
     QStringList all;
     const QVector<NetworkMount> mounts =
         networkMounts(registered, kernel, QStringLiteral("/root/mounts"));
-    for (const NetworkMount& mount : mounts)
+    for (const NetworkMount& mount : mounts) {
         all.append(line(mount));
+    }
     return all;
 }
 
@@ -305,8 +307,9 @@ void ToolMountsTest::unknownRegistry()
 void ToolMountsTest::realMounts()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
     MountScene alone("sshfs");
     alone.tool.expect(Said::success());
     QCOMPARE(alone.run("mount sftp://me@host/~/dir").exitCode, 0);

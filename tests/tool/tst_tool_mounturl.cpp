@@ -54,8 +54,9 @@ void ToolMountUrlTest::refused_data()
     QTest::addColumn<QString>("text");
     QTest::addColumn<QString>("reason");
     const QVector<MountUrls::Refused> all = MountUrls::refused();
-    for (const MountUrls::Refused& each : all)
+    for (const MountUrls::Refused& each : all) {
         QTest::newRow(named(each.text) + " -- " + each.reason.toUtf8()) << each.text << each.reason;
+    }
 }
 
 void ToolMountUrlTest::refused()
@@ -70,8 +71,9 @@ void ToolMountUrlTest::accepted_data()
 {
     QTest::addColumn<QString>("text");
     const QStringList all = MountUrls::accepted();
-    for (const QString& text : all)
+    for (const QString& text : all) {
         QTest::newRow(named(text)) << text;
+    }
 }
 
 void ToolMountUrlTest::accepted()

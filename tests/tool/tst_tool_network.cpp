@@ -115,8 +115,9 @@ void ToolNetworkTest::refusesToAdd_data()
     const auto row = [](const char* name, const char* url, const char* bookmark,
                         const char* message) {
         QStringList operands(QString::fromLatin1(url));
-        if (bookmark)
+        if (bookmark) {
             operands.append(QString::fromLatin1(bookmark));
+        }
         QTest::newRow(name) << operands << QByteArray(message);
     };
     row("same name", "sftp://other", "work",

@@ -93,8 +93,9 @@ void ToolServiceTest::missingService()
 void ToolServiceTest::groupsNeedACommand_data()
 {
     QTest::addColumn<QString>("verb");
-    for (const char* verb : {"storage", "bookmark", "network"})
+    for (const char* verb : {"storage", "bookmark", "network"}) {
         QTest::newRow(verb) << QString::fromLatin1(verb);
+    }
 }
 
 void ToolServiceTest::groupsNeedACommand()

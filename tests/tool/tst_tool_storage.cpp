@@ -29,8 +29,9 @@ QStringList callsOf(FakeServiceControl& service, const QString& method)
     QStringList found;
     const QStringList calls = service.calls();
     for (const QString& call : calls) {
-        if (call.startsWith(method + QLatin1Char('[')))
+        if (call.startsWith(method + QLatin1Char('['))) {
             found.append(call);
+        }
     }
     return found;
 }

@@ -47,8 +47,9 @@ private Q_SLOTS:
 void ToolTerminalTest::columns()
 {
     QTemporaryDir directory;
-    for (const char* name : {"a", "bb", "ccc", "dddd", "eeeee"})
+    for (const char* name : {"a", "bb", "ccc", "dddd", "eeeee"}) {
         QVERIFY(createFile(directory.path(), name));
+    }
     const QStringList list = {QStringLiteral("list")};
     QCOMPARE(
         onTerminal(list, directory.path(), noColour, 80), QByteArray("a  bb  ccc  dddd  eeeee\n"));
@@ -61,8 +62,9 @@ void ToolTerminalTest::columns()
 void ToolTerminalTest::columnsOfWideNames()
 {
     QTemporaryDir directory;
-    for (const char* name : {"\346\227\245\346\234\254", "a\314\210", "x", "y"})
+    for (const char* name : {"\346\227\245\346\234\254", "a\314\210", "x", "y"}) {
         QVERIFY(createFile(directory.path(), name));
+    }
     // Two columns a sign, and none for the combining dots.
     QCOMPARE(
         onTerminal({QStringLiteral("list")}, directory.path(), noColour, 10),
@@ -110,8 +112,9 @@ void ToolTerminalTest::everyLineFits()
             QVERIFY(!line.endsWith(' '));
             const QList<QByteArray> parts = line.simplified().split(' ');
             for (const QByteArray& part : parts) {
-                if (!part.isEmpty())
+                if (!part.isEmpty()) {
                     words.append(part);
+                }
             }
         }
         QVERIFY(width < 80 || lines.size() < 150);

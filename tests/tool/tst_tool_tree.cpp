@@ -18,8 +18,9 @@ QJsonArray childNodes(const QJsonValue& node)
 QStringList names(const QJsonArray& nodes)
 {
     QStringList result;
-    for (const QJsonValue& node : nodes)
+    for (const QJsonValue& node : nodes) {
         result.append(node[QLatin1String("name")].toString());
+    }
     return result;
 }
 
@@ -54,8 +55,9 @@ void ToolTreeTest::placesByDefault()
     QVERIFY(result.err.isEmpty());
     QList<QByteArray> names;
     const QList<QByteArray> lines = result.lines();
-    for (const QByteArray& line : lines)
+    for (const QByteArray& line : lines) {
         names.append(line.split('/').constFirst().trimmed());
+    }
     QCOMPARE(
         names, QList<QByteArray>(
                    {"Favourites", "Computer", "├── Home", "├── Desktop", "├── Trash",

@@ -42,8 +42,9 @@ private Q_SLOTS:
 void ToolUpdateTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolUpdateTest::bookmarkIsMounted_data()

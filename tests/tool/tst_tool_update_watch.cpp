@@ -26,8 +26,9 @@ private Q_SLOTS:
 void ToolUpdateWatchTest::initTestCase()
 {
     const QString problem = keepMountsPrivate();
-    if (!problem.isEmpty())
+    if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
+    }
 }
 
 void ToolUpdateWatchTest::interrupted_data()

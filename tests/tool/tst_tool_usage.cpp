@@ -16,8 +16,9 @@ QStringList commandsIn(const ToolResult& help)
     QStringList commands;
     const QList<QByteArray> lines = help.lines();
     const int start = lines.indexOf("Commands:");
-    for (int i = start + 1; start >= 0 && i < lines.size() && lines.at(i).startsWith("  "); ++i)
+    for (int i = start + 1; start >= 0 && i < lines.size() && lines.at(i).startsWith("  "); ++i) {
         commands.append(QString::fromLatin1(lines.at(i).mid(2).split(' ').constFirst()));
+    }
     return commands;
 }
 
@@ -40,8 +41,9 @@ QStringList allShownVerbs()
     for (const QString& verb : verbs) {
         all.append(verb);
         const QStringList inner = commandsIn(runTool({verb, QStringLiteral("--help")}));
-        for (const QString& word : inner)
+        for (const QString& word : inner) {
             all.append(verb + QLatin1Char(' ') + word);
+        }
     }
     return all;
 }
@@ -91,8 +93,9 @@ void ToolUsageTest::verbHelp_data()
     QStringList verbs = allShownVerbs();
     QVERIFY(!verbs.isEmpty());
     verbs.append(QStringLiteral("complete"));
-    for (const QString& verb : qAsConst(verbs))
+    for (const QString& verb : qAsConst(verbs)) {
         QTest::newRow(qPrintable(verb)) << verb;
+    }
 }
 
 void ToolUsageTest::verbHelp()
@@ -109,8 +112,9 @@ void ToolUsageTest::verbHelp()
     QCOMPARE(runTool(words(verb) << QStringLiteral("-h")).out, result.out);
     QCOMPARE(runTool(QStringList(QStringLiteral("help")) + words(verb)).out, result.out);
     const QList<QByteArray> lines = result.lines();
-    for (const QByteArray& line : lines)
+    for (const QByteArray& line : lines) {
         QVERIFY2(line.size() <= 100, line.constData());
+    }
 }
 
 void ToolUsageTest::version()
@@ -218,8 +222,9 @@ void ToolUsageTest::libraryMessagesAreShownOnRequest()
 
 void ToolUsageTest::manualPageIsClean()
 {
-    if (QStandardPaths::findExecutable(QStringLiteral("groff")).isEmpty())
+    if (QStandardPaths::findExecutable(QStringLiteral("groff")).isEmpty()) {
         QSKIP("groff is not installed");
+    }
     const ToolResult result = runProgram(
         QStringLiteral("groff"),
         {QStringLiteral("-man"), QStringLiteral("-Tutf8"), QStringLiteral("-ww"),
@@ -243,8 +248,9 @@ void ToolUsageTest::manualPageNamesEveryOption()
         const QList<QByteArray> options = candidates.out.split('\0');
         QVERIFY(options.size() > 2);
         for (QByteArray option : options) {
-            if (option.endsWith('='))
+            if (option.endsWith('=')) {
                 option.chop(1);
+            }
             QVERIFY2(page.contains(option), option.constData());
         }
     }

@@ -20,11 +20,13 @@ QVector<int> columnWidths(const QVector<Cell>& cells, int rows, int width)
     for (int first = 0; first < cells.size(); first += rows) {
         int widest = 0;
         const int end = std::min(first + rows, int(cells.size()));
-        for (int i = first; i < end; ++i)
+        for (int i = first; i < end; ++i) {
             widest = std::max(widest, cells.at(i).width);
+        }
         total += widest + (first > 0 ? gap : 0);
-        if (total > width)
+        if (total > width) {
             return {};
+        }
         widths.append(widest);
     }
     return widths;
@@ -35,8 +37,9 @@ QVector<int> columnWidths(const QVector<Cell>& cells, int rows, int width)
 QByteArray inColumns(const QVector<Cell>& cells, int width)
 {
     QByteArray text;
-    if (cells.isEmpty())
+    if (cells.isEmpty()) {
         return text;
+    }
 
     const int count = int(cells.size());
     QVector<int> widths;
@@ -45,8 +48,9 @@ QByteArray inColumns(const QVector<Cell>& cells, int width)
     for (int columns = std::min(count, (width + gap) / (1 + gap)); columns > 1; --columns) {
         rows = (count + columns - 1) / columns;
         widths = columnWidths(cells, rows, width);
-        if (!widths.isEmpty())
+        if (!widths.isEmpty()) {
             break;
+        }
     }
     if (widths.isEmpty()) {
         rows = count;
@@ -55,12 +59,14 @@ QByteArray inColumns(const QVector<Cell>& cells, int width)
     for (int row = 0; row < rows; ++row) {
         for (int column = 0; column < widths.size(); ++column) {
             const int index = column * rows + row;
-            if (index >= count)
+            if (index >= count) {
                 break;
+            }
             const Cell& cell = cells.at(index);
             text += cell.bytes;
-            if (index + rows < count)
+            if (index + rows < count) {
                 text += QByteArray(widths.at(column) - cell.width + gap, ' ');
+            }
         }
         text += '\n';
     }

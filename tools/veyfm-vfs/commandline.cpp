@@ -30,10 +30,12 @@ int wrongUsage(const QString& verb, const QString& why)
 /// The parser's sentences, as the second half of a message.
 QString asReason(QString sentence)
 {
-    if (sentence.endsWith(QLatin1Char('.')))
+    if (sentence.endsWith(QLatin1Char('.'))) {
         sentence.chop(1);
-    if (!sentence.isEmpty())
+    }
+    if (!sentence.isEmpty()) {
         sentence[0] = sentence.at(0).toLower();
+    }
     return sentence;
 }
 
@@ -43,8 +45,9 @@ QString optionLine(const Option& option)
     for (const QString& name : option.names) {
         const bool isShort = name.size() == 1;
         QString text = (isShort ? QStringLiteral("-") : QStringLiteral("--")) + name;
-        if (!option.valueName.isEmpty())
+        if (!option.valueName.isEmpty()) {
             text += (isShort ? QStringLiteral(" ") : QStringLiteral("=")) + option.valueName;
+        }
         names.append(text);
     }
     const bool onlyLong = option.names.constFirst().size() > 1;
@@ -57,9 +60,10 @@ QString helpLines(const QVector<Verb>& verbs)
 {
     QString text = QStringLiteral("Commands:\n");
     for (const Verb& verb : verbs) {
-        if (!verb.hidden)
+        if (!verb.hidden) {
             text += QLatin1String("  ") + verb.word().leftJustified(12) + verb.summary +
                     QLatin1Char('\n');
+        }
     }
     return text;
 }
@@ -102,8 +106,9 @@ Option timeoutOption()
 QVector<Option> allOptions(const Verb& verb)
 {
     QVector<Option> options = verb.options;
-    if (verb.printsData)
+    if (verb.printsData) {
         options.append({{QStringLiteral("json")}, QStringLiteral("Print JSON")});
+    }
     options.append(
         {{QStringLiteral("verbose")}, QStringLiteral("Show what the library logs, too")});
     options.append(
@@ -116,13 +121,15 @@ Invocation::Invocation(const Verb& verb, const QStringList& words)
     : m_verb(verb)
     , m_options(allOptions(verb))
 {
-    for (const Option& option : m_options)
+    for (const Option& option : m_options) {
         m_parser.addOption({option.names, option.description, option.valueName});
+    }
     // The first word is the name of a program to the parser.
-    if (!m_parser.parse(QStringList(verb.name) + words))
+    if (!m_parser.parse(QStringList(verb.name) + words)) {
         m_complaint = asReason(m_parser.errorText());
-    else
+    } else {
         m_complaint = checkValues();
+    }
     m_output.setNull(null());
     m_output.setColour(value(QStringLiteral("color")));
 }
@@ -131,23 +138,27 @@ QString Invocation::checkValues() const
 {
     for (const Option& option : m_options) {
         const QString& name = option.names.constLast();
-        if (!m_parser.isSet(name))
+        if (!m_parser.isSet(name)) {
             continue;
+        }
         const QString value = m_parser.value(name);
         bool isNumber = false;
         value.toUInt(&isNumber);
-        if (option.isNumber && !isNumber)
+        if (option.isNumber && !isNumber) {
             return QStringLiteral("'%1' is no value of --%2: not a number").arg(value, name);
+        }
         if (!option.values.isEmpty() && !option.values.contains(value)) {
             return QStringLiteral("'%1' is no value of --%2, which takes %3")
                 .arg(value, name, option.values.join(QLatin1String(", ")));
         }
     }
-    if (json() && null())
+    if (json() && null()) {
         return QStringLiteral("--json and --null exclude each other");
+    }
     const bool asksForText = isSet(QStringLiteral("help")) || isSet(QStringLiteral("version"));
-    if (operands().size() < m_verb.leastOperands && !asksForText)
+    if (operands().size() < m_verb.leastOperands && !asksForText) {
         return QStringLiteral("an operand is missing");
+    }
     if (m_verb.mostOperands >= 0 && operands().size() > m_verb.mostOperands && !asksForText) {
         return QStringLiteral("'%1' is an operand too many")
             .arg(shownUrl(operands().at(m_verb.mostOperands)));
@@ -168,8 +179,9 @@ const Verb& Invocation::verb() const
 bool Invocation::isSet(const QString& option) const
 {
     for (const Option& known : m_options) {
-        if (known.names.contains(option))
+        if (known.names.contains(option)) {
             return m_parser.isSet(option);
+        }
     }
     return false;
 }
@@ -215,24 +227,29 @@ QString verbHelp(const Verb& verb)
                                                : QStringLiteral("COMMAND [OPTION...]");
     QString text =
         QStringLiteral("Usage:\n  veyfm-vfs %1 %2 %3").arg(verb.name, words, verb.operands);
-    while (text.endsWith(QLatin1Char(' ')))
+    while (text.endsWith(QLatin1Char(' '))) {
         text.chop(1);
+    }
     text += QStringLiteral("\n\n%1.\n").arg(verb.summary);
-    if (!verb.details.isEmpty())
+    if (!verb.details.isEmpty()) {
         text += QLatin1Char('\n') + verb.details + QLatin1Char('\n');
-    if (!verb.verbs.isEmpty())
+    }
+    if (!verb.verbs.isEmpty()) {
         text += QLatin1Char('\n') + helpLines(verb.verbs);
+    }
     text += QStringLiteral("\nOptions:\n");
     const QVector<Option> options = allOptions(verb);
-    for (const Option& option : options)
+    for (const Option& option : options) {
         text += optionLine(option);
+    }
     return text;
 }
 
 int runCommandLine(const QStringList& words)
 {
-    if (words.isEmpty())
+    if (words.isEmpty()) {
         return wrongUsage(QString(), QStringLiteral("a command is missing"));
+    }
 
     const QString& word = words.constFirst();
     const bool wantsHelp = word == QLatin1String("--help") || word == QLatin1String("-h");
@@ -242,24 +259,27 @@ int runCommandLine(const QStringList& words)
         return output.finish(Done);
     }
     const Verb* verb = findVerb(word);
-    if (!verb)
+    if (!verb) {
         return wrongUsage(
             QString(), QStringLiteral("%1: %2").arg(
                            word, word.startsWith(QLatin1Char('-'))
                                      ? QStringLiteral("an option needs a command before it")
                                      : QStringLiteral("no such command")));
+    }
     int used = 1;
     if (!verb->verbs.isEmpty() && words.size() > 1 && !words.at(1).startsWith(QLatin1Char('-'))) {
         const Verb* inner = findVerb(words.at(1), verb->verbs);
-        if (!inner)
+        if (!inner) {
             return wrongUsage(verb->name, words.at(1) + QStringLiteral(": no such command"));
+        }
         verb = inner;
         ++used;
     }
 
     Invocation invocation(*verb, words.mid(used));
-    if (!invocation.complaint().isEmpty())
+    if (!invocation.complaint().isEmpty()) {
         return wrongUsage(verb->name, invocation.complaint());
+    }
     Output& output = invocation.output();
     if (invocation.isSet(QStringLiteral("help"))) {
         output.write(verbHelp(*verb));
@@ -269,11 +289,13 @@ int runCommandLine(const QStringList& words)
         output.write(versionText());
         return output.finish(Done);
     }
-    if (!verb->run)
+    if (!verb->run) {
         return wrongUsage(verb->name, QStringLiteral("a command is missing"));
+    }
     const QString why = verb->whyWrong ? verb->whyWrong(invocation) : QString();
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return wrongUsage(verb->name, why);
+    }
     setVerbose(invocation.isSet(QStringLiteral("verbose")));
     VFS::initialize();
     return output.finish(runVerb(invocation));

@@ -88,8 +88,9 @@ QJsonObject toJson(const Entry& entry)
 
 QString isoTime(qint64 seconds)
 {
-    if (seconds == -1)
+    if (seconds == -1) {
         return QString();
+    }
     const QDateTime local = QDateTime::fromSecsSinceEpoch(seconds);
     return local.toOffsetFromUtc(local.offsetFromUtc()).toString(Qt::ISODate);
 }

@@ -26,8 +26,9 @@ QList<Device> allDevices()
     QList<Device> devices;
     for (int type = 0; type < int(std::size(typeNames)); ++type) {
         const QList<StoragePlace> places = vfs.storagePlacesByType(StoragePlace::Type(type));
-        for (const StoragePlace& place : places)
+        for (const StoragePlace& place : places) {
             devices.append({place, place.name().mid(prefix)});
+        }
     }
     return devices;
 }
@@ -43,10 +44,12 @@ Device findDevice(const QList<Device>& devices, const QString& text)
         const QString its = each.place.name();
         return its == text || (!path.isEmpty() && its == path);
     });
-    if (!device.place.isValid())
+    if (!device.place.isValid()) {
         device = first([&](const Device& each) { return each.name == text; });
-    if (!device.place.isValid())
+    }
+    if (!device.place.isValid()) {
         device = first([&](const Device& each) { return each.place.udi() == text; });
+    }
     return device;
 }
 
@@ -68,8 +71,9 @@ QString deviceTypeName(StoragePlace::Type type)
 
 QString stateOf(const StoragePlace& place)
 {
-    if (place.isMounted())
+    if (place.isMounted()) {
         return QStringLiteral("mounted");
+    }
     return place.isMountable() ? QStringLiteral("mountable") : QStringLiteral("not-mountable");
 }
 

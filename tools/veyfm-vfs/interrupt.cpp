@@ -22,15 +22,17 @@ Interrupt::Interrupt(
     : m_exitCode(exitCode)
     , m_stop(std::move(stop))
 {
-    if (!m_pipe.isOpen())
+    if (!m_pipe.isOpen()) {
         return; // The signals keep their default effect, which ends the program as well.
+    }
 
     // The signals are for the watching thread. A thread that waits for a file system would be
     // chosen, and never get to its handler.
     sigset_t signalSet;
     ::sigemptyset(&signalSet);
-    for (const int number : signalNumbers)
+    for (const int number : signalNumbers) {
         ::sigaddset(&signalSet, number);
+    }
     ::pthread_sigmask(SIG_BLOCK, &signalSet, &m_maskBefore);
     m_thread = std::thread([this, signalSet] {
         ::pthread_sigmask(SIG_UNBLOCK, &signalSet, nullptr);
@@ -43,8 +45,9 @@ Interrupt::Interrupt(
 Interrupt::~Interrupt()
 {
     m_pipe.releaseSignals();
-    if (!m_thread.joinable())
+    if (!m_thread.joinable()) {
         return;
+    }
     m_pipe.send(SignalPipe::End);
     m_thread.join();
     ::pthread_sigmask(SIG_SETMASK, &m_maskBefore, nullptr);
@@ -69,14 +72,17 @@ void Interrupt::setWorkEnded()
 
 void Interrupt::watch()
 {
-    if (m_pipe.next(-1) != SignalPipe::Signal)
+    if (m_pipe.next(-1) != SignalPipe::Signal) {
         return;
+    }
     m_requested = true;
     m_stop();
-    if (m_pipe.next(graceMilliseconds) != SignalPipe::Nothing)
+    if (m_pipe.next(graceMilliseconds) != SignalPipe::Nothing) {
         return;
-    if (m_workEnded && m_pipe.next(partingMilliseconds) != SignalPipe::Nothing)
+    }
+    if (m_workEnded && m_pipe.next(partingMilliseconds) != SignalPipe::Nothing) {
         return;
+    }
 
     Spinner::end();
     const std::lock_guard<std::mutex> lock(m_messageLock);

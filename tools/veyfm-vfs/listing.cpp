@@ -16,8 +16,9 @@ void fillFacts(Item& item)
 {
     struct stat status = {};
     const QByteArray local = item.entry.localPath().toLocal8Bit();
-    if (local.isEmpty() || ::lstat(local.constData(), &status) != 0)
+    if (local.isEmpty() || ::lstat(local.constData(), &status) != 0) {
         return;
+    }
     item.onDisk = true;
     item.size = status.st_size;
     item.modified = qint64(status.st_mtim.tv_sec) * 1000000000 + status.st_mtim.tv_nsec;
@@ -38,27 +39,34 @@ QVector<Item> listing(const Entry& entry, const ListingOptions& options)
     EntryList files;
     const EntryList children = VFS::ptr()->childs(entry, options.filters);
     for (const Entry& child : children) {
-        if (child.isPlace())
+        if (child.isPlace()) {
             places.append(child);
-        else if (options.hidden || !child.isHidden())
+        } else if (options.hidden || !child.isHidden()) {
             files.append(child);
+        }
     }
     const bool byFacts = options.sortBy == SortBy::Size || options.sortBy == SortBy::Time;
-    if (options.sortBy != SortBy::Nothing)
+    if (options.sortBy != SortBy::Nothing) {
         files.sort(byFacts || !options.reverse);
+    }
 
     QVector<Item> items;
     items.reserve(children.size());
-    for (const Entry& place : qAsConst(places))
+    for (const Entry& place : qAsConst(places)) {
         items.append({place});
-    for (const Entry& file : qAsConst(files))
+    }
+    for (const Entry& file : qAsConst(files)) {
         items.append({file});
-    if (options.facts || byFacts)
+    }
+    if (options.facts || byFacts) {
         std::for_each(items.begin(), items.end(), fillFacts);
-    if (byFacts)
+    }
+    if (byFacts) {
         sortByFacts(items.begin() + places.size(), items.end(), options.sortBy);
-    if (options.reverse && options.sortBy != SortBy::Name)
+    }
+    if (options.reverse && options.sortBy != SortBy::Name) {
         std::reverse(items.begin() + places.size(), items.end());
+    }
     return items;
 }
 

@@ -20,26 +20,32 @@ namespace {
 
 QString whyMeaningless(const QString& text)
 {
-    if (text.isEmpty())
+    if (text.isEmpty()) {
         return QStringLiteral("an empty name");
-    if (text.contains(QChar(QChar::ReplacementCharacter)))
+    }
+    if (text.contains(QChar(QChar::ReplacementCharacter))) {
         return QStringLiteral("not a valid name in the encoding of the locale");
+    }
     const QString scheme = QUrl(text).scheme();
-    if (scheme == QLatin1String("vey-fm"))
+    if (scheme == QLatin1String("vey-fm")) {
         return QStringLiteral("no place has this URL");
-    if (scheme == QLatin1String("file"))
+    }
+    if (scheme == QLatin1String("file")) {
         return QStringLiteral("not a file on this computer");
-    if (!scheme.isEmpty())
+    }
+    if (!scheme.isEmpty()) {
         return QStringLiteral("no URLs with the scheme '%1' here; a file of this name is ./%2")
             .arg(scheme, text);
+    }
     return QStringLiteral("no such place, path or URL");
 }
 
 /// 0 when there is something at the local path, a dangling link too.
 int errorOf(const QString& localPath)
 {
-    if (localPath.isEmpty() || localPath.contains(QChar(QChar::Null)))
+    if (localPath.isEmpty() || localPath.contains(QChar(QChar::Null))) {
         return ENOENT;
+    }
     struct stat status = {};
     return ::lstat(localPath.toLocal8Bit().constData(), &status) == 0 ? 0 : errno;
 }
@@ -49,8 +55,9 @@ int errorOf(const QString& localPath)
 Located resolveText(const QString& text)
 {
     Located result = {VFS::ptr()->entry(text), QString()};
-    if (result.entry.isNull())
+    if (result.entry.isNull()) {
         result.why = whyMeaningless(text);
+    }
     return result;
 }
 
@@ -58,29 +65,35 @@ Located locate(const QString& text)
 {
     Located result = resolveText(text);
     const Entry& entry = result.entry;
-    if (!result.why.isEmpty() || entry.isPlace() || entry.isCustomUrl() || entry.isFuseUrl())
+    if (!result.why.isEmpty() || entry.isPlace() || entry.isCustomUrl() || entry.isFuseUrl()) {
         return result;
+    }
     const int error = errorOf(entry.localPath());
-    if (error == ENOENT && text.contains(QChar(QChar::ReplacementCharacter)))
+    if (error == ENOENT && text.contains(QChar(QChar::ReplacementCharacter))) {
         result.why = whyMeaningless(text);
-    else if (error != 0)
+    } else if (error != 0) {
         result.why = systemReason(error);
+    }
     return result;
 }
 
 QString whyUnreadable(const Entry& entry)
 {
-    if (entry.isFuseUrl())
+    if (entry.isFuseUrl()) {
         return QStringLiteral("not mounted");
-    if (entry.isPurePlace())
+    }
+    if (entry.isPurePlace()) {
         return QString();
-    if (entry.localPath().isEmpty())
+    }
+    if (entry.localPath().isEmpty()) {
         return systemReason(ENOTDIR);
+    }
     // Tells more than the type does: of a file, of a dangling link, of a cycle of links.
     const int descriptor =
         ::open(entry.localPath().toLocal8Bit().constData(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    if (descriptor < 0)
+    if (descriptor < 0) {
         return systemReason(errno);
+    }
     ::close(descriptor);
     return QString();
 }

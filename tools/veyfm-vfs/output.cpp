@@ -44,12 +44,13 @@ void Output::setNull(bool null)
 
 void Output::setColour(const QString& when)
 {
-    if (when == QLatin1String("always"))
+    if (when == QLatin1String("always")) {
         m_colour = true;
-    else if (when == QLatin1String("never"))
+    } else if (when == QLatin1String("never")) {
         m_colour = false;
-    else
+    } else {
         m_colour = m_terminal && environmentWantsColour();
+    }
 }
 
 bool Output::hasColour() const
@@ -60,8 +61,9 @@ bool Output::hasColour() const
 void Output::write(const QByteArray& bytes)
 {
     m_buffer += bytes;
-    if (m_buffer.size() >= bufferSize)
+    if (m_buffer.size() >= bufferSize) {
         flush();
+    }
 }
 
 void Output::write(const QString& text)
@@ -71,8 +73,9 @@ void Output::write(const QString& text)
 
 void Output::flush()
 {
-    if (!m_buffer.isEmpty())
+    if (!m_buffer.isEmpty()) {
         Spinner::end();
+    }
     const char* data = m_buffer.constData();
     size_t left = size_t(m_buffer.size());
     while (left > 0 && m_error == 0) {
@@ -112,8 +115,9 @@ QByteArray Output::label(const QString& text, const Entry& entry) const
 int Output::finish(int exitCode)
 {
     flush();
-    if (m_error == 0)
+    if (m_error == 0) {
         return exitCode;
+    }
     report(QStringLiteral("standard output"), systemReason(m_error));
     return exitCode == 0 ? 1 : exitCode;
 }

@@ -21,16 +21,18 @@ std::atomic<bool> verbose{false};
 void handleMessage(QtMsgType type, const QMessageLogContext& context, const QString& message)
 {
     Q_UNUSED(context)
-    if (verbose || type == QtFatalMsg)
+    if (verbose || type == QtFatalMsg) {
         report(QStringLiteral("libveyfmvfs"), message);
+    }
 }
 
 void writeError(const QByteArray& bytes)
 {
     Spinner::end();
     // One call, so that lines of several processes do not mix; nobody to tell of a failure.
-    if (::write(STDERR_FILENO, bytes.constData(), size_t(bytes.size())) < 0)
+    if (::write(STDERR_FILENO, bytes.constData(), size_t(bytes.size())) < 0) {
         return;
+    }
 }
 
 } // namespace

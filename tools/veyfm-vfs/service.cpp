@@ -53,8 +53,9 @@ QString startService()
 {
     const QDBusReply<void> reply =
         QDBusConnection::sessionBus().interface()->startService(serviceName());
-    if (reply.isValid())
+    if (reply.isValid()) {
         return QString();
+    }
     return QStringLiteral("the file manager service (%1) does not start: %2")
         .arg(serviceName(), reply.error().message());
 }
@@ -74,8 +75,9 @@ QString whyNothing(const Question& question)
     message.setAutoStartService(false);
     const QDBusMessage reply =
         QDBusConnection::sessionBus().call(message, QDBus::Block, secondTryMilliseconds);
-    if (reply.type() == QDBusMessage::ErrorMessage)
+    if (reply.type() == QDBusMessage::ErrorMessage) {
         return reply.errorMessage();
+    }
     if (reply.signature() != question.signature) {
         return QStringLiteral("the service gave an answer of the form \"%1\", not \"%2\"")
             .arg(reply.signature(), question.signature);

@@ -38,8 +38,9 @@ QString interrupted()
 Interrupt& serviceInterrupt()
 {
     static Interrupt interrupt({SIGINT}, Failed, [] {
-        if (qApp)
+        if (qApp) {
             QMetaObject::invokeMethod(qApp, &QCoreApplication::quit, Qt::QueuedConnection);
+        }
     });
     return interrupt;
 }
@@ -53,8 +54,9 @@ bool runInterruptibly(const Invocation& invocation, const std::function<void()>&
     interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
     const Waiting waiting(waitingForService());
     work();
-    if (!interrupt.wasRequested())
+    if (!interrupt.wasRequested()) {
         return true;
+    }
     interrupt.setWorkEnded();
     report(invocation.verb().name, interrupted());
     return false;
@@ -103,16 +105,19 @@ int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))
     {
         const Waiting waiting(waitingForService());
         why = whyNoService(serviceState());
-        if (why.isEmpty())
+        if (why.isEmpty()) {
             why = startService();
-        if (why.isEmpty())
+        }
+        if (why.isEmpty()) {
             openTree();
+        }
     }
     if (!interrupt.wasRequested()) {
-        if (why.isEmpty())
+        if (why.isEmpty()) {
             exitCode = run(invocation);
-        else
+        } else {
             report(verb.name, why);
+        }
     }
     if (interrupt.wasRequested()) {
         interrupt.setWorkEnded();
@@ -136,10 +141,12 @@ bool wasInterrupted()
 
 bool hasFailed(const Invocation& invocation, const QString& why)
 {
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return true;
-    if (!why.isEmpty())
+    }
+    if (!why.isEmpty()) {
         report(invocation.verb().name, why);
+    }
     return !why.isEmpty();
 }
 
@@ -153,16 +160,19 @@ int secondsToWait(const Invocation& invocation, int otherwise)
 
 bool waitUntil(const QString& doing, int seconds, const std::function<bool()>& changed)
 {
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return false;
-    if (changed())
+    }
+    if (changed()) {
         return true;
+    }
     const Waiting waiting(doing);
     QEventLoop loop;
     QObject::connect(
         QAbstractEventDispatcher::instance(), &QAbstractEventDispatcher::aboutToBlock, &loop, [&] {
-            if (changed())
+            if (changed()) {
                 loop.quit();
+            }
         });
     QTimer::singleShot(std::chrono::seconds(seconds), &loop, &QEventLoop::quit);
     loop.exec();
@@ -180,10 +190,12 @@ int waitForNews(
     const Invocation& invocation, const QString& what, const std::function<bool()>& changed)
 {
     const int seconds = secondsToWait(invocation);
-    if (waitUntil(QStringLiteral("Waiting for the news of the change"), seconds, changed))
+    if (waitUntil(QStringLiteral("Waiting for the news of the change"), seconds, changed)) {
         return Done;
-    if (!wasInterrupted())
+    }
+    if (!wasInterrupted()) {
         report(what, whyNoNews(QStringLiteral("change"), seconds));
+    }
     return Failed;
 }
 

@@ -40,14 +40,16 @@ void handleSignal(int)
 SignalPipe::SignalPipe()
 {
     signalCaught = false;
-    if (::pipe2(m_pipe, O_CLOEXEC) == 0)
+    if (::pipe2(m_pipe, O_CLOEXEC) == 0) {
         handlerDescriptor = m_pipe[1];
+    }
 }
 
 SignalPipe::~SignalPipe()
 {
-    if (!isOpen())
+    if (!isOpen()) {
         return;
+    }
     handlerDescriptor = -1;
     ::close(m_pipe[0]);
     ::close(m_pipe[1]);
@@ -68,8 +70,9 @@ void SignalPipe::catchSignals(std::initializer_list<int> numbers, int flags)
         Handled& handled = m_handled[m_handledCount];
         handled.number = number;
         ::sigaction(number, nullptr, &handled.before);
-        if (handled.before.sa_handler == SIG_IGN)
+        if (handled.before.sa_handler == SIG_IGN) {
             continue;
+        }
         ::sigaction(number, &action, nullptr);
         ++m_handledCount;
     }
@@ -77,8 +80,9 @@ void SignalPipe::catchSignals(std::initializer_list<int> numbers, int flags)
 
 void SignalPipe::releaseSignals()
 {
-    for (int i = 0; i < m_handledCount; ++i)
+    for (int i = 0; i < m_handledCount; ++i) {
         ::sigaction(m_handled[i].number, &m_handled[i].before, nullptr);
+    }
     m_handledCount = 0;
 }
 
@@ -100,8 +104,9 @@ SignalPipe::Byte SignalPipe::next(int milliseconds)
         ready = ::poll(&poll, 1, milliseconds);
     } while (ready < 0 && errno == EINTR);
     Byte byte = Nothing;
-    if (ready < 1 || ::read(m_pipe[0], &byte, 1) != 1)
+    if (ready < 1 || ::read(m_pipe[0], &byte, 1) != 1) {
         return Nothing;
+    }
     return byte;
 }
 

@@ -27,8 +27,9 @@ constexpr char frames[] = {'|', '/', '-', '\\'};
 
 void writeToTerminal(const QByteArray& bytes)
 {
-    if (::write(STDERR_FILENO, bytes.constData(), size_t(bytes.size())) < 0)
+    if (::write(STDERR_FILENO, bytes.constData(), size_t(bytes.size())) < 0) {
         return; // Nobody to show it to.
+    }
 }
 
 class Drawer
@@ -42,20 +43,23 @@ public:
             erase();
         }
         m_changed.notify_one();
-        if (m_thread.joinable())
+        if (m_thread.joinable()) {
             m_thread.join();
+        }
     }
 
     void begin(const QByteArray& text)
     {
         const std::lock_guard<std::mutex> lock(m_mutex);
-        if (m_waiting)
+        if (m_waiting) {
             return;
+        }
         m_waiting = true;
         m_text = text;
         m_start = Clock::now();
-        if (!m_thread.joinable())
+        if (!m_thread.joinable()) {
             startThread();
+        }
         m_changed.notify_one();
     }
 
@@ -109,8 +113,9 @@ private:
 
     void erase()
     {
-        if (m_shown)
+        if (m_shown) {
             writeToTerminal("\r\033[K");
+        }
         m_shown = false;
     }
 
@@ -131,8 +136,9 @@ Drawer* drawer()
     static const QByteArray terminal = qgetenv("TERM");
     static const bool visible =
         ::isatty(STDERR_FILENO) == 1 && !terminal.isEmpty() && terminal != "dumb";
-    if (!visible)
+    if (!visible) {
         return nullptr;
+    }
     static Drawer instance;
     return &instance;
 }
@@ -141,14 +147,16 @@ Drawer* drawer()
 
 void Spinner::begin(const QString& text)
 {
-    if (Drawer* const line = drawer())
+    if (Drawer* const line = drawer()) {
         line->begin(text.toLocal8Bit());
+    }
 }
 
 void Spinner::end()
 {
-    if (Drawer* const line = drawer())
+    if (Drawer* const line = drawer()) {
         line->end();
+    }
 }
 
 } // namespace Tool

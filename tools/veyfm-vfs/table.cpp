@@ -22,8 +22,9 @@ constexpr int widest = 40;
 void Table::add(const QStringList& cells)
 {
     QStringList row;
-    for (const QString& cell : cells)
+    for (const QString& cell : cells) {
         row.append(cell.isEmpty() ? QStringLiteral("-") : escaped(cell));
+    }
     m_rows.append(row);
 }
 
@@ -32,8 +33,9 @@ void Table::write(Output& output) const
     QVector<int> widths;
     for (const QStringList& row : m_rows) {
         widths.resize(std::max(int(widths.size()), int(row.size())));
-        for (int i = 0; i < row.size(); ++i)
+        for (int i = 0; i < row.size(); ++i) {
             widths[i] = std::max(widths.at(i), std::min(displayWidth(row.at(i)), widest));
+        }
     }
     for (const QStringList& row : m_rows) {
         QByteArray line;

@@ -50,8 +50,9 @@ QString escape(QChar c)
     }
     QString text;
     const QByteArray bytes = QString(c).toLocal8Bit();
-    for (const char byte : bytes)
+    for (const char byte : bytes) {
         text += QStringLiteral("\\%1").arg(uint(uchar(byte)), 3, 8, QLatin1Char('0'));
+    }
     return text;
 }
 
@@ -62,10 +63,11 @@ QString escaped(const QString& text)
     QString result;
     result.reserve(text.size());
     for (const QChar c : text) {
-        if (needsEscape(c))
+        if (needsEscape(c)) {
             result += escape(c);
-        else
+        } else {
             result += c;
+        }
     }
     return result;
 }
@@ -85,11 +87,13 @@ int terminalWidth()
 {
     bool ok = false;
     const int columns = qEnvironmentVariableIntValue("COLUMNS", &ok);
-    if (ok && columns > 0)
+    if (ok && columns > 0) {
         return columns;
+    }
     winsize size = {};
-    if (::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0)
+    if (::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0) {
         return size.ws_col;
+    }
     return 80;
 }
 
@@ -106,12 +110,15 @@ bool environmentWantsColour()
 
 QByteArray colourOf(const Entry& entry)
 {
-    if (entry.isPlace())
+    if (entry.isPlace()) {
         return QByteArrayLiteral("1;35");
-    if (entry.isSymLink())
+    }
+    if (entry.isSymLink()) {
         return entry.exists() ? QByteArrayLiteral("1;36") : QByteArrayLiteral("1;31");
-    if (entry.isDir())
+    }
+    if (entry.isDir()) {
         return QByteArrayLiteral("1;34");
+    }
     return QByteArray();
 }
 

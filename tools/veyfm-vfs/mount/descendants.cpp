@@ -49,13 +49,15 @@ std::vector<Process> runningProcesses()
         bool isNumber = false;
         const pid_t pid = name.toInt(&isNumber);
         QFile file(QStringLiteral("/proc/%1/stat").arg(name));
-        if (!isNumber || !file.open(QIODevice::ReadOnly))
+        if (!isNumber || !file.open(QIODevice::ReadOnly)) {
             continue;
+        }
         // "PID (NAME) STATE PPID ... BEGIN ...", where the name may hold anything.
         const QByteArray line = file.readAll();
         const QList<QByteArray> fields = line.mid(line.lastIndexOf(')') + 2).split(' ');
-        if (fields.size() > 19 && fields.at(0) != "Z" && fields.at(0) != "X")
+        if (fields.size() > 19 && fields.at(0) != "Z" && fields.at(0) != "X") {
             all.push_back({pid, pid_t(fields.at(1).toInt()), fields.at(19)});
+        }
     }
     return all;
 }
@@ -69,13 +71,15 @@ std::vector<Process> runningDescendants()
         for (const Process& process : all) {
             const bool isOurs =
                 std::find(inherited.begin(), inherited.end(), process) == inherited.end();
-            if (process.parent == parent && isOurs)
+            if (process.parent == parent && isOurs) {
                 found.push_back(process);
+            }
         }
     };
     addChildrenOf(::getpid());
-    for (size_t i = 0; i < found.size(); ++i)
+    for (size_t i = 0; i < found.size(); ++i) {
         addChildrenOf(found[i].pid);
+    }
     return found;
 }
 
@@ -86,11 +90,13 @@ void leaveInheritedChildren()
     siginfo_t child;
     const bool hasNone =
         ::waitid(P_ALL, 0, &child, WEXITED | WNOHANG | WNOWAIT) != 0 && errno == ECHILD;
-    if (hasNone)
+    if (hasNone) {
         return;
+    }
     for (const Process& process : runningProcesses()) {
-        if (process.parent == ::getpid())
+        if (process.parent == ::getpid()) {
             inherited.push_back(process);
+        }
     }
 }
 
@@ -108,15 +114,17 @@ long usageOfEndedChildren()
 
 Descendants::~Descendants()
 {
-    for (const auto& [pid, seen] : m_seen)
+    for (const auto& [pid, seen] : m_seen) {
         ::close(seen.handle);
+    }
 }
 
 void Descendants::add(pid_t pid, bool isHelper)
 {
     const int handle = openPidfd(pid);
-    if (handle >= 0)
+    if (handle >= 0) {
         m_seen.insert({pid, {handle, isHelper, Clock::time_point()}});
+    }
 }
 
 bool Descendants::wasAsked(pid_t pid) const
@@ -128,8 +136,9 @@ bool Descendants::wasAsked(pid_t pid) const
 void Descendants::end()
 {
     for (const Process& process : runningDescendants()) {
-        if (m_seen.count(process.pid) == 0)
+        if (m_seen.count(process.pid) == 0) {
             add(process.pid, wasAsked(process.parent));
+        }
     }
     // What is below us behind the opening, too, is what was opened.
     const std::vector<Process> behind = runningDescendants();

@@ -48,10 +48,12 @@ QStringList namesIn(const QString& directory)
 {
     QStringList names;
     DIR* const stream = ::opendir(QFile::encodeName(directory).constData());
-    if (!stream)
+    if (!stream) {
         return names;
-    while (const dirent* const entry = ::readdir(stream))
+    }
+    while (const dirent* const entry = ::readdir(stream)) {
         names.append(QFile::decodeName(entry->d_name));
+    }
     ::closedir(stream);
     return names;
 }
@@ -62,8 +64,9 @@ int waitForChild(pid_t pid, std::chrono::milliseconds patience)
     const int handle = openPidfd(pid);
     pollfd poll = {handle, POLLIN, 0};
     const bool ended = ::poll(&poll, 1, int(patience.count())) == 1;
-    if (handle >= 0)
+    if (handle >= 0) {
         ::close(handle);
+    }
     int status = 0;
     if (!ended) {
         // One that hangs in a dead mount outlives that, and is nobody's any more.
@@ -93,8 +96,9 @@ bool runQuietly(const char* program, const char* option, const QByteArray& opera
 {
     posix_spawn_file_actions_t actions;
     ::posix_spawn_file_actions_init(&actions);
-    for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
+    for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
         ::posix_spawn_file_actions_addopen(&actions, descriptor, "/dev/null", O_RDWR, 0);
+    }
     QByteArray words[] = {program, option, operand};
     char* const arguments[] = {words[0].data(), words[1].data(), words[2].data(), nullptr};
     pid_t pid = -1;
@@ -108,8 +112,9 @@ void unmount(const QString& directory)
     const QByteArray path = QFile::encodeName(directory);
     for (const char* option : {"-u", "-uz"}) {
         for (const char* program : {"fusermount3", "fusermount"}) {
-            if (runQuietly(program, option, path))
+            if (runQuietly(program, option, path)) {
                 return;
+            }
         }
     }
 }
@@ -118,8 +123,9 @@ QVector<int> mountIds()
 {
     QVector<int> ids;
     const QVector<KernelMount> mounts = MountInfo::read().mounts();
-    for (const KernelMount& mount : mounts)
+    for (const KernelMount& mount : mounts) {
         ids.append(mount.id);
+    }
     return ids;
 }
 
@@ -133,8 +139,9 @@ QString fuseDirectory(const QUrl& url)
                         (user.isEmpty() ? host : user + QLatin1Char('@') + host);
     const bool isHome = url.scheme() == QLatin1String("sftp") &&
                         url.path(QUrl::FullyDecoded).startsWith(QLatin1String("/~"));
-    if (isHome)
+    if (isHome) {
         directory += QLatin1Char('~');
+    }
     return directory;
 }
 
@@ -148,8 +155,10 @@ bool isOnFuseMount(const QString& path, const MountInfo& kernel)
     const QVector<KernelMount> mounts = kernel.mounts();
     const KernelMount* holder = nullptr;
     for (const KernelMount& mount : mounts) {
-        if (holds(mount, place) && (!holder || mount.directory.size() >= holder->directory.size()))
+        if (holds(mount, place) &&
+            (!holder || mount.directory.size() >= holder->directory.size())) {
             holder = &mount;
+        }
     }
     // The home may lie on one itself, as an encrypted one does.
     return holder && holder->isFuse() && !holds(*holder, kernelDirectory(mountRoot()));
@@ -158,8 +167,9 @@ bool isOnFuseMount(const QString& path, const MountInfo& kernel)
 QString whyDead(const QString& directory, int seconds)
 {
     const int error = errorOf(directory, std::chrono::seconds(seconds));
-    if (error < 0)
+    if (error < 0) {
         return QStringLiteral("it does not answer");
+    }
     return error == 0 ? QString() : systemReason(error);
 }
 
@@ -175,8 +185,9 @@ FuseTrace::FuseTrace(const QString& scheme)
     , m_others(mountIds())
 {
     for (const QString& directory : {m_parent, mountRoot()}) {
-        if (!QDir(directory).exists())
+        if (!QDir(directory).exists()) {
             m_parents.append(directory);
+        }
     }
 }
 
@@ -193,8 +204,9 @@ void FuseTrace::resume()
     const QVector<int> now = mountIds();
     const std::lock_guard<std::mutex> lock(m_lock);
     for (const int id : now) {
-        if (!m_atPause.contains(id))
+        if (!m_atPause.contains(id)) {
             m_others.append(id);
+        }
     }
     m_isPaused = false;
 }
@@ -207,30 +219,36 @@ bool FuseTrace::isOfOthers(int mountId) const
 
 bool FuseTrace::isMadeHere(const QString& directory, Made made) const
 {
-    if (made == NoMounts)
+    if (made == NoMounts) {
         return false;
+    }
     const QString path = kernelDirectory(directory);
     const KernelMount* top = nullptr;
     const QVector<KernelMount> mounts = MountInfo::read().mounts();
     for (const KernelMount& mount : mounts) {
-        if (mount.directory == path)
+        if (mount.directory == path) {
             top = &mount;
+        }
     }
-    if (!top || !top->isFuse() || isOfOthers(top->id))
+    if (!top || !top->isFuse() || isOfOthers(top->id)) {
         return false;
+    }
     return made == AllMounts || errorOf(directory, shortLook) == ENOTCONN;
 }
 
 void FuseTrace::remove(const QStringList& directories, Made made) const
 {
     for (const QString& directory : directories) {
-        if (isMadeHere(directory, made))
+        if (isMadeHere(directory, made)) {
             unmount(directory);
-        if (!m_names.contains(directory.mid(m_parent.size() + 1)))
+        }
+        if (!m_names.contains(directory.mid(m_parent.size() + 1))) {
             ::rmdir(QFile::encodeName(directory).constData());
+        }
     }
-    for (const QString& directory : m_parents)
+    for (const QString& directory : m_parents) {
         ::rmdir(QFile::encodeName(directory).constData());
+    }
 }
 
 } // namespace Tool

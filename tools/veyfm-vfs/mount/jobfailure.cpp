@@ -43,8 +43,9 @@ bool isInstalled(const char* program)
 QString programOf(const QString& scheme)
 {
     for (const MountTool& tool : mountTools) {
-        if (scheme == QLatin1String(tool.scheme))
+        if (scheme == QLatin1String(tool.scheme)) {
             return QLatin1String(tool.program);
+        }
     }
     return QStringLiteral("the tool");
 }
@@ -65,12 +66,14 @@ QString lookWithSsh(const TerminalAuthenticator& authenticator)
 
 QString whyNoProgress(const QString& scheme, const TerminalAuthenticator& authenticator)
 {
-    if (authenticator.isDescriptorSilent())
+    if (authenticator.isDescriptorSilent()) {
         return QStringLiteral("no password came from the descriptor of --password-fd");
+    }
     // A job that runs no tool, or is done with it, waits for the service alone.
     if (authenticator.protocol().isEmpty() || authenticator.wasAccepted() ||
-        authenticator.wasUserChangedLast())
+        authenticator.wasUserChangedLast()) {
         return QStringLiteral("the file manager service does not tell of the mount");
+    }
     if (scheme == QLatin1String("sftp")) {
         return QStringLiteral("sshfs may be waiting for more than a password; ") +
                lookWithSsh(authenticator);
@@ -88,26 +91,31 @@ QString whyNoFuse(const QString& scheme)
                 systemReason(error),
                 error == ENOENT ? QStringLiteral(": run 'sudo modprobe fuse'") : QString());
     }
-    if (!isInstalled("fusermount3") && !isInstalled("fusermount"))
+    if (!isInstalled("fusermount3") && !isInstalled("fusermount")) {
         return QStringLiteral("fusermount3 is not installed: install the package fuse3");
-    if (scheme == QLatin1String("sftp") && !isInstalled("ssh"))
+    }
+    if (scheme == QLatin1String("sftp") && !isInstalled("ssh")) {
         return QStringLiteral("ssh is not installed: install the package openssh-client");
+    }
     return QString();
 }
 
 QString whyToolFailed(
     const QString& text, const QString& scheme, const TerminalAuthenticator& authenticator)
 {
-    if (scheme == QLatin1String("smb"))
+    if (scheme == QLatin1String("smb")) {
         return VFS::ptr()->smbBrowser()->smbNetworkLocalPath().isEmpty()
                    ? QStringLiteral("the file manager service has no directory in which it keeps "
                                     "the Samba network: see its own documentation")
                    : text;
+    }
     const QString why = whyNoFuse(scheme);
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return why;
-    if (scheme == QLatin1String("sftp"))
+    }
+    if (scheme == QLatin1String("sftp")) {
         return text + QStringLiteral(": ") + lookWithSsh(authenticator);
+    }
     return text + QStringLiteral(": check the name of the host, and that it answers");
 }
 
@@ -126,8 +134,9 @@ QString whyNoTool(const QString& scheme)
 
 QString whyOutsideGroup()
 {
-    if (Fuse::isInFuseGroup())
+    if (Fuse::isInFuseGroup()) {
         return QString();
+    }
     const QString login = loginName();
     return QStringLiteral("only members of the group 'fuse' can do that: run '%1sudo usermod -aG "
                           "fuse %2', then log in again")
@@ -140,24 +149,31 @@ QString whyFailed(
     const JobResult& result, const QString& scheme, const TerminalAuthenticator& authenticator,
     const JobWatch& watch)
 {
-    if (result.end == JobResult::Interrupted)
+    if (result.end == JobResult::Interrupted) {
         return watch.whyStopped();
-    if (result.end == JobResult::TimedOut)
+    }
+    if (result.end == JobResult::TimedOut) {
         return watch.whyStopped() + QStringLiteral(": ") + whyNoProgress(scheme, authenticator);
-    if (result.end == JobResult::NotStarted)
+    }
+    if (result.end == JobResult::NotStarted) {
         return QStringLiteral("%1 can't be started: %2").arg(programOf(scheme), result.text);
-    if (!authenticator.whyGivenUp().isEmpty())
+    }
+    if (!authenticator.whyGivenUp().isEmpty()) {
         return authenticator.whyGivenUp();
-    if (result.end == JobResult::Silent)
+    }
+    if (result.end == JobResult::Silent) {
         return QStringLiteral("the server ended the connection: ") + lookWithSsh(authenticator);
+    }
     // Codes that say so, and also that the user gave up.
     if (result.code == 2 || result.code == 4) {
         const QString why = whyOutsideGroup();
-        if (!why.isEmpty())
+        if (!why.isEmpty()) {
             return why;
+        }
     }
-    if (result.code == 5)
+    if (result.code == 5) {
         return whyToolFailed(result.text, scheme, authenticator);
+    }
     // The tool has done its work then.
     return authenticator.wasAccepted()
                ? result.text + QStringLiteral(": the file manager service refuses the mount")

@@ -47,8 +47,9 @@ QString loginName()
     char buffer[4096];
     passwd record;
     passwd* found = nullptr;
-    if (::getpwuid_r(::getuid(), &record, buffer, sizeof buffer, &found) != 0 || !found)
+    if (::getpwuid_r(::getuid(), &record, buffer, sizeof buffer, &found) != 0 || !found) {
         return QString();
+    }
     return QString::fromLocal8Bit(found->pw_name);
 }
 
@@ -66,15 +67,18 @@ QVector<Option> loginOptions()
 
 QString whyNoLogin(const Invocation& invocation)
 {
-    if (invocation.isSet(userOption()) && invocation.value(userOption()).isEmpty())
+    if (invocation.isSet(userOption()) && invocation.value(userOption()).isEmpty()) {
         return QStringLiteral("the name of --user is empty");
-    if (!invocation.isSet(passwordOption()))
+    }
+    if (!invocation.isSet(passwordOption())) {
         return QString();
+    }
     const QString number = invocation.value(passwordOption());
     bool isNumber = false;
     const int descriptor = number.toInt(&isNumber);
-    if (isNumber && isHandedOn(descriptor))
+    if (isNumber && isHandedOn(descriptor)) {
         return QString();
+    }
     return QStringLiteral("descriptor %1 of --password-fd is not open").arg(number);
 }
 

@@ -43,8 +43,9 @@ void MountAuthenticator::credentialsAccepted()
 
 void MountAuthenticator::noteQuestion(bool asking) const
 {
-    if (m_questionHandler && !m_hasMounted)
+    if (m_questionHandler && !m_hasMounted) {
         m_questionHandler(asking);
+    }
 }
 
 } // namespace Tool

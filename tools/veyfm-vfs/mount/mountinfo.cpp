@@ -49,8 +49,9 @@ bool KernelMount::isFuse() const
 MountInfo MountInfo::read()
 {
     QFile file(QStringLiteral("/proc/self/mountinfo"));
-    if (file.open(QIODevice::ReadOnly))
+    if (file.open(QIODevice::ReadOnly)) {
         return MountInfo(file.readAll());
+    }
     MountInfo nothing{QByteArray()};
     nothing.m_why = QStringLiteral("%1: %2").arg(file.fileName(), file.errorString());
     return nothing;
@@ -63,8 +64,9 @@ MountInfo::MountInfo(const QByteArray& text)
     for (const QByteArray& line : lines) {
         const QList<QByteArray> fields = line.split(' ');
         const int separator = fields.indexOf(QByteArrayLiteral("-"), 6);
-        if (separator < 0 || separator + 2 >= fields.size())
+        if (separator < 0 || separator + 2 >= fields.size()) {
             continue;
+        }
         m_mounts.append(
             {unescaped(fields.at(4)), unescaped(fields.at(separator + 1)),
              unescaped(fields.at(separator + 2)), fields.at(0).toInt()});
@@ -91,14 +93,16 @@ bool MountInfo::isMountPoint(const QString& directory) const
 QString kernelPath(const QString& directory, const QString& root)
 {
     const QString path = QDir::cleanPath(directory);
-    if (!(path + slash).startsWith(root + slash))
+    if (!(path + slash).startsWith(root + slash)) {
         return path;
+    }
     const int schemeEnd = path.indexOf(slash, root.size() + 1);
     for (const int end : {schemeEnd, root.size()}) {
         const QString canonical =
             end < 0 ? QString() : QFileInfo(path.left(end)).canonicalFilePath();
-        if (!canonical.isEmpty())
+        if (!canonical.isEmpty()) {
             return canonical + path.mid(end);
+        }
     }
     return path;
 }

@@ -76,25 +76,31 @@ int authorityEnd(const QString& url, int start)
 
 QString toolOf(const QString& scheme)
 {
-    if (scheme == QLatin1String("smb"))
+    if (scheme == QLatin1String("smb")) {
         return QStringLiteral("smbclient");
+    }
     return scheme == QLatin1String("ftp") ? QStringLiteral("curlftpfs") : QStringLiteral("sshfs");
 }
 
 /// What is wrong with any name, whatever it names.
 QString whyNoName(const QString& name, const QString& what)
 {
-    if (hasInvisible(name))
+    if (hasInvisible(name)) {
         return QStringLiteral("a control character in the name of the %1").arg(what);
-    if (!survivesLocale(name))
+    }
+    if (!survivesLocale(name)) {
         return QStringLiteral("the name of the %1 is not valid in the encoding of the locale")
             .arg(what);
-    if (name.startsWith(dash))
+    }
+    if (name.startsWith(dash)) {
         return QStringLiteral("the name of the %1 must not begin with a dash").arg(what);
-    if (isDots(name))
+    }
+    if (isDots(name)) {
         return QStringLiteral("'%1' is no name of a %2").arg(name, what);
-    if (name.toLocal8Bit().size() > longestName)
+    }
+    if (name.toLocal8Bit().size() > longestName) {
         return QStringLiteral("the name of the %1 is too long").arg(what);
+    }
     return QString();
 }
 
@@ -102,37 +108,43 @@ QString whyHolding(const QString& name, QLatin1String bad, const QString& what, 
 {
     const QString badText = bad;
     for (const QChar c : name) {
-        if (badText.contains(c))
+        if (badText.contains(c)) {
             return QStringLiteral("%1 can't be told of a %2 with %3 in its name")
                 .arg(tool, what, QLatin1Char('\'') + c + QLatin1Char('\''));
+        }
     }
     return QString();
 }
 
 QString whyHoldingSpace(const QString& name, const QString& what, const QString& tool)
 {
-    if (!hasSpace(name))
+    if (!hasSpace(name)) {
         return QString();
+    }
     return QStringLiteral("%1 can't be told of a %2 with white space in its name").arg(tool, what);
 }
 
 QString whyNoHost(const QString& host, const QString& tool)
 {
     const QString what = QStringLiteral("host");
-    if (host.isEmpty())
+    if (host.isEmpty()) {
         return QStringLiteral("the host is missing");
+    }
     const QString why = whyNoName(host, what);
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return why;
-    if (host.contains(QLatin1Char(':')))
+    }
+    if (host.contains(QLatin1Char(':'))) {
         return QStringLiteral("%1 can't be told of an IPv6 address: use a name of the host")
             .arg(tool);
+    }
     const bool plain = std::all_of(host.begin(), host.end(), [](QChar c) {
         return c.isLetterOrNumber() || c.isMark() || c == dash || c == QLatin1Char('.') ||
                c == QLatin1Char('_');
     });
-    if (!plain || host.startsWith(QLatin1Char('.')) || host.contains(QLatin1String("..")))
+    if (!plain || host.startsWith(QLatin1Char('.')) || host.contains(QLatin1String(".."))) {
         return QStringLiteral("'%1' is no name of a host").arg(host);
+    }
     return QString();
 }
 
@@ -154,8 +166,9 @@ struct HostAndPort
         static const QRegularExpression usual(QStringLiteral("^([^:]*)(?::(.*))?$"));
         for (const QRegularExpression* form : {&bracketed, &usual}) {
             const QRegularExpressionMatch match = form->match(authority);
-            if (!match.hasMatch())
+            if (!match.hasMatch()) {
                 continue;
+            }
             host = match.captured(1);
             hasPort = !match.captured(2).isNull();
             return;
@@ -191,13 +204,16 @@ QString whyNotSmb(const QString& text, const QString& authority)
     const QString scheme = QStringLiteral("smb");
     const SmbUrl url(text);
     const HostAndPort address(url.host());
-    if (address.hasPort)
+    if (address.hasPort) {
         return whyNoPort(scheme);
+    }
     const QString why = whyNoShare(url.share(), address.host, url.workgroup());
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return why;
-    if (leadsUp(url.tailPath()))
+    }
+    if (leadsUp(url.tailPath())) {
         return QStringLiteral("'..' in the path");
+    }
     return whyNoUser(scheme, smbUser(authority));
 }
 
@@ -208,38 +224,51 @@ QString whyNotFuse(const QString& text, const QString& scheme, const QString& au
     const HostAndPort address(written);
     const QString host = url.isValid() ? url.host(QUrl::FullyDecoded) : address.host;
     QString why = whyNoHost(host, toolOf(scheme));
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return why;
-    if (address.hasPort)
+    }
+    if (address.hasPort) {
         return whyNoPort(scheme);
-    if (!url.isValid())
+    }
+    if (!url.isValid()) {
         return QStringLiteral("'%1' is no name of a host").arg(host);
+    }
     const QString user = url.userName(QUrl::FullyDecoded);
-    if (user.isEmpty() && written != authority)
+    if (user.isEmpty() && written != authority) {
         return QStringLiteral("the name of the user is missing");
+    }
     why = whyNoUser(scheme, user);
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return why;
+    }
     // With the sign of a mount of the home directory behind it.
-    if (QStringLiteral("%1@%2~").arg(user, host).toLocal8Bit().size() > longestName)
+    if (QStringLiteral("%1@%2~").arg(user, host).toLocal8Bit().size() > longestName) {
         return QStringLiteral("the names of the user and the host are too long together");
-    if (url.hasQuery())
+    }
+    if (url.hasQuery()) {
         return QStringLiteral("a '?' ends the path: write %3F for one that is part of it");
-    if (url.hasFragment())
+    }
+    if (url.hasFragment()) {
         return QStringLiteral("a '#' ends the path: write %23 for one that is part of it");
+    }
     const QString path = url.path(QUrl::FullyDecoded);
-    if (hasControl(path))
+    if (hasControl(path)) {
         return QStringLiteral("a control character in the path");
-    if (!survivesLocale(path))
+    }
+    if (!survivesLocale(path)) {
         return QStringLiteral("the path is not valid in the encoding of the locale");
-    if (leadsUp(path))
+    }
+    if (leadsUp(path)) {
         return QStringLiteral("'..' in the path");
+    }
     if (path.startsWith(QLatin1String("/~"))) {
-        if (scheme == QLatin1String("ftp"))
+        if (scheme == QLatin1String("ftp")) {
             return QStringLiteral("'~' at the beginning of the path, which ftp does not know");
-        if (path.size() > 2 && path.at(2) != slash)
+        }
+        if (path.size() > 2 && path.at(2) != slash) {
             return QStringLiteral("'%1' at the beginning of the path: only '~' is known there")
                 .arg(path.section(slash, 1, 1));
+        }
     }
     return QString();
 }
@@ -254,37 +283,46 @@ QString schemeOf(const QString& url)
 QString userOf(const QString& url)
 {
     const QString scheme = schemeOf(url);
-    if (scheme != QLatin1String("smb"))
+    if (scheme != QLatin1String("smb")) {
         return QUrl(url).userName(QUrl::FullyDecoded);
+    }
     const int start = scheme.size() + authorityMark.size();
     return smbUser(url.mid(start, authorityEnd(url, start) - start));
 }
 
 QString whyNotMountable(const QString& url)
 {
-    if (url.size() > longestUrl)
+    if (url.size() > longestUrl) {
         return QStringLiteral("longer than %1 characters").arg(longestUrl);
-    if (hasControl(url))
+    }
+    if (hasControl(url)) {
         return QStringLiteral("a control character in the URL");
-    if (!survivesLocale(url))
+    }
+    if (!survivesLocale(url)) {
         return QStringLiteral("not valid in the encoding of the locale");
-    if (url.trimmed() != url)
+    }
+    if (url.trimmed() != url) {
         return QStringLiteral("white space around the URL");
+    }
     const QStringList schemes = {
         QStringLiteral("smb"), QStringLiteral("ftp"), QStringLiteral("sftp")};
     const int schemeEnd = url.indexOf(authorityMark);
     const QString scheme = url.left(schemeEnd);
-    if (schemeEnd > 0 && !schemes.contains(scheme) && schemes.contains(scheme.toLower()))
+    if (schemeEnd > 0 && !schemes.contains(scheme) && schemes.contains(scheme.toLower())) {
         return QStringLiteral("a scheme is written in lower case: %1").arg(scheme.toLower());
-    if (schemeEnd < 0 || !schemes.contains(scheme))
+    }
+    if (schemeEnd < 0 || !schemes.contains(scheme)) {
         return QStringLiteral("not a URL of a network resource: smb, ftp or sftp, and a host");
-    if (shownUrl(url) != url)
+    }
+    if (shownUrl(url) != url) {
         return QStringLiteral("a password in a URL is seen by others: leave it out, and it is "
                               "asked for, or read as --password-fd says");
+    }
     const int start = schemeEnd + authorityMark.size();
     const QString authority = url.mid(start, authorityEnd(url, start) - start);
-    if (hasInvisible(authority))
+    if (hasInvisible(authority)) {
         return QStringLiteral("a control character in the URL");
+    }
     return scheme == QLatin1String("smb") ? whyNotSmb(url, authority)
                                           : whyNotFuse(url, scheme, authority);
 }
@@ -294,16 +332,21 @@ QString whyNoUser(const QString& scheme, const QString& user)
     const QString what = QStringLiteral("user");
     const QString tool = toolOf(scheme);
     QString why = whyNoName(user, what);
-    if (why.isEmpty())
+    if (why.isEmpty()) {
         why = whyHoldingSpace(user, what, tool);
-    if (why.isEmpty())
+    }
+    if (why.isEmpty()) {
         why = whyHolding(user, badInUsers, what, tool);
-    if (!why.isEmpty())
+    }
+    if (!why.isEmpty()) {
         return why;
-    if (scheme == QLatin1String("ftp"))
+    }
+    if (scheme == QLatin1String("ftp")) {
         return whyHolding(user, QLatin1String(",\\"), what, tool);
-    if (scheme == QLatin1String("smb"))
+    }
+    if (scheme == QLatin1String("smb")) {
         why = whyHolding(user, QLatin1String("%"), what, tool);
+    }
     // "DOMAIN\user" is how a user of a domain is named.
     const QLatin1Char backslash('\\');
     const bool isLoose = user.startsWith(backslash) || user.endsWith(backslash);
@@ -316,22 +359,29 @@ QString whyNoShare(const QString& share, const QString& host, const QString& wor
     const QString shareWhat = QStringLiteral("share");
     const QString workgroupWhat = QStringLiteral("workgroup");
     QString why = whyNoHost(host, tool);
-    if (why.isEmpty() && share.isEmpty())
+    if (why.isEmpty() && share.isEmpty()) {
         why = QStringLiteral("the share is missing behind the host");
-    if (why.isEmpty())
+    }
+    if (why.isEmpty()) {
         why = whyNoName(share, shareWhat);
-    if (why.isEmpty())
+    }
+    if (why.isEmpty()) {
         why = whyHoldingSpace(share, shareWhat, tool);
-    if (why.isEmpty())
+    }
+    if (why.isEmpty()) {
         why = whyHolding(share, badInShares, shareWhat, tool);
+    }
     // A hidden share ends with one.
-    if (why.isEmpty())
+    if (why.isEmpty()) {
         why = whyHolding(share.chopped(1), QLatin1String("$"), shareWhat, tool);
+    }
     // No tool is told of the workgroup.
-    if (why.isEmpty())
+    if (why.isEmpty()) {
         why = whyNoName(workgroup, workgroupWhat);
-    if (why.isEmpty())
+    }
+    if (why.isEmpty()) {
         why = whyHolding(workgroup, badInWorkgroups, workgroupWhat, QStringLiteral("a server"));
+    }
     return why;
 }
 
@@ -344,14 +394,16 @@ QString shownUrl(const QString& url)
     const int start = scheme.match(url).capturedLength();
     const int end = authorityEnd(url, start);
     const QRegularExpressionMatch match = colon.match(url.left(end), start);
-    if (!match.hasMatch())
+    if (!match.hasMatch()) {
         return url;
+    }
     int at = url.left(end).lastIndexOf(QLatin1Char('@'));
     // A password with a slash, which should be %2F, seems to end before its '@'. Behind a number,
     // which is a port, it is the path that has one.
     const int behind = match.capturedEnd();
-    if (at < start && !port.match(url.mid(behind, end - behind)).hasMatch())
+    if (at < start && !port.match(url.mid(behind, end - behind)).hasMatch()) {
         at = url.lastIndexOf(QLatin1Char('@'));
+    }
     return at >= behind ? url.left(match.capturedStart()) + url.mid(at) : url;
 }
 

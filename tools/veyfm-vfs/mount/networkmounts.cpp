@@ -30,18 +30,21 @@ QString urlOfDirectory(const QString& relative)
     const QStringList parts = relative.split(slash);
     const QString scheme = parts.constFirst();
     const bool isSftp = scheme == QLatin1String("sftp");
-    if (parts.size() != 2 || (!isSftp && scheme != QLatin1String("ftp")))
+    if (parts.size() != 2 || (!isSftp && scheme != QLatin1String("ftp"))) {
         return QString();
+    }
     QString account = parts.constLast();
     const bool isHome = isSftp && account.endsWith(QLatin1Char('~'));
-    if (isHome)
+    if (isHome) {
         account.chop(1);
+    }
     const int at = account.lastIndexOf(QLatin1Char('@'));
     QUrl url;
     url.setScheme(scheme);
     url.setHost(account.mid(at + 1), QUrl::DecodedMode);
-    if (at > 0)
+    if (at > 0) {
         url.setUserName(account.left(at), QUrl::DecodedMode);
+    }
     url.setPath(isHome ? QStringLiteral("/~/") : QString(slash));
     return url.isValid() && !url.host().isEmpty() ? url.toString() : QString();
 }
@@ -74,8 +77,9 @@ public:
                 isHeld = true;
             }
         }
-        if (isHeld)
+        if (isHeld) {
             return;
+        }
         const QString mountPoint = fuseMountAbove(path);
         add(url, mountPoint.isEmpty() ? QDir::cleanPath(place.localPath()) : mountPoint,
             place.path());
@@ -102,8 +106,9 @@ public:
             return left.kernelPath < right.kernelPath;
         });
         QVector<NetworkMount> mounts;
-        for (const Line& line : qAsConst(m_lines))
+        for (const Line& line : qAsConst(m_lines)) {
             mounts.append(line.mount);
+        }
         return mounts;
     }
 
@@ -133,9 +138,10 @@ private:
     {
         const QString path = kernelPath(directory, m_root);
         QString state = QStringLiteral("unknown");
-        if (m_kernel.why().isEmpty())
+        if (m_kernel.why().isEmpty()) {
             state =
                 m_kernel.isMountPoint(path) ? QStringLiteral("mounted") : QStringLiteral("stale");
+        }
         m_lines.append({path, {url, directory, state, placePath}});
     }
 
@@ -151,10 +157,12 @@ QVector<NetworkMount>
 networkMounts(const RegisteredMounts& registered, const MountInfo& kernel, const QString& root)
 {
     Collection all(kernel, root);
-    for (auto it = registered.directories.cbegin(); it != registered.directories.cend(); ++it)
+    for (auto it = registered.directories.cbegin(); it != registered.directories.cend(); ++it) {
         all.addDirectory(it.key(), it.value());
-    for (auto it = registered.places.cbegin(); it != registered.places.cend(); ++it)
+    }
+    for (auto it = registered.places.cbegin(); it != registered.places.cend(); ++it) {
         all.addPlace(it.key(), it.value());
+    }
     // Where the service could not tell what it has, nobody knows what it has not.
     all.addRest(registered.isKnown ? QStringLiteral("unregistered") : QStringLiteral("mounted"));
     return all.sorted();

@@ -51,8 +51,9 @@ void noteSignal(int number)
     const int error = errno;
     // SIGCONT comes along with others, and says the least.
     int none = 0;
-    if (!pendingSignal.compare_exchange_strong(none, number) && number != SIGCONT)
+    if (!pendingSignal.compare_exchange_strong(none, number) && number != SIGCONT) {
         pendingSignal = number;
+    }
     wake(wakeDescriptor);
     errno = error;
 }
@@ -70,14 +71,16 @@ public:
         action.sa_flags = SA_RESTART;
         for (size_t i = 0; i < watchedSignals.size(); ++i) {
             ::sigaction(watchedSignals[i], nullptr, &m_before[i]);
-            if (m_before[i].sa_handler != SIG_IGN)
+            if (m_before[i].sa_handler != SIG_IGN) {
                 ::sigaction(watchedSignals[i], &action, nullptr);
+            }
         }
     }
     ~SignalWatch()
     {
-        for (size_t i = 0; i < watchedSignals.size(); ++i)
+        for (size_t i = 0; i < watchedSignals.size(); ++i) {
             ::sigaction(watchedSignals[i], &m_before[i], nullptr);
+        }
     }
     SignalWatch(const SignalWatch&) = delete;
     SignalWatch& operator=(const SignalWatch&) = delete;
@@ -124,8 +127,9 @@ public:
     {
         const std::lock_guard<std::mutex> lock(hiddenLock);
         // Where they could not be put back, the terminal may still have those without an echo.
-        if (!m_isOwed && ::tcgetattr(m_terminal, &m_before) != 0)
+        if (!m_isOwed && ::tcgetattr(m_terminal, &m_before) != 0) {
             return false;
+        }
         termios hidden = m_before;
         hidden.c_lflag &= ~tcflag_t(ECHO | ECHOE | ECHOK | ECHONL);
         m_isOwed = true;
@@ -139,15 +143,17 @@ public:
     static void putBackFromElsewhere()
     {
         const std::lock_guard<std::mutex> lock(hiddenLock);
-        if (hiddenInput)
+        if (hiddenInput) {
             hiddenInput->putBackLocked();
+        }
     }
 
 private:
     void putBackLocked()
     {
-        if (m_isOwed && isInForeground(m_terminal))
+        if (m_isOwed && isInForeground(m_terminal)) {
             m_isOwed = ::tcsetattr(m_terminal, TCSAFLUSH, &m_before) != 0;
+        }
     }
 
     const int m_terminal;
@@ -161,10 +167,12 @@ void writeAll(int descriptor, const QByteArray& bytes)
     while (done < bytes.size()) {
         const ssize_t written =
             ::write(descriptor, bytes.constData() + done, size_t(bytes.size() - done));
-        if (written < 0 && errno != EINTR)
+        if (written < 0 && errno != EINTR) {
             return; // A terminal that has gone shows at the next read.
-        if (written > 0)
+        }
+        if (written > 0) {
             done += int(written);
+        }
     }
 }
 
@@ -178,10 +186,12 @@ Prompt::Prompt()
 
 Prompt::~Prompt()
 {
-    if (m_terminal >= 0)
+    if (m_terminal >= 0) {
         ::close(m_terminal);
-    if (m_wake >= 0)
+    }
+    if (m_wake >= 0) {
         ::close(m_wake);
+    }
 }
 
 bool Prompt::isAvailable() const
@@ -193,11 +203,13 @@ void Prompt::show(const QString& lines)
 {
     QString text = lines;
     text.remove(QLatin1Char('\r'));
-    while (text.endsWith(QLatin1Char('\n')))
+    while (text.endsWith(QLatin1Char('\n'))) {
         text.chop(1);
+    }
     const QStringList all = text.split(QLatin1Char('\n'));
-    for (const QString& line : all)
+    for (const QString& line : all) {
         writeAll(m_terminal, (escaped(line) + QLatin1Char('\n')).toLocal8Bit());
+    }
 }
 
 bool Prompt::ask(const QString& question, Echo echo, Secret& answer)
@@ -208,20 +220,24 @@ bool Prompt::ask(const QString& question, Echo echo, Secret& answer)
         bool answered = false;
         {
             const SignalWatch signals(m_wake);
-            if (echo == Hidden && !input.hide())
+            if (echo == Hidden && !input.hide()) {
                 return false;
+            }
             writeAll(m_terminal, bytes);
             answered = readLine(m_terminal, answer);
-            if (echo == Hidden || !answered)
+            if (echo == Hidden || !answered) {
                 writeAll(m_terminal, QByteArrayLiteral("\n"));
+            }
             input.putBack();
         }
         const int signalNumber = pendingSignal;
         // Now for real. What was stopped goes on here, with the question again.
-        if (signalNumber != 0)
+        if (signalNumber != 0) {
             ::raise(signalNumber);
-        if (answered || signalNumber == 0)
+        }
+        if (answered || signalNumber == 0) {
             return answered;
+        }
     }
     return false;
 }
@@ -231,10 +247,12 @@ bool Prompt::ask(const QString& question, Echo echo, Secret& answer)
 bool Prompt::waitForForeground()
 {
     for (int stops = 0; stops < mostStops; ++stops) {
-        if (m_cancelled)
+        if (m_cancelled) {
             return false;
-        if (isInForeground(m_terminal))
+        }
+        if (isInForeground(m_terminal)) {
             return true;
+        }
         // A shell looks after the group as a whole.
         ::kill(0, SIGTTIN);
         // A signal that came with the one to go on may be on its way to cancel() yet.
@@ -251,18 +269,23 @@ bool Prompt::readLine(int descriptor, Secret& answer)
     while (waitForInput(descriptor)) {
         char byte = 0;
         const ssize_t size = ::read(descriptor, &byte, 1);
-        if (size < 0 && (errno == EINTR || errno == EAGAIN))
+        if (size < 0 && (errno == EINTR || errno == EAGAIN)) {
             continue;
-        if (size == 0 && any)
+        }
+        if (size == 0 && any) {
             return true; // A last line without its end.
-        if (size <= 0)
+        }
+        if (size <= 0) {
             return false;
+        }
         any = true;
-        if (byte == '\n')
+        if (byte == '\n') {
             return true;
+        }
         answer.append(byte);
-        if (answer.isTooLong())
+        if (answer.isTooLong()) {
             return true;
+        }
     }
     answer.clear();
     return false;
@@ -299,16 +322,19 @@ bool Prompt::waitForInput(int descriptor) const
     while (true) {
         pollfd polled[] = {{descriptor, POLLIN, 0}, {m_wake, POLLIN, 0}};
         const int ready = ::poll(polled, 2, -1);
-        if (ready < 0 && errno != EINTR)
+        if (ready < 0 && errno != EINTR) {
             return false;
+        }
         if (polled[1].revents != 0 && !m_cancelled) {
             quint64 count = 0;
             [[maybe_unused]] const ssize_t size = ::read(m_wake, &count, sizeof count);
         }
-        if (m_cancelled || pendingSignal != 0)
+        if (m_cancelled || pendingSignal != 0) {
             return false;
-        if (ready > 0 && polled[0].revents != 0)
+        }
+        if (ready > 0 && polled[0].revents != 0) {
             return true;
+        }
     }
 }
 

@@ -30,8 +30,9 @@ void RecordJob::start()
 void RecordJob::look()
 {
     // The news may be of another bookmark.
-    if (m_ended || VFS::ptr()->networkPlace(m_bookmark).localPath() != m_localPath)
+    if (m_ended || VFS::ptr()->networkPlace(m_bookmark).localPath() != m_localPath) {
         return;
+    }
     m_ended = true;
     finishedOkLater();
 }

@@ -35,12 +35,13 @@ QStringList ScanJob::removed() const
 void ScanJob::start()
 {
     const VFS* vfs = VFS::ptr();
-    if (m_entry.isSambaNetworkPlace())
+    if (m_entry.isSambaNetworkPlace()) {
         followNetwork();
-    else if (m_entry.isSambaWorkgroupPlace())
+    } else if (m_entry.isSambaWorkgroupPlace()) {
         followWorkgroup(vfs->smbWorkgroup(m_entry));
-    else
+    } else {
         followHost(vfs->smbHost(m_entry), vfs->smbWorkgroup(m_entry));
+    }
     // Only shares need somebody to ask.
     auto* const job = new UpdateSmbEntryJob({}, m_entry, this);
     job->start();
@@ -59,15 +60,17 @@ void ScanJob::followWorkgroup(const QString& workgroup)
     connect(
         browser, &SmbBrowserProxy::workgroupNotUpdated, this,
         [this, workgroup](const QString& told) {
-            if (told == workgroup)
+            if (told == workgroup) {
                 end();
+            }
         });
     connect(
         browser, &SmbBrowserProxy::workgroupUpdated, this,
         [this,
          workgroup](const QString& told, const QStringList& added, const QStringList& removed) {
-            if (told == workgroup)
+            if (told == workgroup) {
                 end(added, removed);
+            }
         });
 }
 
@@ -77,23 +80,26 @@ void ScanJob::followHost(const QString& host, const QString& workgroup)
     connect(
         browser, &SmbBrowserProxy::hostNotUpdated, this,
         [this, host, workgroup](const QString& toldHost, const QString& toldWorkgroup) {
-            if (toldHost == host && toldWorkgroup == workgroup)
+            if (toldHost == host && toldWorkgroup == workgroup) {
                 end();
+            }
         });
     connect(
         browser, &SmbBrowserProxy::hostUpdated, this,
         [this, host, workgroup](
             const QString& toldHost, const QString& toldWorkgroup, const StringMap& added,
             const StringMap& removed) {
-            if (toldHost == host && toldWorkgroup == workgroup)
+            if (toldHost == host && toldWorkgroup == workgroup) {
                 end(added.keys(), removed.keys());
+            }
         });
 }
 
 void ScanJob::end(const QStringList& added, const QStringList& removed)
 {
-    if (m_ended)
+    if (m_ended) {
         return;
+    }
     m_ended = true;
     m_added = added;
     m_removed = removed;

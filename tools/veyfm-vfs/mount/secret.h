@@ -31,8 +31,9 @@ public:
     void append(char byte)
     {
         m_isTooLong = m_size == longest;
-        if (!m_isTooLong)
+        if (!m_isTooLong) {
             m_bytes[m_size++] = byte;
+        }
     }
 
     void clear()

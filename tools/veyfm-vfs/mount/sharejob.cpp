@@ -28,8 +28,9 @@ void ShareJob::start()
 
 void ShareJob::attached(Job* job)
 {
-    if (m_ended)
+    if (m_ended) {
         return;
+    }
     if (job->error() == 0) {
         look();
         return;
@@ -41,8 +42,9 @@ void ShareJob::attached(Job* job)
 void ShareJob::look()
 {
     const Entry share = VFS::ptr()->placeBase()->placeEntry(m_share.path());
-    if (m_ended || share.localPath().isEmpty())
+    if (m_ended || share.localPath().isEmpty()) {
         return;
+    }
     m_ended = true;
     finishedOkLater();
 }

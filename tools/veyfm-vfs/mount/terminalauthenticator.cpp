@@ -46,12 +46,15 @@ QString whyUnfit(const Secret& password, const QString& protocol)
         return QStringLiteral("a password can't be longer than %1 bytes")
             .arg(qulonglong(Secret::longest));
     }
-    if (password.isEmpty() && protocol == smb)
+    if (password.isEmpty() && protocol == smb) {
         return QStringLiteral("smbclient can't be given an empty password");
-    if (password.holdsControlCharacter())
+    }
+    if (password.holdsControlCharacter()) {
         return QStringLiteral("a password can't hold a control character");
-    if (!password.isText())
+    }
+    if (!password.isText()) {
         return QStringLiteral("the encoding of the locale can't express this password");
+    }
     return QString();
 }
 
@@ -60,8 +63,9 @@ void sayLines(QString text)
 {
     text.remove(QLatin1Char('\r'));
     const QStringList lines = text.split(QLatin1Char('\n'), Qt::SkipEmptyParts);
-    for (const QString& line : lines)
+    for (const QString& line : lines) {
         say(escaped(line));
+    }
 }
 
 } // namespace
@@ -74,15 +78,18 @@ public:
         : m_handler(authenticator.m_askingHandler)
         , m_isPersonAsked(authenticator.isPersonAsked())
     {
-        if (m_isPersonAsked)
+        if (m_isPersonAsked) {
             Spinner::end();
-        if (m_isPersonAsked && m_handler)
+        }
+        if (m_isPersonAsked && m_handler) {
             m_handler(true);
+        }
     }
     ~Asking()
     {
-        if (m_isPersonAsked && m_handler)
+        if (m_isPersonAsked && m_handler) {
             m_handler(false);
+        }
     }
     Asking(const Asking&) = delete;
     Asking& operator=(const Asking&) = delete;
@@ -164,8 +171,9 @@ QString TerminalAuthenticator::whyGivenUp() const
 
 bool TerminalAuthenticator::isWorthAnotherJob()
 {
-    if (!m_whyGivenUp.isEmpty() || !m_keyConfirmed || !m_passwordGiven)
+    if (!m_whyGivenUp.isEmpty() || !m_keyConfirmed || !m_passwordGiven) {
         return false;
+    }
     m_wasRefused = true;
     return true;
 }
@@ -173,15 +181,17 @@ bool TerminalAuthenticator::isWorthAnotherJob()
 QString TerminalAuthenticator::resource() const
 {
     QString text = protocol() + QLatin1String("://") + server();
-    if (!object().isEmpty())
+    if (!object().isEmpty()) {
         text += QLatin1Char('/') + object();
+    }
     return text;
 }
 
 QString TerminalAuthenticator::giveUp(const QString& why, bool* cancelled)
 {
-    if (m_whyGivenUp.isEmpty())
+    if (m_whyGivenUp.isEmpty()) {
         m_whyGivenUp = why;
+    }
     *cancelled = true;
     return QString();
 }
@@ -204,8 +214,9 @@ QString TerminalAuthenticator::requestPassword(
 {
     Q_UNUSED(isRetry) // Some jobs say so of the first question, too.
     m_userChangedLast = false;
-    if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty())
+    if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty()) {
         return giveUp(wasCancelled(), cancelled);
+    }
     if (m_triedResource != resource()) {
         m_triedResource = resource();
         m_tries = 0;
@@ -213,20 +224,25 @@ QString TerminalAuthenticator::requestPassword(
     }
     // A job that asks when its tool has ended throws the answer away.
     const bool isUsed = protocol() == smb || hasRunningDescendants();
-    if (!isUsed)
+    if (!isUsed) {
         m_wasRefused = true; // Without a user the jobs do not tell.
+    }
     QString why = whyNoMoreTries(isUsed);
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return giveUp(why, cancelled);
+    }
 
     const Asking asking(*this);
-    if (isUsed && m_wasRefused && isPersonAsked())
+    if (isUsed && m_wasRefused && isPersonAsked()) {
         m_prompt.show(message.isEmpty() || protocol() != smb ? title : message);
+    }
     QString name = user;
-    if (isUserAsked(user, isUsed))
+    if (isUserAsked(user, isUsed)) {
         why = whyNoUserName(name);
-    if (!why.isEmpty())
+    }
+    if (!why.isEmpty()) {
         return giveUp(why, cancelled);
+    }
     if (name != user) {
         user = name;
         *userChanged = true;
@@ -237,12 +253,14 @@ QString TerminalAuthenticator::requestPassword(
         }
     }
     m_passwordGiven = isUsed;
-    if (!isUsed)
+    if (!isUsed) {
         return QString();
+    }
     Secret password;
     why = whyNoPassword(name, password);
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return giveUp(why, cancelled);
+    }
     ++m_tries;
     return password.text();
 }
@@ -259,12 +277,15 @@ void TerminalAuthenticator::noteChangedUser(const QString& user)
 /// Why there is no use in another try; empty when there is.
 QString TerminalAuthenticator::whyNoMoreTries(bool isUsed) const
 {
-    if (!m_wasRefused)
+    if (!m_wasRefused) {
         return QString();
-    if (m_tries == mostTries)
+    }
+    if (m_tries == mostTries) {
         return QStringLiteral("three passwords were refused");
-    if (m_descriptorRead)
+    }
+    if (m_descriptorRead) {
         return QStringLiteral("the password was refused");
+    }
     if (protocol() == sftp && !isUsed && !m_passwordGiven) {
         return QStringLiteral("the connection ended before a password was asked for: look with "
                               "'%1' whether the host answers, and lets you in")
@@ -280,10 +301,12 @@ bool TerminalAuthenticator::isPersonAsked() const
 
 bool TerminalAuthenticator::isUserAsked(const QString& user, bool isUsed) const
 {
-    if (!user.isEmpty())
+    if (!user.isEmpty()) {
         return protocol() == smb;
-    if (protocol() != sftp)
+    }
+    if (protocol() != sftp) {
         return true;
+    }
     // Without a name ssh has one of its own.
     return isUsed && (!m_login.user.isEmpty() || isPersonAsked());
 }
@@ -291,10 +314,11 @@ bool TerminalAuthenticator::isUserAsked(const QString& user, bool isUsed) const
 QString TerminalAuthenticator::whyNoAnswer(const QString& needed, const QString& options) const
 {
     QString why = needed + QLatin1String(" is needed");
-    if (m_login.noInput)
+    if (m_login.noInput) {
         why += QLatin1String(", and --no-input forbids asking");
-    else if (m_login.passwordDescriptor < 0)
+    } else if (m_login.passwordDescriptor < 0) {
         why += QLatin1String(", and there is no terminal to ask on");
+    }
     return why + QLatin1String(": use ") + options;
 }
 
@@ -323,11 +347,13 @@ QString TerminalAuthenticator::whyNoUserName(QString& user)
     while (true) {
         Secret line;
         const QString question = QStringLiteral("User name for %1 [%2]: ").arg(resource(), offered);
-        if (!m_prompt.ask(question, Prompt::Shown, line))
+        if (!m_prompt.ask(question, Prompt::Shown, line)) {
             return whyNotAnswered();
+        }
         const QString typed = line.text().trimmed();
-        if (typed.isEmpty() && protocol() == sftp)
+        if (typed.isEmpty() && protocol() == sftp) {
             return QString();
+        }
         const QString name = typed.isEmpty() ? offered : typed;
         const QString why = line.isTooLong() ? QStringLiteral("the name of the user is too long")
                                              : whyNoUser(protocol(), name);
@@ -345,11 +371,13 @@ QString TerminalAuthenticator::whyNoPassword(const QString& user, Secret& passwo
     const QString whose =
         user.isEmpty() ? resource() : QStringLiteral("%1 on %2").arg(user, resource());
     if (m_login.passwordDescriptor >= 0) {
-        if (m_descriptorRead)
+        if (m_descriptorRead) {
             return QStringLiteral("a second password is needed, for ") + whose;
+        }
         m_descriptorRead = true;
-        if (m_prompt.readLine(m_login.passwordDescriptor, password))
+        if (m_prompt.readLine(m_login.passwordDescriptor, password)) {
             return whyUnfit(password, protocol());
+        }
         m_isDescriptorSilent = m_prompt.isCancelled();
         return m_isDescriptorSilent ? wasCancelled()
                                     : QStringLiteral("no password could be read from descriptor %1")
@@ -361,11 +389,13 @@ QString TerminalAuthenticator::whyNoPassword(const QString& user, Secret& passwo
     }
     while (true) {
         const QString question = QStringLiteral("Password for %1: ").arg(whose);
-        if (!m_prompt.ask(question, Prompt::Hidden, password))
+        if (!m_prompt.ask(question, Prompt::Hidden, password)) {
             return whyNotAnswered();
+        }
         const QString why = whyUnfit(password, protocol());
-        if (why.isEmpty())
+        if (why.isEmpty()) {
             return QString();
+        }
         m_prompt.show(why);
     }
 }
@@ -374,8 +404,9 @@ bool TerminalAuthenticator::askQuestion(const QString& title, const QString& tex
 {
     Q_UNUSED(title) // It says that this is a question.
     m_userChangedLast = false;
-    if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty())
+    if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty()) {
         return false;
+    }
     const Asking asking(*this);
     if (!isPersonAsked()) {
         sayLines(text);

@@ -71,8 +71,9 @@ public:
                 take(job);
                 return QString();
             }
-            if (result.end == JobResult::Silent && m_authenticator->isWorthAnotherJob())
+            if (result.end == JobResult::Silent && m_authenticator->isWorthAnotherJob()) {
                 continue;
+            }
             QString why = m_watch.whyStopped();
             m_watch.call([&] { why = whyFailed(result, m_scheme, *m_authenticator, m_watch); });
             return why;
@@ -119,10 +120,11 @@ public:
         , m_runner(url.scheme(), m_shown, login, timeoutSeconds)
     {
         m_runner.authenticator().setQuestionHandler([this](bool asking) {
-            if (asking)
+            if (asking) {
                 m_trace.pause();
-            else
+            } else {
                 m_trace.resume();
+            }
         });
         // A job is cut off in a call to the service, before its tool runs or when that has done
         // well.
@@ -141,18 +143,21 @@ public:
                              : QStringLiteral("the network is switched off in the settings");
         });
         find();
-        if (!m_runner.watch().wasInterrupted())
+        if (!m_runner.watch().wasInterrupted()) {
             result.why = work();
-        if (m_runner.watch().wasInterrupted())
+        }
+        if (m_runner.watch().wasInterrupted()) {
             result.why = m_runner.watch().whyStopped();
+        }
         if (!result.why.isEmpty()) {
             result.wasInterrupted = m_runner.watch().wasInterrupted();
             cleanUp();
             return result;
         }
         result.state = wasThere() ? UrlMount::Present : UrlMount::New;
-        if (result.state == UrlMount::New && !m_whyAlone.isEmpty())
+        if (result.state == UrlMount::New && !m_whyAlone.isEmpty()) {
             reportAlone(m_whyAlone);
+        }
         result.url = m_url.toString(QUrl::FullyEncoded);
         result.localPath =
             QDir::cleanPath(m_directory + slash + MountPaths::mountRootRelativePath(m_url));
@@ -182,11 +187,13 @@ private:
             m_hasPlace = places.contains(rootUrl());
             m_directory = VFS::ptr()->fuseMountsManager()->mounts().value(rootUrl());
             m_isRegistered = !m_directory.isEmpty();
-            if (!m_isRegistered)
+            if (!m_isRegistered) {
                 m_directory = places.value(rootUrl()).localPath();
+            }
         }
-        if (m_directory.isEmpty())
+        if (m_directory.isEmpty()) {
             m_directory = fuseDirectory(m_url);
+        }
     }
 
     /// From any thread.
@@ -208,14 +215,16 @@ private:
             return why.isEmpty() ? share() : why;
         }
         QString why = whyNoTool(m_url.scheme());
-        if (!why.isEmpty())
+        if (!why.isEmpty()) {
             return why;
+        }
         forgetRegistration();
         // A place that is there would do for the job that makes one, mounted or not.
         why = m_whyAlone.isEmpty() && !m_hasPlace ? runJob<MountFuseEntryJob>()
                                                   : runJob<MountURLJob>();
-        if (!why.isEmpty())
+        if (!why.isEmpty()) {
             return why;
+        }
         // The user may have changed on the way, and what is registered for the new one is taken
         // by the job as it stands.
         find();
@@ -243,15 +252,17 @@ private:
     void takeUser()
     {
         const QStringList users = m_runner.authenticator().changedUsers();
-        if (!users.isEmpty())
+        if (!users.isEmpty()) {
             m_url.setUserName(users.constLast(), QUrl::DecodedMode);
+        }
     }
 
     /// Makes a mount known that the service knows nothing of, or has no place for.
     QString share()
     {
-        if (!m_whyAlone.isEmpty() || m_hasPlace)
+        if (!m_whyAlone.isEmpty() || m_hasPlace) {
             return QString();
+        }
         if (!m_isRegistered) {
             registerAs(m_directory);
             find();
@@ -272,8 +283,9 @@ private:
     /// What is registered but not mounted is no help: a job would take it for a mount.
     void forgetRegistration()
     {
-        if (m_isRegistered)
+        if (m_isRegistered) {
             registerAs(QString());
+        }
         m_isRegistered = false;
     }
 
@@ -290,12 +302,14 @@ private:
             return QStringLiteral("the tool ended well, but nothing is mounted on %1")
                 .arg(m_directory);
         }
-        if (!wasThere())
+        if (!wasThere()) {
             return QString();
+        }
         const Waiting waiting(QStringLiteral("Looking at the mount"));
         const QString why = whyDead(m_directory, m_patience);
-        if (why.isEmpty())
+        if (why.isEmpty()) {
             return QString();
+        }
         return QStringLiteral("it was mounted before, but is dead (%2): run fusermount3 -uz '%1', "
                               "then try again")
             .arg(m_directory, why);
@@ -317,13 +331,15 @@ private:
     void cleanUp()
     {
         FuseTrace::Made made = FuseTrace::NoMounts;
-        if (m_runner.authenticator().hasMounted())
+        if (m_runner.authenticator().hasMounted()) {
             made = FuseTrace::AllMounts;
-        else if (m_runner.wasStopped())
+        } else if (m_runner.wasStopped()) {
             made = FuseTrace::DeadMounts;
+        }
         m_trace.remove(directories(), made);
-        if (wasThere() || !m_whyAlone.isEmpty() || !m_runner.authenticator().wasAccepted())
+        if (wasThere() || !m_whyAlone.isEmpty() || !m_runner.authenticator().wasAccepted()) {
             return;
+        }
         // Without waiting: that it is silent may be the reason.
         QDBusMessage message = QDBusMessage::createMethodCall(
             serviceName(), QStringLiteral("/FuseMountsManager"),
@@ -339,8 +355,9 @@ private:
         const Entry named = VFS::ptr()->createEntryForUrl(rootUrl(), m_directory);
         const Entry place = VFS::ptr()->placeBase()->placeEntry(named.path());
         const QString root = QDir::cleanPath(place.localPath());
-        if (place.isNull() || !(localPath + slash).startsWith(root + slash))
+        if (place.isNull() || !(localPath + slash).startsWith(root + slash)) {
             return QString();
+        }
         return place.path() + localPath.mid(root.size());
     }
 
@@ -367,10 +384,11 @@ UrlMount mountSamba(const QString& url, const Login& login, int timeoutSeconds)
     JobRunner runner(scheme, shownUrl(url), login, timeoutSeconds);
     runner.watch().setCutOff(shownUrl(url));
     runner.watch().call([&result] { result.why = whyNoRunningService(); });
-    if (!result.why.isEmpty())
+    if (!result.why.isEmpty()) {
         result.why.prepend(QStringLiteral("Samba shares are reached through the service: "));
-    else
+    } else {
         result.why = whyNoTool(scheme);
+    }
     if (result.why.isEmpty()) {
         result.why = runner.run<MountURLJob>(
             [&url] { return url; },
@@ -385,8 +403,9 @@ UrlMount mountSamba(const QString& url, const Login& login, int timeoutSeconds)
 UrlMount mountFuse(const QString& url, const Login& login, int timeoutSeconds)
 {
     QUrl parsed(url);
-    if (!login.user.isEmpty())
+    if (!login.user.isEmpty()) {
         parsed.setUserName(login.user, QUrl::DecodedMode);
+    }
     return FuseMounter(parsed, login, timeoutSeconds).mount();
 }
 
@@ -394,13 +413,15 @@ UrlMount mountFuse(const QString& url, const Login& login, int timeoutSeconds)
 QString whyMissing(const UrlMount& mount, int timeoutSeconds)
 {
     const Waiting waiting(QStringLiteral("Looking at the mount"));
-    if (!isMissing(mount.localPath, lookSeconds(timeoutSeconds)))
+    if (!isMissing(mount.localPath, lookSeconds(timeoutSeconds))) {
         return QString();
+    }
     // smbclient that fails to find something counts as one that was let in.
-    if (mount.state == UrlMount::Reached)
+    if (mount.state == UrlMount::Reached) {
         return QStringLiteral("there is nothing at %1: look with 'smbclient -L %2' whether the "
                               "host answers and has that share")
             .arg(mount.localPath, SmbUrl(mount.url).host());
+    }
     return QStringLiteral("it is mounted, but the server has no such file or directory: %1")
         .arg(mount.localPath);
 }
@@ -411,8 +432,9 @@ UrlMount mountUrl(const QString& url, const Login& login, int timeoutSeconds)
 {
     UrlMount mount = schemeOf(url) == QLatin1String("smb") ? mountSamba(url, login, timeoutSeconds)
                                                            : mountFuse(url, login, timeoutSeconds);
-    if (mount.why.isEmpty())
+    if (mount.why.isEmpty()) {
         mount.why = whyMissing(mount, timeoutSeconds);
+    }
     return mount;
 }
 

@@ -62,8 +62,9 @@ int jobTimeout(const Invocation& invocation)
 
 void boundParting()
 {
-    if (!hadToStop)
+    if (!hadToStop) {
         return;
+    }
     // A service that hangs keeps a process at its very end too.
     std::thread([] {
         std::this_thread::sleep_for(parting);
@@ -83,8 +84,9 @@ JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int time
     : m_authenticator(std::move(authenticator))
     , m_timeoutSeconds(timeoutSeconds)
 {
-    if (!m_pipe.isOpen())
+    if (!m_pipe.isOpen()) {
         qFatal("no pipe for the watch of a job");
+    }
     m_thread = std::thread([this] { watch(); });
     m_pipe.catchSignals({SIGINT, SIGTERM, SIGHUP}, SA_RESTART);
 }
@@ -94,8 +96,9 @@ JobWatch::~JobWatch()
     m_pipe.send(SignalPipe::End);
     m_thread.join();
     // Behind a signal the verb ends, and another may be on its way: it does nothing any more.
-    if (!wasInterrupted())
+    if (!wasInterrupted()) {
         m_pipe.releaseSignals();
+    }
 }
 
 void JobWatch::setCutOff(const QString& what, const std::function<void()>& cleanUp)
@@ -122,12 +125,14 @@ JobResult JobWatch::run(Job& job, const QString& doing)
     job.setDeleteOnFinish(false);
     m_authenticator->beginJob();
     m_timedOut = false;
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return {JobResult::Interrupted, 0, QString()};
+    }
     m_authenticator->setAskingHandler([this, doing](bool asking) {
         setState(InJob, !asking);
-        if (!asking)
+        if (!asking) {
             Spinner::begin(doing);
+        }
     });
     JobResult result;
     {
@@ -138,17 +143,19 @@ JobResult JobWatch::run(Job& job, const QString& doing)
     }
     m_authenticator->setAskingHandler({});
     // What comes too late does not count: the caller cleans up behind it.
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         result.end = JobResult::Interrupted;
-    else if (m_timedOut)
+    } else if (m_timedOut) {
         result.end = JobResult::TimedOut;
+    }
     return result;
 }
 
 void JobWatch::call(const std::function<void()>& work)
 {
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return;
+    }
     const Waiting waiting(waitingForService());
     setState(InCall, true);
     work();
@@ -177,19 +184,22 @@ JobResult JobWatch::resultOf(Job& job)
         const QList<QProcess*> tools = job.findChildren<QProcess*>();
         for (QProcess* tool : tools) {
             const auto note = [&, tool](QProcess::ProcessError error) {
-                if (error != QProcess::FailedToStart)
+                if (error != QProcess::FailedToStart) {
                     return;
+                }
                 ended = true;
                 result = {JobResult::NotStarted, 0, tool->errorString()};
                 loop.quit();
             };
             QObject::connect(tool, &QProcess::errorOccurred, &loop, note);
         }
-        if (!wasStopped())
+        if (!wasStopped()) {
             loop.exec();
+        }
         // Jobs that were stopped end with their tools, and those that were given up clean up then.
-        while (hasRunningTool(job))
+        while (hasRunningTool(job)) {
             loop.processEvents(QEventLoop::WaitForMoreEvents);
+        }
     }
     const std::lock_guard<std::mutex> lock(m_lock);
     m_loop = nullptr;
@@ -205,8 +215,9 @@ void JobWatch::setState(State state, bool clockRuns)
 {
     {
         const std::lock_guard<std::mutex> lock(m_lock);
-        if (m_state == Idle && state != Idle)
+        if (m_state == Idle && state != Idle) {
             ++m_turn;
+        }
         m_state = state;
         m_clockRuns = clockRuns && m_timeoutSeconds > 0;
         m_isNew = true;
@@ -231,16 +242,19 @@ bool JobWatch::hasNextTurn()
 int JobWatch::millisecondsToWait()
 {
     const std::lock_guard<std::mutex> lock(m_lock);
-    if (m_isNew)
+    if (m_isNew) {
         m_deadline = runningTime() + std::chrono::seconds(m_timeoutSeconds);
+    }
     m_isNew = false;
-    if (m_state == Idle || !m_clockRuns)
+    if (m_state == Idle || !m_clockRuns) {
         return -1;
+    }
     const auto left =
         std::chrono::duration_cast<std::chrono::milliseconds>(m_deadline - runningTime()).count();
     m_timedOut = left < 0;
-    if (m_timedOut)
+    if (m_timedOut) {
         m_timedOutTurn = m_turn;
+    }
     return left < 0 ? 0 : int(std::min<qint64>(left + 1, paceMilliseconds));
 }
 
@@ -257,8 +271,9 @@ SignalPipe::Byte JobWatch::nextByte(int milliseconds)
     const Clock::time_point latest = Clock::now() + std::chrono::milliseconds(milliseconds);
     const SignalPipe::Byte byte = m_pipe.next(milliseconds);
     const Clock::time_point time = Clock::now();
-    if (milliseconds >= 0 && time > latest)
+    if (milliseconds >= 0 && time > latest) {
         m_lost += time - latest;
+    }
     return byte;
 }
 
@@ -268,14 +283,17 @@ void JobWatch::watch()
         const int milliseconds = millisecondsToWait();
         if (milliseconds != 0) {
             const SignalPipe::Byte byte = nextByte(milliseconds);
-            if (byte == SignalPipe::End)
+            if (byte == SignalPipe::End) {
                 return;
-            if (byte != SignalPipe::Signal)
+            }
+            if (byte != SignalPipe::Signal) {
                 continue;
+            }
             m_interrupted = true;
         }
-        if (!stop())
+        if (!stop()) {
             return;
+        }
     }
 }
 
@@ -290,16 +308,18 @@ bool JobWatch::stop()
         // Again and again, since a job may start another tool, or its loop, only now.
         const State now = state();
         // The next one may have begun already, and has its own time.
-        if ((now == Idle || hasNextTurn()) && !m_interrupted)
+        if ((now == Idle || hasNextTurn()) && !m_interrupted) {
             return true;
+        }
         if (now == InJob) {
             m_authenticator->cancel();
             quitLoop();
             tools.end();
         }
         const SignalPipe::Byte byte = nextByte(paceMilliseconds);
-        if (byte == SignalPipe::End)
+        if (byte == SignalPipe::End) {
             return false;
+        }
         const Clock::time_point time = runningTime();
         if (byte == SignalPipe::Signal && !m_interrupted) {
             m_interrupted = true;
@@ -307,16 +327,18 @@ bool JobWatch::stop()
         } else if (byte == SignalPipe::Signal && time - signalled >= graceOfSignals) {
             cutOff();
         }
-        if (time - begin >= grace || (now == InCall && time - begin >= graceOfCalls))
+        if (time - begin >= grace || (now == InCall && time - begin >= graceOfCalls)) {
             cutOff();
+        }
     }
 }
 
 void JobWatch::quitLoop()
 {
     const std::lock_guard<std::mutex> lock(m_lock);
-    if (m_loop)
+    if (m_loop) {
         QMetaObject::invokeMethod(m_loop, &QEventLoop::quit, Qt::QueuedConnection);
+    }
 }
 
 void JobWatch::cutOff()
@@ -330,8 +352,9 @@ void JobWatch::cutOff()
         cleanUp = m_cleanUp;
     }
     Prompt::restoreTerminal();
-    if (cleanUp)
+    if (cleanUp) {
         cleanUp();
+    }
     const bool isServiceSilent = state() == InCall && !wasInterrupted();
     report(
         what, isServiceSilent

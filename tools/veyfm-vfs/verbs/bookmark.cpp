@@ -34,8 +34,9 @@ QList<Favourite> favourites()
     const int prefix = parent.path().size() + 1;
     QList<Favourite> all;
     const EntryList entries = VFS::ptr()->childs(parent);
-    for (const Entry& entry : entries)
+    for (const Entry& entry : entries) {
         all.append({entry.path().mid(prefix), entry});
+    }
     return all;
 }
 
@@ -50,8 +51,9 @@ QString whyNoFavourites()
 int runList(Invocation& invocation)
 {
     const QList<Favourite> all = favourites();
-    if (all.isEmpty() && hasFailed(invocation, whyNoFavourites()))
+    if (all.isEmpty() && hasFailed(invocation, whyNoFavourites())) {
         return Failed;
+    }
     Output& output = invocation.output();
     if (invocation.json()) {
         JsonArray json(output);
@@ -64,8 +66,9 @@ int runList(Invocation& invocation)
         return Done;
     }
     Table table;
-    for (const Favourite& favourite : all)
+    for (const Favourite& favourite : all) {
         table.add({favourite.name, favourite.entry.localPath()});
+    }
     table.write(output);
     return Done;
 }
@@ -76,10 +79,12 @@ int runAdd(Invocation& invocation)
     const QString operand = invocation.operands().constFirst();
     const Located located = locate(operand);
     QString why = located.why;
-    if (why.isEmpty() && located.entry.localPath().isEmpty())
+    if (why.isEmpty() && located.entry.localPath().isEmpty()) {
         why = QStringLiteral("no directory on the disk");
-    if (why.isEmpty())
+    }
+    if (why.isEmpty()) {
         why = whyUnreadable(located.entry);
+    }
     if (!why.isEmpty()) {
         report(operand, why);
         return Failed;
@@ -126,15 +131,18 @@ int runRemove(Invocation& invocation)
             return found == all.end() ? Favourite() : *found;
         };
         Favourite found = first([&](const Favourite& each) { return each.name == operand; });
-        if (found.entry.isNull() && !entry.isNull())
+        if (found.entry.isNull() && !entry.isNull()) {
             found = first([&](const Favourite& each) { return each.entry == entry; });
-        if (found.entry.isNull() && !entry.localPath().isEmpty())
+        }
+        if (found.entry.isNull() && !entry.localPath().isEmpty()) {
             found = first(
                 [&](const Favourite& each) { return each.entry.localPath() == entry.localPath(); });
+        }
         if (found.entry.isNull()) {
             const QString why = all.isEmpty() ? whyNoFavourites() : QString();
-            if (wasInterrupted())
+            if (wasInterrupted()) {
                 return Failed;
+            }
             report(operand, why.isEmpty() ? QStringLiteral("no such favourite") : why);
             exitCode = Failed;
             continue;
@@ -146,10 +154,12 @@ int runRemove(Invocation& invocation)
         }
         const int code = waitForNews(
             invocation, operand, [vfs, &place] { return !vfs->hasFavouritePlace(place); });
-        if (wasInterrupted())
+        if (wasInterrupted()) {
             return Failed;
-        if (code != Done)
+        }
+        if (code != Done) {
             exitCode = code;
+        }
     }
     return exitCode;
 }

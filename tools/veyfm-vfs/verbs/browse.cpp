@@ -42,10 +42,12 @@ Question question(const char* method, const char* signature, const QVariantList&
 
 void fill(Level& level, const QStringList& names, const Question& again)
 {
-    for (const QString& name : names)
+    for (const QString& name : names) {
         level.names.insert(name, QString());
-    if (names.isEmpty() && !wasInterrupted())
+    }
+    if (names.isEmpty() && !wasInterrupted()) {
         level.why = whyNothing(again);
+    }
 }
 
 // Each level is known only through the one above.
@@ -62,20 +64,23 @@ Level below(const Level& above, const QString& name, const char* what)
 {
     Level level;
     level.why = above.why;
-    if (level.why.isEmpty() && !above.names.contains(name))
+    if (level.why.isEmpty() && !above.names.contains(name)) {
         level.why = QStringLiteral("no such ") + QLatin1String(what);
-    if (!above.path.isEmpty())
+    }
+    if (!above.path.isEmpty()) {
         level.path = above.path + slash + name;
+    }
     return level;
 }
 
 Level hosts(const QString& workgroup)
 {
     Level level = below(workgroups(), workgroup, "workgroup");
-    if (level.why.isEmpty() && !wasInterrupted())
+    if (level.why.isEmpty() && !wasInterrupted()) {
         fill(
             level, VFS::ptr()->smbBrowser()->hosts(workgroup),
             question("hosts", "as", {workgroup}));
+    }
     return level;
 }
 
@@ -83,11 +88,13 @@ Level shares(const QString& workgroup, const QString& host)
 {
     Level level = below(hosts(workgroup), host, "host or workgroup");
     level.hasLocalPaths = true;
-    if (!level.why.isEmpty() || wasInterrupted())
+    if (!level.why.isEmpty() || wasInterrupted()) {
         return level;
+    }
     level.names = VFS::ptr()->smbBrowser()->shares(host, workgroup);
-    if (level.names.isEmpty() && !wasInterrupted())
+    if (level.names.isEmpty() && !wasInterrupted()) {
         level.why = whyNothing(question("shares", "a{ss}", {host, workgroup}));
+    }
     return level;
 }
 
@@ -100,10 +107,12 @@ int fail(const Invocation& invocation, const QString& why)
 
 int print(Invocation& invocation, const Level& level)
 {
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return Failed;
-    if (!level.why.isEmpty())
+    }
+    if (!level.why.isEmpty()) {
         return fail(invocation, level.why);
+    }
     Output& output = invocation.output();
     JsonArray json(output);
     Table table;
@@ -116,14 +125,16 @@ int print(Invocation& invocation, const Level& level)
         const QString path = level.path.isEmpty() ? QString() : level.path + slash + it.key();
         QJsonObject object = {
             {QStringLiteral("name"), it.key()}, {QStringLiteral("path"), textOrNull(path)}};
-        if (level.hasLocalPaths)
+        if (level.hasLocalPaths) {
             object.insert(QStringLiteral("localPath"), textOrNull(it.value()));
+        }
         json.append(object);
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
-    else
+    } else {
         table.write(output);
+    }
     return Done;
 }
 
@@ -132,8 +143,9 @@ Level namedLevel(const Invocation& invocation)
 {
     const Waiting waiting(QStringLiteral("Looking at the Samba network"));
     const QStringList operands = invocation.operands();
-    if (operands.isEmpty())
+    if (operands.isEmpty()) {
         return workgroups();
+    }
     return operands.size() == 1 ? hosts(operands.at(0)) : shares(operands.at(0), operands.at(1));
 }
 
@@ -150,21 +162,23 @@ int printNews(Invocation& invocation, const Level& level, const ScanJob& job)
     const auto add = [&](const QString& change, const QStringList& names) {
         for (const QString& name : names) {
             const QString path = level.path + slash + name;
-            if (invocation.json())
+            if (invocation.json()) {
                 json.append(
                     {{QStringLiteral("change"), change},
                      {QStringLiteral("name"), name},
                      {QStringLiteral("path"), path}});
-            else
+            } else {
                 table.add({change, path});
+            }
         }
     };
     add(QStringLiteral("removed"), job.removed());
     add(QStringLiteral("added"), job.added());
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
-    else
+    } else {
         table.write(output);
+    }
     return Done;
 }
 
@@ -179,8 +193,9 @@ Entry placeOf(const QStringList& names)
             std::find_if(children.begin(), children.end(), [&path](const Entry& child) {
                 return child.path() == path;
             });
-        if (found == children.end())
+        if (found == children.end()) {
             return Entry();
+        }
         place = *found;
     }
     return place;
@@ -189,10 +204,12 @@ Entry placeOf(const QStringList& names)
 int runRescan(Invocation& invocation)
 {
     const Level level = namedLevel(invocation);
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return Failed;
-    if (!level.why.isEmpty())
+    }
+    if (!level.why.isEmpty()) {
         return fail(invocation, level.why);
+    }
     const Entry entry = placeOf(invocation.operands());
     if (entry.isNull()) {
         return fail(
@@ -204,10 +221,12 @@ int runRescan(Invocation& invocation)
     QObject::connect(&job, &Job::finished, &job, [&ended] { ended = true; });
     job.start();
     const int seconds = secondsToWait(invocation, defaultTimeout);
-    if (waitUntil(QStringLiteral("Scanning the Samba network"), seconds, [&] { return ended; }))
+    if (waitUntil(QStringLiteral("Scanning the Samba network"), seconds, [&] { return ended; })) {
         return printNews(invocation, level, job);
-    if (wasInterrupted())
+    }
+    if (wasInterrupted()) {
         return Failed;
+    }
     return fail(invocation, whyNoNews(ScanJob::news(), seconds));
 }
 

@@ -28,8 +28,9 @@ EntryList fixedPlaces()
         vfs.ftpNetworkEntry(), vfs.sftpNetworkEntry(), vfs.storageDevicesEntry(),
     };
     for (const Entry& place : all) {
-        if (!place.isNull())
+        if (!place.isNull()) {
             places.append(place);
+        }
     }
     return places;
 }
@@ -40,11 +41,13 @@ void addEntries(
 {
     for (const Entry& entry : entries) {
         const QString name = shownName(entry);
-        if (!name.startsWith(start))
+        if (!name.startsWith(start)) {
             continue;
+        }
         const bool hidden = entry.isHidden() && !entry.isPlace();
-        if (hidden && !start.startsWith(QLatin1Char('.')))
+        if (hidden && !start.startsWith(QLatin1Char('.'))) {
             continue;
+        }
         const bool leadsOn = entry.isPlace() || entry.isDir();
         candidates.append(typed + name + (leadsOn ? QStringLiteral("/") : QString()));
     }
@@ -56,16 +59,19 @@ QStringList entryCandidates(const QString& word)
     const int slash = word.lastIndexOf(QLatin1Char('/'));
     const QString typed = word.left(slash + 1);
     const QString start = word.mid(slash + 1);
-    if (typed.isEmpty())
+    if (typed.isEmpty()) {
         addEntries(candidates, fixedPlaces(), typed, start);
+    }
 
     // The shell hands over a tilde as it was typed.
     QString directory = typed.isEmpty() ? QStringLiteral(".") : typed;
-    if (directory.startsWith(QLatin1String("~/")))
+    if (directory.startsWith(QLatin1String("~/"))) {
         directory.replace(0, 1, QDir::homePath());
+    }
     const Entry entry = resolveText(directory).entry;
-    if (!entry.isNull() && !opensOnFirstLook(entry))
+    if (!entry.isNull() && !opensOnFirstLook(entry)) {
         addEntries(candidates, VFS::ptr()->childs(entry), typed, start);
+    }
     return candidates;
 }
 
@@ -73,8 +79,9 @@ QStringList verbCandidates(const QString& word, const QVector<Verb>& verbs)
 {
     QStringList candidates;
     for (const Verb& verb : verbs) {
-        if (!verb.hidden && verb.word().startsWith(word))
+        if (!verb.hidden && verb.word().startsWith(word)) {
             candidates.append(verb.word());
+        }
     }
     return candidates;
 }
@@ -86,16 +93,19 @@ QStringList recordNames(OperandKind kind)
     QStringList names;
     if (kind == OperandKind::Devices) {
         const QList<Device> devices = allDevices();
-        for (const Device& device : devices)
+        for (const Device& device : devices) {
             names.append(device.name);
+        }
     } else if (kind == OperandKind::Favourites) {
         const EntryList favourites = vfs.childs(vfs.favouritesEntry());
-        for (const Entry& favourite : favourites)
+        for (const Entry& favourite : favourites) {
             names.append(shownName(favourite));
+        }
     } else if (kind == OperandKind::Bookmarks) {
         const QList<NetworkPlace> places = VFS::ptr()->networkPlacesManager()->networkPlaces();
-        for (const NetworkPlace& place : places)
+        for (const NetworkPlace& place : places) {
             names.append(place.name());
+        }
     }
     return names;
 }
@@ -116,8 +126,9 @@ QStringList operandCandidates(OperandKind kind, const QString& word)
     QStringList candidates;
     const QStringList names = recordNames(kind);
     for (const QString& name : names) {
-        if (name.startsWith(word))
+        if (name.startsWith(word)) {
             candidates.append(name);
+        }
     }
     return candidates;
 }
@@ -133,12 +144,14 @@ QStringList optionCandidates(const QVector<Option>& options, const QString& word
     for (const Option& option : options) {
         const QString text = withDashes(option.names.constLast());
         const QString behind = option.valueName.isEmpty() ? QString() : QStringLiteral("=");
-        if (!word.contains(QLatin1Char('=')) && text.startsWith(word))
+        if (!word.contains(QLatin1Char('=')) && text.startsWith(word)) {
             candidates.append(text + behind);
+        }
         for (const QString& value : option.values) {
             const QString whole = text + QLatin1Char('=') + value;
-            if (word.startsWith(text + QLatin1Char('=')) && whole.startsWith(word))
+            if (word.startsWith(text + QLatin1Char('=')) && whole.startsWith(word)) {
                 candidates.append(whole);
+            }
         }
     }
     return candidates;
@@ -149,8 +162,9 @@ const Option* optionWaiting(const QVector<Option>& options, const QString& befor
 {
     for (const Option& option : options) {
         for (const QString& name : option.names) {
-            if (!option.valueName.isEmpty() && before == withDashes(name))
+            if (!option.valueName.isEmpty() && before == withDashes(name)) {
                 return &option;
+            }
         }
     }
     return nullptr;
@@ -160,43 +174,50 @@ QStringList candidatesFor(QStringList words)
 {
     const QString word = words.isEmpty() ? QString() : words.constLast();
     if (words.size() < 2) {
-        if (!word.startsWith(QLatin1Char('-')))
+        if (!word.startsWith(QLatin1Char('-'))) {
             return verbCandidates(word, verbs());
+        }
         return QStringList({QStringLiteral("--help"), QStringLiteral("--version")}).filter(word);
     }
     const Verb* verb = findVerb(words.constFirst());
     if (verb && !verb->verbs.isEmpty()) {
-        if (words.size() == 2 && !word.startsWith(QLatin1Char('-')))
+        if (words.size() == 2 && !word.startsWith(QLatin1Char('-'))) {
             return verbCandidates(word, verb->verbs);
+        }
         if (words.size() > 2) {
             verb = findVerb(words.at(1), verb->verbs);
             words.removeFirst();
         }
     }
-    if (!verb)
+    if (!verb) {
         return {};
+    }
     const QVector<Option> options = allOptions(*verb);
     const QStringList before = words.mid(1, words.size() - 2);
     const bool optionsEnded = before.contains(QStringLiteral("--"));
     if (!optionsEnded && !before.isEmpty()) {
         const Option* waiting = optionWaiting(options, before.constLast());
-        if (waiting && waiting->isNumber)
+        if (waiting && waiting->isNumber) {
             return {};
+        }
         if (waiting && !waiting->values.isEmpty()) {
             QStringList values;
             for (const QString& value : waiting->values) {
-                if (value.startsWith(word))
+                if (value.startsWith(word)) {
                     values.append(value);
+                }
             }
             return values;
         }
     }
-    if (!optionsEnded && word.startsWith(QLatin1Char('-')))
+    if (!optionsEnded && word.startsWith(QLatin1Char('-'))) {
         return optionCandidates(options, word);
+    }
     if (verb->operandKind == OperandKind::Verbs && !before.isEmpty()) {
         const Verb* named = findVerb(before.constLast());
-        if (named && !named->verbs.isEmpty())
+        if (named && !named->verbs.isEmpty()) {
             return verbCandidates(word, named->verbs);
+        }
     }
     return operandCandidates(verb->operandKind, word);
 }
@@ -205,8 +226,9 @@ int run(Invocation& invocation)
 {
     QStringList candidates = candidatesFor(invocation.operands());
     candidates.removeDuplicates();
-    for (const QString& candidate : qAsConst(candidates))
+    for (const QString& candidate : qAsConst(candidates)) {
         invocation.output().write(candidate.toLocal8Bit() + '\0');
+    }
     return Done;
 }
 

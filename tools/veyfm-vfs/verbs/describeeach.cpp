@@ -25,14 +25,16 @@ int describeEach(Invocation& invocation, const Description& description)
         } else if (invocation.json()) {
             json.append(description.toJson(operand, located.entry));
         } else {
-            if (!first)
+            if (!first) {
                 output.write(QByteArrayLiteral("\n"));
+            }
             description.print(output, operand, located.entry);
             first = false;
         }
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
+    }
     return exitCode;
 }
 

@@ -13,8 +13,9 @@ namespace {
 int run(Invocation& invocation)
 {
     const QStringList names = invocation.operands();
-    if (names.isEmpty())
+    if (names.isEmpty()) {
         invocation.output().write(generalHelp());
+    }
     int exitCode = Done;
     for (int i = 0; i < names.size(); ++i) {
         const QString& name = names.at(i);

@@ -31,8 +31,9 @@ QStringList flagsOf(const Entry& entry)
     const VFS& vfs = *VFS::ptr();
     QStringList flags;
     const auto add = [&flags](bool set, const char* name) {
-        if (set)
+        if (set) {
             flags.append(QLatin1String(name));
+        }
     };
     add(entry.isPlace(), "place");
     add(entry.isDirPlace(), "directory-place");
@@ -54,8 +55,9 @@ QStringList flagsOf(const Entry& entry)
 EntryList chainOf(const Entry& entry)
 {
     EntryList chain = VFS::ptr()->pathEntryList(entry);
-    if (!chain.isEmpty())
+    if (!chain.isEmpty()) {
         chain.removeLast();
+    }
     return chain;
 }
 
@@ -84,8 +86,9 @@ QJsonObject describe(const Entry& entry)
     object.insert(QStringLiteral("linkTarget"), textOrNull(entry.symLinkTarget()));
     QJsonArray chain;
     const EntryList parents = chainOf(entry);
-    for (const Entry& parent : parents)
+    for (const Entry& parent : parents) {
         chain.append(parent.path());
+    }
     object.insert(QStringLiteral("parents"), chain);
     object.insert(QStringLiteral("flags"), QJsonArray::fromStringList(flagsOf(entry)));
     return object;
@@ -94,8 +97,9 @@ QJsonObject describe(const Entry& entry)
 void print(Output& output, const Entry& entry)
 {
     const auto line = [&output](const char* label, const QString& value) {
-        if (!value.isEmpty())
+        if (!value.isEmpty()) {
             output.write(QByteArray(label) + ": " + output.label(value, Entry()) + '\n');
+        }
     };
     const auto yesNo = [](bool yes) {
         return yes ? QStringLiteral("yes") : QStringLiteral("no");
@@ -119,8 +123,9 @@ void print(Output& output, const Entry& entry)
     QStringList parents;
     const EntryList chain = chainOf(entry);
     for (const Entry& parent : chain) {
-        if (parent != VFS::ptr()->rootEntry())
+        if (parent != VFS::ptr()->rootEntry()) {
             parents.append(parent.path());
+        }
     }
     line("parents", parents.join(QLatin1String(" > ")));
     line("flags", flagsOf(entry).join(QLatin1String(", ")));

@@ -57,8 +57,9 @@ void printLines(Invocation& invocation, const QVector<Item>& items)
 {
     Output& output = invocation.output();
     const Label label(invocation);
-    for (const Item& item : items)
+    for (const Item& item : items) {
         output.writeRecord(output.name(label(item.entry), item.entry));
+    }
 }
 
 void printLong(Invocation& invocation, const QVector<Item>& items)
@@ -84,8 +85,9 @@ void printLong(Invocation& invocation, const QVector<Item>& items)
                                       typeName(item.entry.type()).leftJustified(typeWidth),
                                       size.rightJustified(sizeWidth), time.leftJustified(16));
         QByteArray line = facts.toLocal8Bit() + output.name(label(item.entry), item.entry);
-        if (item.entry.isSymLink())
+        if (item.entry.isSymLink()) {
             line += " -> " + output.name(item.entry.symLinkTarget());
+        }
         output.writeRecord(line);
     }
 }
@@ -110,14 +112,15 @@ void printJson(Invocation& invocation, JsonArray& json, const QVector<Item>& ite
 
 void print(Invocation& invocation, JsonArray& json, const QVector<Item>& items)
 {
-    if (invocation.json())
+    if (invocation.json()) {
         printJson(invocation, json, items);
-    else if (invocation.isSet(QStringLiteral("long")))
+    } else if (invocation.isSet(QStringLiteral("long"))) {
         printLong(invocation, items);
-    else if (invocation.output().isTerminal() && !invocation.null())
+    } else if (invocation.output().isTerminal() && !invocation.null()) {
         printColumns(invocation, items);
-    else
+    } else {
         printLines(invocation, items);
+    }
 }
 
 ListingOptions listingOptions(const Invocation& invocation)
@@ -126,15 +129,17 @@ ListingOptions listingOptions(const Invocation& invocation)
     options.hidden = invocation.isSet(QStringLiteral("all"));
     options.facts = invocation.isSet(QStringLiteral("long"));
     options.reverse = invocation.isSet(QStringLiteral("reverse"));
-    if (invocation.isSet(QStringLiteral("no-links")))
+    if (invocation.isSet(QStringLiteral("no-links"))) {
         options.filters = VFS::SkipSymLinks;
+    }
     const QString sort = invocation.value(QStringLiteral("sort"));
-    if (sort == QLatin1String("none") || invocation.isSet(QStringLiteral("unsorted")))
+    if (sort == QLatin1String("none") || invocation.isSet(QStringLiteral("unsorted"))) {
         options.sortBy = SortBy::Nothing;
-    else if (sort == QLatin1String("size"))
+    } else if (sort == QLatin1String("size")) {
         options.sortBy = SortBy::Size;
-    else if (sort == QLatin1String("time"))
+    } else if (sort == QLatin1String("time")) {
         options.sortBy = SortBy::Time;
+    }
     return options;
 }
 
@@ -142,10 +147,12 @@ ListingOptions listingOptions(const Invocation& invocation)
 void printTitle(Invocation& invocation, const Entry& entry, bool first)
 {
     Output& output = invocation.output();
-    if (invocation.json() || invocation.null() || !output.isTerminal())
+    if (invocation.json() || invocation.null() || !output.isTerminal()) {
         return;
-    if (!first)
+    }
+    if (!first) {
         output.write(QByteArrayLiteral("\n"));
+    }
     output.write(output.name(entry.path(), entry) + ":\n");
 }
 
@@ -154,8 +161,9 @@ int run(Invocation& invocation)
     Output& output = invocation.output();
     QStringList operands = invocation.operands();
     const bool several = operands.size() > 1;
-    if (operands.isEmpty())
+    if (operands.isEmpty()) {
         operands.append(QStringLiteral("."));
+    }
     const ListingOptions options = listingOptions(invocation);
     JsonArray json(output);
     VFS* vfs = VFS::ptr();
@@ -176,8 +184,9 @@ int run(Invocation& invocation)
                 exitCode = Failed;
                 break;
             }
-            if (several)
+            if (several) {
                 printTitle(invocation, located.entry, first);
+            }
             print(invocation, json, items);
             first = false;
         }
@@ -188,8 +197,9 @@ int run(Invocation& invocation)
             exitCode = Failed;
         }
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
+    }
     output.flush();
     return exitCode;
 }

@@ -31,8 +31,9 @@ QString childPrefix(const Entry& entry)
 {
     const QString name = QStringLiteral("x");
     const Entry child = VFS::ptr()->child(entry, name);
-    if (!child.isNull())
+    if (!child.isNull()) {
         return child.path().chopped(name.size());
+    }
     return entry.isPlace() ? entry.path() + QLatin1Char('/') : QString();
 }
 
@@ -40,22 +41,28 @@ QString childPrefix(const Entry& entry)
 QString whyUnwatchable(const Entry& entry)
 {
     const QString local = entry.localPath();
-    if (local.isEmpty())
+    if (local.isEmpty()) {
         return entry.isPlace() ? QString() : QStringLiteral("nothing on the disk to watch");
-    if (!VFS::ptr()->entryWatcher()->isRefreshable(local))
+    }
+    if (!VFS::ptr()->entryWatcher()->isRefreshable(local)) {
         return QStringLiteral("what lies below /proc, /dev, /sys and /var is never watched");
+    }
     const int descriptor = ::inotify_init1(IN_CLOEXEC);
     int error = descriptor < 0 ? errno : 0;
     if (error == 0 &&
         ::inotify_add_watch(
-            descriptor, local.toLocal8Bit().constData(), IN_CLOSE_WRITE | IN_DONT_FOLLOW) < 0)
+            descriptor, local.toLocal8Bit().constData(), IN_CLOSE_WRITE | IN_DONT_FOLLOW) < 0) {
         error = errno;
-    if (descriptor >= 0)
+    }
+    if (descriptor >= 0) {
         ::close(descriptor);
-    if (error == ENOSPC)
+    }
+    if (error == ENOSPC) {
         return QStringLiteral("no more watches: see /proc/sys/fs/inotify/max_user_watches");
-    if (error == EMFILE)
+    }
+    if (error == EMFILE) {
         return QStringLiteral("no more watchers: see /proc/sys/fs/inotify/max_user_instances");
+    }
     return error == 0 ? QString() : systemReason(error);
 }
 
@@ -106,13 +113,16 @@ public:
     {
         // Another notation of a plain path has children under that path, and so has it here.
         if (!entry.isPlace() && entry.isPlaceBased() &&
-            childPrefix(entry).startsWith(QLatin1Char('/')))
+            childPrefix(entry).startsWith(QLatin1Char('/'))) {
             entry = VFS::ptr()->entry(entry.localPath());
+        }
         // The news of devices and of the Samba network come to those only who have looked.
-        if (opensOnFirstLook(entry))
+        if (opensOnFirstLook(entry)) {
             VFS::ptr()->childs(entry);
-        if (entry.isNetworkPlace() || entry.isFtpNetworkPlace() || entry.isSFtpNetworkPlace())
+        }
+        if (entry.isNetworkPlace() || entry.isFtpNetworkPlace() || entry.isSFtpNetworkPlace()) {
             m_mounts = true;
+        }
         if (entry.isNetworkPlace()) {
             // They come with their first mount, and their paths do not begin with their parent's.
             m_paths.insert(VFS::ptr()->ftpNetworkEntry().path());
@@ -146,16 +156,18 @@ private:
             vfs, &VFS::fuseMountAdded, vfs, [this](const QString& url, const Entry& entry) {
                 // One that makes no place has its URL alone.
                 const QString path = entry.isNull() ? url : entry.path();
-                if (m_mounts || wasAskedFor(path))
+                if (m_mounts || wasAskedFor(path)) {
                     write(QLatin1String("mounted"), entry, path, entry.localPath());
+                }
             });
     }
 
     /// The tree still has the place as it was, so the record tells.
     void printDevice(const char* event, const StoragePlace& place)
     {
-        if (wasAskedFor(place.name()))
+        if (wasAskedFor(place.name())) {
             write(QLatin1String(event), knownPlace(place.name()), place.name(), place.mountPoint());
+        }
     }
 
     static Entry knownPlace(const QString& path)
@@ -171,8 +183,9 @@ private:
 
     void printEvent(QLatin1String event, const Entry& entry)
     {
-        if (wasAskedFor(entry.path()))
+        if (wasAskedFor(entry.path())) {
             write(event, entry, entry.path(), entry.localPath());
+        }
     }
 
     void
@@ -181,8 +194,9 @@ private:
         Output& output = m_invocation.output();
         if (m_invocation.json()) {
             QJsonObject object = toJson(entry);
-            if (entry.path() != path)
+            if (entry.path() != path) {
                 object.insert(QStringLiteral("name"), path.section(QLatin1Char('/'), -1));
+            }
             object.insert(QStringLiteral("path"), path);
             object.insert(QStringLiteral("localPath"), textOrNull(localPath));
             object.insert(QStringLiteral("event"), event);
@@ -212,8 +226,9 @@ int run(Invocation& invocation)
     for (const QString& operand : operands) {
         const Located located = locate(operand);
         QString why = located.why.isEmpty() ? whyUnwatchable(located.entry) : located.why;
-        if (why.isEmpty() && livesFromService(located.entry))
+        if (why.isEmpty() && livesFromService(located.entry)) {
             why = whyNoNews();
+        }
         if (why.isEmpty()) {
             monitor.add(located.entry);
             ++watched;
@@ -222,8 +237,9 @@ int run(Invocation& invocation)
             exitCode = Failed;
         }
     }
-    if (watched > 0)
+    if (watched > 0) {
         QCoreApplication::exec();
+    }
     return exitCode;
 }
 

@@ -37,15 +37,18 @@ int run(Invocation& invocation)
     const QString url = invocation.operands().constFirst();
     Login login = readLogin(invocation);
     QString why = whyNotMountable(url);
-    if (why.isEmpty())
+    if (why.isEmpty()) {
         why = whyNoUser(schemeOf(url), login.user);
+    }
     const int timeout = jobTimeout(invocation);
-    if (why.isEmpty())
+    if (why.isEmpty()) {
         why = askService(shownUrl(url), timeout, openTree);
+    }
     UrlMount mount;
     if (why.isEmpty()) {
-        if (login.user.isEmpty())
+        if (login.user.isEmpty()) {
             login.user = userOf(url);
+        }
         mount = mountUrl(url, login, timeout);
         why = mount.why;
     }
@@ -60,12 +63,14 @@ int run(Invocation& invocation)
 QString whyWrong(const Invocation& invocation)
 {
     const QString why = whyNoLogin(invocation);
-    if (!why.isEmpty())
+    if (!why.isEmpty()) {
         return why;
+    }
     const QString url = invocation.operands().constFirst();
     const QString user = invocation.value(QStringLiteral("user"));
-    if (user.isEmpty() || !whyNotMountable(url).isEmpty())
+    if (user.isEmpty() || !whyNotMountable(url).isEmpty()) {
         return QString();
+    }
     const QString other = userOf(url);
     return other.isEmpty() || other == user
                ? QString()

@@ -25,8 +25,9 @@ namespace {
 int print(Invocation& invocation, const RegisteredMounts& registered)
 {
     const MountInfo kernel = MountInfo::read();
-    if (!kernel.why().isEmpty())
+    if (!kernel.why().isEmpty()) {
         report(invocation.verb().name, kernel.why());
+    }
     const QVector<NetworkMount> mounts =
         networkMounts(registered, kernel, VFSSettings().mountRootPath());
     Output& output = invocation.output();
@@ -34,19 +35,21 @@ int print(Invocation& invocation, const RegisteredMounts& registered)
     Table table;
     for (const NetworkMount& mount : mounts) {
         const QString url = shownUrl(mount.url);
-        if (invocation.json())
+        if (invocation.json()) {
             json.append(
                 {{QStringLiteral("url"), textOrNull(url)},
                  {QStringLiteral("localPath"), mount.directory},
                  {QStringLiteral("state"), mount.state},
                  {QStringLiteral("path"), textOrNull(mount.placePath)}});
-        else
+        } else {
             table.add({url, mount.directory, mount.state, mount.placePath});
+        }
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
-    else
+    } else {
         table.write(output);
+    }
     return kernel.why().isEmpty() ? Done : Failed;
 }
 
@@ -59,30 +62,35 @@ RegisteredMounts readRegistered()
     registered.isKnown = true;
     const auto check = [&registered](const char* what, const Question& again) {
         const QString why = wasInterrupted() ? QString() : whyNothing(again);
-        if (why.isEmpty())
+        if (why.isEmpty()) {
             return;
+        }
         report(QLatin1String(what), why);
         registered.isKnown = false;
     };
     const QString method = QStringLiteral("mounts");
     registered.directories = vfs->fuseMountsManager()->mounts();
-    if (registered.directories.isEmpty())
+    if (registered.directories.isEmpty()) {
         check(
             "FUSE mounts", {QStringLiteral("FuseMountsManager"), method, QStringLiteral("a{ss}")});
-    if (!wasInterrupted())
+    }
+    if (!wasInterrupted()) {
         registered.places = vfs->networkMountsManager()->mounts();
-    if (registered.places.isEmpty())
+    }
+    if (registered.places.isEmpty()) {
         check(
             "network mounts",
             {QStringLiteral("NetworkMountsManager"), method, QStringLiteral("a{s(ssi)}")});
+    }
     return registered;
 }
 
 int runWithRegistered(Invocation& invocation)
 {
     const RegisteredMounts registered = readRegistered();
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return Failed;
+    }
     const int exitCode = print(invocation, registered);
     return registered.isKnown ? exitCode : Failed;
 }
@@ -90,8 +98,9 @@ int runWithRegistered(Invocation& invocation)
 int run(Invocation& invocation)
 {
     const QString why = whyNoService(serviceState());
-    if (why.isEmpty())
+    if (why.isEmpty()) {
         return runWithService(invocation, runWithRegistered);
+    }
     report(invocation.verb().name, QStringLiteral("only what the kernel lists: ") + why);
     RegisteredMounts nothing;
     nothing.isKnown = true;

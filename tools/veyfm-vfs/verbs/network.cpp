@@ -43,24 +43,27 @@ QString whyNoBookmarks()
 int runList(Invocation& invocation)
 {
     const QList<NetworkPlace> places = VFS::ptr()->networkPlacesManager()->networkPlaces();
-    if (places.isEmpty() && hasFailed(invocation, whyNoBookmarks()))
+    if (places.isEmpty() && hasFailed(invocation, whyNoBookmarks())) {
         return Failed;
+    }
     Output& output = invocation.output();
     if (invocation.json()) {
         JsonArray json(output);
-        for (const NetworkPlace& place : places)
+        for (const NetworkPlace& place : places) {
             json.append(
                 {{QStringLiteral("name"), place.name()},
                  {QStringLiteral("path"),
                   textOrNull(pathBelow(VFS::ptr()->networkEntry(), place.name()))},
                  {QStringLiteral("url"), place.url()},
                  {QStringLiteral("localPath"), textOrNull(place.localPath())}});
+        }
         json.end();
         return Done;
     }
     Table table;
-    for (const NetworkPlace& place : places)
+    for (const NetworkPlace& place : places) {
         table.add({place.name(), place.url(), place.localPath()});
+    }
     table.write(output);
     return Done;
 }
@@ -68,15 +71,18 @@ int runList(Invocation& invocation)
 /// A bookmark is less than a mount: its URL may have a port, say, that a mount would drop.
 QString whyNoUrl(const QString& text)
 {
-    if (whyNotMountable(text).isEmpty())
+    if (whyNotMountable(text).isEmpty()) {
         return QString();
+    }
     const QUrl url(text, QUrl::StrictMode);
     const QStringList schemes = {
         QStringLiteral("smb"), QStringLiteral("ftp"), QStringLiteral("sftp")};
-    if (!url.isValid() || !schemes.contains(url.scheme()) || url.host().isEmpty())
+    if (!url.isValid() || !schemes.contains(url.scheme()) || url.host().isEmpty()) {
         return QStringLiteral("not a URL of a network resource: smb, ftp or sftp, and a host");
-    if (shownUrl(text) != text)
+    }
+    if (shownUrl(text) != text) {
         return QStringLiteral("a bookmark is no place for a password");
+    }
     return text.contains(QChar(QChar::Null)) ? QStringLiteral("not a URL") : QString();
 }
 
@@ -116,8 +122,9 @@ int runAdd(Invocation& invocation)
         accepted = manager->addNetworkPlace(place);
     }
     if (!accepted) {
-        if (!wasInterrupted())
+        if (!wasInterrupted()) {
             report(name, QStringLiteral("the service did not accept the bookmark"));
+        }
         return Failed;
     }
     return waitForNews(invocation, name, isThere);
@@ -137,17 +144,20 @@ int runRemove(Invocation& invocation)
         };
         NetworkPlace place =
             first([&](const NetworkPlace& each) { return each.name() == operand; });
-        if (place.isNull())
+        if (place.isNull()) {
             place = first([&](const NetworkPlace& each) {
                 const QString its = pathBelow(VFS::ptr()->networkEntry(), each.name());
                 return !its.isEmpty() && (its == operand || its == path);
             });
-        if (place.isNull())
+        }
+        if (place.isNull()) {
             place = first([&](const NetworkPlace& each) { return each.url() == operand; });
+        }
         if (place.isNull()) {
             const QString why = places.isEmpty() ? whyNoBookmarks() : QString();
-            if (wasInterrupted())
+            if (wasInterrupted()) {
                 return Failed;
+            }
             report(operand, why.isEmpty() ? QStringLiteral("no such network bookmark") : why);
             exitCode = Failed;
             continue;
@@ -159,10 +169,12 @@ int runRemove(Invocation& invocation)
         const int code = waitForNews(invocation, operand, [manager, &place] {
             return !manager->networkPlaces().contains(place);
         });
-        if (wasInterrupted())
+        if (wasInterrupted()) {
             return Failed;
-        if (code != Done)
+        }
+        if (code != Done) {
             exitCode = code;
+        }
     }
     return exitCode;
 }

@@ -34,8 +34,9 @@ int run(Invocation& invocation)
             exitCode = Failed;
         }
     }
-    if (entries.isEmpty())
+    if (entries.isEmpty()) {
         return Failed;
+    }
     const QObject listener;
     // The service's echo tells that the news are on their way to everybody.
     QObject::connect(

@@ -46,19 +46,23 @@ int run(Invocation& invocation)
         const EntryList chain = vfs.pathEntryList(located.entry, root);
         QJsonArray elements;
         for (const Entry& entry : chain) {
-            if (invocation.json())
+            if (invocation.json()) {
                 elements.append(toJson(entry));
+            }
             // The top of the tree has a name that is not meant to be seen.
-            else if (entry != vfs.rootEntry() || chain.size() == 1)
+            else if (entry != vfs.rootEntry() || chain.size() == 1) {
                 output.writeRecord(output.name(entry.path(), entry));
+            }
         }
-        if (invocation.json())
+        if (invocation.json()) {
             json.append(
                 {{QStringLiteral("path"), located.entry.path()},
                  {QStringLiteral("chain"), elements}});
+        }
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
+    }
     return exitCode;
 }
 

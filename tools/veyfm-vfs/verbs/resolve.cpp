@@ -19,8 +19,9 @@ void print(Output& output, const QString& text, const Entry& entry)
         output.write(QByteArray(label) + ": " + value + '\n');
     };
     const auto textLine = [&](const char* label, const QString& value) {
-        if (!value.isEmpty())
+        if (!value.isEmpty()) {
             line(label, output.label(value, Entry()));
+        }
     };
     textLine("text", text);
     line("path", output.label(entry.path(), entry));

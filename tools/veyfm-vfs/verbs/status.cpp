@@ -41,10 +41,12 @@ QList<Holding> holdings()
     const Waiting waiting(QStringLiteral("Asking what the service holds"));
     QList<Holding> all;
     const auto add = [&all](Holding holding) {
-        if (wasInterrupted())
+        if (wasInterrupted()) {
             return;
-        if (holding.count == 0)
+        }
+        if (holding.count == 0) {
             holding.why = whyNothing(holding.again);
+        }
         all.append(holding);
     };
     add(
@@ -93,8 +95,9 @@ int print(Invocation& invocation, const ServiceState& state, const QList<Holding
             {QStringLiteral("service"), serviceName()},
             {QStringLiteral("installed"), state.installed},
             {QStringLiteral("running"), state.running}};
-        if (!all.isEmpty())
+        if (!all.isEmpty()) {
             object.insert(QStringLiteral("holds"), counts);
+        }
         json.append(object);
         json.end();
         return exitCode;
@@ -113,8 +116,9 @@ int print(Invocation& invocation, const ServiceState& state, const QList<Holding
 int printWithHoldings(Invocation& invocation)
 {
     const QList<Holding> all = holdings();
-    if (wasInterrupted())
+    if (wasInterrupted()) {
         return Failed;
+    }
     return print(invocation, {true, true, true}, all);
 }
 
@@ -123,11 +127,13 @@ int run(Invocation& invocation)
     const ServiceState state = serviceState();
     const QString why = whyNoService(state);
     // Looking is no reason to start it.
-    if (why.isEmpty() && state.running)
+    if (why.isEmpty() && state.running) {
         return runWithService(invocation, printWithHoldings);
+    }
     print(invocation, state, {});
-    if (why.isEmpty())
+    if (why.isEmpty()) {
         return Done;
+    }
     invocation.output().flush();
     report(invocation.verb().name, why);
     return Failed;

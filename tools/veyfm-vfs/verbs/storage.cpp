@@ -54,13 +54,15 @@ QJsonObject toJson(const Device& device)
 int runList(Invocation& invocation)
 {
     const QList<Device> devices = readDevices();
-    if (wasInterrupted() || (devices.isEmpty() && hasFailed(invocation, whyNoDevices())))
+    if (wasInterrupted() || (devices.isEmpty() && hasFailed(invocation, whyNoDevices()))) {
         return Failed;
+    }
     Output& output = invocation.output();
     if (invocation.json()) {
         JsonArray json(output);
-        for (const Device& device : devices)
+        for (const Device& device : devices) {
             json.append(toJson(device));
+        }
         json.end();
         return Done;
     }
@@ -114,9 +116,10 @@ bool isEmpty(const StorageDeviceInfo& info)
 void print(Output& output, const Device& device, const StorageDeviceInfo& info)
 {
     const auto line = [&output](const QString& label, const QString& value) {
-        if (!value.isEmpty())
+        if (!value.isEmpty()) {
             output.write(
                 label.toLocal8Bit() + ": " + output.label(value, Entry()) + QByteArray("\n"));
+        }
     };
     const auto yesNo = [](bool yes) {
         return yes ? QStringLiteral("yes") : QStringLiteral("no");
@@ -135,15 +138,18 @@ void print(Output& output, const Device& device, const StorageDeviceInfo& info)
     const QString texts[] = {info.text1, info.text2, info.text3, info.text4, info.text5,
                              info.text6, info.text7, info.text8, info.text9, info.text10};
     int position = 0;
-    for (const QString& text : texts)
+    for (const QString& text : texts) {
         line(QStringLiteral("text %1").arg(++position), text);
+    }
     position = 0;
-    for (const bool flag : {info.flag1, info.flag2})
+    for (const bool flag : {info.flag1, info.flag2}) {
         line(QStringLiteral("flag %1").arg(++position), yesNo(flag));
+    }
     position = 0;
     for (const quint64 value :
-         {info.number1, info.number2, info.number3, info.number4, info.number5})
+         {info.number1, info.number2, info.number3, info.number4, info.number5}) {
         line(QStringLiteral("number %1").arg(++position), QString::number(value));
+    }
 }
 
 /// The devices that the operands name; reports those that do not exist.
@@ -152,10 +158,12 @@ QList<Device> devicesOf(const Invocation& invocation, int& exitCode)
     const QList<Device> all = readDevices();
     QList<Device> named;
     QString why;
-    if (all.isEmpty() && !wasInterrupted())
+    if (all.isEmpty() && !wasInterrupted()) {
         why = whyNoDevices();
-    if (wasInterrupted())
+    }
+    if (wasInterrupted()) {
         return named;
+    }
     const QStringList operands = invocation.operands();
     for (const QString& operand : operands) {
         const Device device = findDevice(all, operand);
@@ -182,15 +190,17 @@ int runInfo(Invocation& invocation)
         {
             const Waiting waiting(QStringLiteral("Asking for the details of the device"));
             info = VFS::ptr()->storageDeviceInfo(device.place);
-            if (isEmpty(info) && !wasInterrupted())
+            if (isEmpty(info) && !wasInterrupted()) {
                 why = whyNothing(
                     {QStringLiteral("StoragePlacesManager"),
                      QStringLiteral("storageDeviceInfo"),
                      QStringLiteral("(ssssbssssssttbttt)"),
                      {QVariant::fromValue(device.place)}});
+            }
         }
-        if (wasInterrupted())
+        if (wasInterrupted()) {
             return Failed;
+        }
         if (!why.isEmpty()) {
             report(device.name, why);
             exitCode = Failed;
@@ -201,13 +211,15 @@ int runInfo(Invocation& invocation)
             json.append(object);
             continue;
         }
-        if (!first)
+        if (!first) {
             output.write(QByteArrayLiteral("\n"));
+        }
         first = false;
         print(output, device, info);
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
+    }
     return exitCode;
 }
 
@@ -222,21 +234,24 @@ int runJobs(Invocation& invocation, MakeJob makeJob, const QString& doing)
         bool finished = false;
         QString why;
         const Entry entry = entryOf(device);
-        if (wasInterrupted())
+        if (wasInterrupted()) {
             return Failed;
+        }
         {
             const Waiting waiting(doing);
             Job* job = (VFS::ptr()->*makeJob)(entry);
             QObject::connect(job, &Job::finished, job, [&finished, &why](Job* ended) {
                 finished = true;
-                if (ended->error() != 0)
+                if (ended->error() != 0) {
                     why = ended->errorString().isEmpty() ? QStringLiteral("failed")
                                                          : ended->errorString();
+                }
             });
             job->exec();
         }
-        if (!finished || wasInterrupted())
+        if (!finished || wasInterrupted()) {
             return Failed;
+        }
         if (!why.isEmpty()) {
             report(device.name, why);
             exitCode = Failed;

@@ -51,11 +51,13 @@ public:
             node.opened = false;
             return node;
         }
-        if (levels == 0 || m_interrupt.wasRequested())
+        if (levels == 0 || m_interrupt.wasRequested()) {
             return node;
+        }
         const EntryList children = childrenOf(entry, isOperand);
-        for (const Entry& child : children)
+        for (const Entry& child : children) {
             node.children.push_back(gather(child, levels - 1, false));
+        }
         return node;
     }
 
@@ -68,8 +70,9 @@ private:
     EntryList childrenOf(const Entry& entry, bool isOperand)
     {
         const bool follow = isOperand || !entry.isSymLink();
-        if (!hasDirectory(entry) || !follow || !(m_contents || isOperand))
+        if (!hasDirectory(entry) || !follow || !(m_contents || isOperand)) {
             return entry.isPlace() ? VFS::ptr()->placeBase()->childEntries(entry) : EntryList();
+        }
         const QString why = whyUnreadable(entry);
         // The directories of places, such as Trash, are made when they are needed.
         if (!why.isEmpty() && !(entry.isPlace() && why == systemReason(ENOENT))) {
@@ -78,8 +81,9 @@ private:
         }
         EntryList children;
         const QVector<Item> items = listing(entry, m_options);
-        for (const Item& item : items)
+        for (const Item& item : items) {
             children.append(item.entry);
+        }
         return children;
     }
 
@@ -130,13 +134,15 @@ public:
     {
         int column = 0;
         for (const Line& line : m_lines) {
-            if (!line.localPath.isEmpty())
+            if (!line.localPath.isEmpty()) {
                 column = std::max(column, line.width);
+            }
         }
         for (const Line& line : m_lines) {
             QByteArray bytes = line.bytes;
-            if (!line.localPath.isEmpty())
+            if (!line.localPath.isEmpty()) {
                 bytes += QByteArray(column - line.width + 2, ' ') + line.localPath;
+            }
             m_output.write(bytes + '\n');
         }
     }
@@ -164,8 +170,9 @@ private:
         Line line;
         line.bytes = lead.toLocal8Bit() + m_output.label(name, node.entry) + tail.toLocal8Bit();
         line.width = displayWidth(lead + escaped(name) + tail);
-        if (node.entry.isPlace())
+        if (node.entry.isPlace()) {
             line.localPath = m_output.label(node.entry.localPath(), Entry());
+        }
         m_lines.push_back(line);
     }
 
@@ -182,8 +189,9 @@ QJsonObject nodeToJson(const Node& node)
     QJsonObject object = toJson(node.entry);
     object.insert(QStringLiteral("opened"), node.opened);
     QJsonArray children;
-    for (const Node& child : node.children)
+    for (const Node& child : node.children) {
         children.append(nodeToJson(child));
+    }
     object.insert(QStringLiteral("children"), children);
     return object;
 }
@@ -193,12 +201,14 @@ int run(Invocation& invocation)
     Output& output = invocation.output();
     VFS* vfs = VFS::ptr();
     QStringList operands = invocation.operands();
-    if (operands.isEmpty())
+    if (operands.isEmpty()) {
         operands.append(vfs->rootEntry().path());
+    }
 
     int levels = -1;
-    if (invocation.isSet(QStringLiteral("depth")))
+    if (invocation.isSet(QStringLiteral("depth"))) {
         levels = int(invocation.value(QStringLiteral("depth")).toUInt());
+    }
 
     Interrupt interrupt({SIGINT}, Failed, [vfs] { vfs->stopGettingChilds(); });
     Gatherer gatherer(invocation, interrupt);
@@ -225,20 +235,23 @@ int run(Invocation& invocation)
             output.flush();
             continue;
         }
-        if (!first)
+        if (!first) {
             output.write(QByteArrayLiteral("\n"));
+        }
         first = false;
         Picture picture(output);
         // The top of the tree has a name that is not meant to be seen.
-        if (node.entry == vfs->rootEntry())
+        if (node.entry == vfs->rootEntry()) {
             picture.addNames(node.children);
-        else
+        } else {
             picture.addTop(node);
+        }
         picture.write();
         output.flush();
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
+    }
     output.flush();
     return gatherer.hasFailed() ? int(Failed) : exitCode;
 }

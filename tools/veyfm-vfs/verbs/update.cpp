@@ -46,13 +46,16 @@ public:
 
     Outcome run(const Entry& entry)
     {
-        if (entry.isFavouriteNetworkPlace())
+        if (entry.isFavouriteNetworkPlace()) {
             return mount(entry);
-        if (entry.isSambaSharePlace())
+        }
+        if (entry.isSambaSharePlace()) {
             return attach(entry);
+        }
         if (entry.isSambaNetworkPlace() || entry.isSambaWorkgroupPlace() ||
-            entry.isSambaServerPlace())
+            entry.isSambaServerPlace()) {
             return scan(entry);
+        }
         return {QStringLiteral("neither a network bookmark nor a place of the Samba network")};
     }
 
@@ -62,22 +65,28 @@ private:
         NetworkPlace place;
         const QString stopped =
             askService(m_operand, m_timeout, [&] { place = VFS::ptr()->networkPlace(entry); });
-        if (!stopped.isEmpty())
+        if (!stopped.isEmpty()) {
             return {stopped, true};
+        }
         const QString url = place.url();
         QString why = whyNotMountable(url);
-        if (why.isEmpty())
+        if (why.isEmpty()) {
             why = whyNoLoginFor(url);
-        if (!why.isEmpty())
+        }
+        if (!why.isEmpty()) {
             return {QStringLiteral("%1: %2").arg(shownUrl(url), why)};
+        }
         Login login = m_login;
-        if (login.user.isEmpty())
+        if (login.user.isEmpty()) {
             login.user = userOf(url);
+        }
         const UrlMount mounted = mountUrl(url, login, m_timeout);
-        if (!mounted.why.isEmpty())
+        if (!mounted.why.isEmpty()) {
             return {mounted.why, mounted.wasInterrupted};
-        if (mounted.localPath == place.localPath())
+        }
+        if (mounted.localPath == place.localPath()) {
             return {};
+        }
         RecordJob job(entry, mounted.localPath);
         return runJob(job, QStringLiteral("change"));
     }
@@ -85,8 +94,9 @@ private:
     QString whyNoLoginFor(const QString& url) const
     {
         const QString other = userOf(url);
-        if (m_login.user.isEmpty() || other == m_login.user)
+        if (m_login.user.isEmpty() || other == m_login.user) {
             return QString();
+        }
         return other.isEmpty() ? whyNoUser(schemeOf(url), m_login.user)
                                : QStringLiteral("the user is '%1' in the URL and '%2' in --user")
                                      .arg(other, m_login.user);
@@ -98,21 +108,25 @@ private:
         const QString scheme = QStringLiteral("smb");
         QString why =
             whyNoShare(entry.lastPathSection(), vfs->smbHost(entry), vfs->smbWorkgroup(entry));
-        if (why.isEmpty())
+        if (why.isEmpty()) {
             why = whyNoUser(scheme, m_login.user);
-        if (why.isEmpty())
+        }
+        if (why.isEmpty()) {
             why = whyNoTool(scheme);
-        if (!why.isEmpty())
+        }
+        if (!why.isEmpty()) {
             return {why};
+        }
         const auto authenticator = QSharedPointer<TerminalAuthenticator>::create(m_login);
         JobWatch watch(authenticator, m_timeout);
         watch.setCutOff(m_operand);
         ShareJob job(authenticator, entry);
         const JobResult result = watch.run(job, doing());
-        if (result.end == JobResult::TimedOut)
+        if (result.end == JobResult::TimedOut) {
             return {
                 watch.whyStopped() +
                 QStringLiteral(": smbclient or the file manager service does not answer")};
+        }
         return {
             result.isOk() ? QString() : whyFailed(result, scheme, *authenticator, watch),
             watch.wasInterrupted()};
@@ -130,8 +144,9 @@ private:
         JobWatch watch(QSharedPointer<TerminalAuthenticator>::create(m_login), m_timeout);
         watch.setCutOff(m_operand);
         const JobResult result = watch.run(job, doing());
-        if (result.end == JobResult::TimedOut)
+        if (result.end == JobResult::TimedOut) {
             return {whyNoNews(news, m_timeout)};
+        }
         return {result.isOk() ? QString() : watch.whyStopped(), watch.wasInterrupted()};
     }
 
@@ -150,12 +165,14 @@ Located openedEntry(const QString& path)
 {
     for (int end = path.indexOf(slash); end > 0; end = path.indexOf(slash, end + 1)) {
         const Entry above = VFS::ptr()->entry(path.left(end));
-        if (opensOnFirstLook(above))
+        if (opensOnFirstLook(above)) {
             VFS::ptr()->childs(above);
+        }
     }
     const Located located = locate(path);
-    if (opensOnFirstLook(located.entry))
+    if (opensOnFirstLook(located.entry)) {
         VFS::ptr()->childs(located.entry);
+    }
     return located;
 }
 
@@ -167,8 +184,9 @@ int run(Invocation& invocation)
         openTree();
         why = whyNoRunningService();
     });
-    if (!stopped.isEmpty())
+    if (!stopped.isEmpty()) {
         why = stopped;
+    }
     if (!why.isEmpty()) {
         report(invocation.verb().name, why);
         return Failed;
@@ -184,25 +202,30 @@ int run(Invocation& invocation)
         Outcome outcome;
         outcome.why = askService(shown, timeout, [&] { located = openedEntry(operand); });
         outcome.wasInterrupted = !outcome.why.isEmpty();
-        if (outcome.why.isEmpty())
+        if (outcome.why.isEmpty()) {
             outcome.why = located.why;
-        if (outcome.why.isEmpty())
+        }
+        if (outcome.why.isEmpty()) {
             outcome = Update(shown, login, timeout).run(located.entry);
+        }
         if (!outcome.why.isEmpty()) {
             report(shown, outcome.why);
             exitCode = Failed;
-            if (outcome.wasInterrupted)
+            if (outcome.wasInterrupted) {
                 break;
+            }
             continue;
         }
         const Entry entry = VFS::ptr()->placeBase()->placeEntry(located.entry.path());
-        if (invocation.json())
+        if (invocation.json()) {
             json.append(toJson(entry));
-        else if (!entry.localPath().isEmpty())
+        } else if (!entry.localPath().isEmpty()) {
             output.writeRecord(output.name(entry.localPath()));
+        }
     }
-    if (invocation.json())
+    if (invocation.json()) {
         json.end();
+    }
     return exitCode;
 }
 

@@ -19,8 +19,9 @@ const QVector<Verb>& verbs()
 const Verb* findVerb(const QString& word, const QVector<Verb>& verbs)
 {
     for (const Verb& verb : verbs) {
-        if (verb.word() == word)
+        if (verb.word() == word) {
             return &verb;
+        }
     }
     return nullptr;
 }
