@@ -12,6 +12,9 @@
 
 using namespace VeyFM;
 
+// What it holds may change without a break of the binary interface.
+static_assert(sizeof(EntryWatcher) == sizeof(QObject) + sizeof(void*));
+
 namespace {
 
 QString text(const char* utf8)

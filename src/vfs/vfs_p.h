@@ -29,6 +29,14 @@ struct __dirstream;
 
 namespace VeyFM {
 
+/// The one watcher that VFS tells of resets, through a slot that is closed to hosts.
+class NotifiedEntryWatcher : public EntryWatcher
+{
+public:
+    using EntryWatcher::entryChangedNotify;
+    using EntryWatcher::EntryWatcher;
+};
+
 /**
  * The inside of VFS. Its sources are cut by concern: vfs_startup, vfs_service, vfs_paths,
  * vfs_listing, vfs_navigation, vfs_urls, vfs_watching, vfs_records, vfs_placeupdates, vfs_samba.
@@ -111,7 +119,7 @@ public:
     void destroyPlace(const Entry& place);
 
     VFS* const q;
-    EntryWatcher entryWatcher;
+    NotifiedEntryWatcher entryWatcher;
     VFSPlaceBase placeBase;
     mutable QAtomicInt stopFlag;
     QWeakPointer<QDBusInterface> fileSystemInterface;

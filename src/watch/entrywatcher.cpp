@@ -7,22 +7,45 @@
 #include "watch/inotifywatcher.h"
 
 #include <QFileInfo>
+#include <QMap>
+#include <QSet>
 
 #include <algorithm>
 
 namespace VeyFM {
 
+class EntryWatcherPrivate
+{
+public:
+    using Signal = void (EntryWatcher::*)(Entry);
+
+    explicit EntryWatcherPrivate(EntryWatcher* watcher)
+        : q(watcher)
+        , inotifyWatcher(new InotifyWatcher(watcher))
+    {
+    }
+
+    void notifyPath(Signal signal, const QString& path, const QString& fileName);
+
+    EntryWatcher* const q;
+    InotifyWatcher* const inotifyWatcher; // a child of the watcher
+    // By local path, the entries that stand for it. Only a path that a place-based entry needs
+    // has a key; an ordinary entry is known to the kernel alone.
+    QMap<QString, QSet<Entry>> watchedEntries;
+    bool disabled = false;
+};
+
 EntryWatcher::EntryWatcher(QObject* parent)
     : QObject(parent)
-    , m_inotifyWatcher(new InotifyWatcher(this))
+    , d(std::make_unique<EntryWatcherPrivate>(this))
 {
     connect(
-        m_inotifyWatcher, &InotifyWatcher::pathUnregistered, this, &EntryWatcher::unregisterPath);
-    connect(m_inotifyWatcher, &InotifyWatcher::pathCreated, this, &EntryWatcher::slotPathCreated);
-    connect(m_inotifyWatcher, &InotifyWatcher::pathDeleted, this, &EntryWatcher::slotPathDeleted);
-    connect(m_inotifyWatcher, &InotifyWatcher::pathChanged, this, &EntryWatcher::slotPathChanged);
+        d->inotifyWatcher, &InotifyWatcher::pathUnregistered, this, &EntryWatcher::unregisterPath);
+    connect(d->inotifyWatcher, &InotifyWatcher::pathCreated, this, &EntryWatcher::slotPathCreated);
+    connect(d->inotifyWatcher, &InotifyWatcher::pathDeleted, this, &EntryWatcher::slotPathDeleted);
+    connect(d->inotifyWatcher, &InotifyWatcher::pathChanged, this, &EntryWatcher::slotPathChanged);
     connect(
-        m_inotifyWatcher, &InotifyWatcher::pathAttributesChanged, this,
+        d->inotifyWatcher, &InotifyWatcher::pathAttributesChanged, this,
         &EntryWatcher::slotPathAttributesChanged);
 }
 
@@ -35,19 +58,19 @@ void EntryWatcher::addEntry(const Entry& entry)
         return;
     }
     // Of a path that it did not watch before, the watcher has just found out whether it is a link.
-    const bool isLink = m_inotifyWatcher->addPath(local)
-                            ? m_inotifyWatcher->isSymlinkRegistered(local)
+    const bool isLink = d->inotifyWatcher->addPath(local)
+                            ? d->inotifyWatcher->isSymlinkRegistered(local)
                             : QFileInfo(local).isSymLink();
     if (isLink) {
         // That a link is deleted or replaced shows in the directory that holds it.
-        m_inotifyWatcher->addPath(QFileInfo(local).absolutePath());
+        d->inotifyWatcher->addPath(QFileInfo(local).absolutePath());
     }
     if (entry.isPlaceBased()) {
-        m_watchedEntries[local].insert(entry);
+        d->watchedEntries[local].insert(entry);
     }
     // A path with a key goes by both its names: as the place and as the plain directory.
-    const auto found = m_watchedEntries.find(local);
-    if (found != m_watchedEntries.end()) {
+    const auto found = d->watchedEntries.find(local);
+    if (found != d->watchedEntries.end()) {
         found->insert(VFS::ptr()->entry(local));
     }
 }
@@ -55,31 +78,31 @@ void EntryWatcher::addEntry(const Entry& entry)
 void EntryWatcher::removeEntry(const Entry& entry)
 {
     const QString local = entry.localPath();
-    const auto entries = m_watchedEntries.find(local);
-    if (entries == m_watchedEntries.end()) {
-        m_inotifyWatcher->removePath(local);
+    const auto entries = d->watchedEntries.find(local);
+    if (entries == d->watchedEntries.end()) {
+        d->inotifyWatcher->removePath(local);
         return;
     }
     entries->remove(entry);
     if (entries->size() == 1 && !entries->cbegin()->isPlaceBased()) {
         // What is left is the plain twin. The kernel's watch outlives the key, and what it
         // reports takes the road of plain directories from now on. That is meant.
-        m_watchedEntries.erase(entries);
+        d->watchedEntries.erase(entries);
     } else if (entries->isEmpty()) {
-        m_watchedEntries.erase(entries);
-        m_inotifyWatcher->removePath(local);
+        d->watchedEntries.erase(entries);
+        d->inotifyWatcher->removePath(local);
     }
 }
 
 void EntryWatcher::clear()
 {
-    m_inotifyWatcher->clear();
-    m_watchedEntries.clear();
+    d->inotifyWatcher->clear();
+    d->watchedEntries.clear();
 }
 
 void EntryWatcher::setDisabled(bool disabled)
 {
-    m_disabled = disabled;
+    d->disabled = disabled;
 }
 
 bool EntryWatcher::isRefreshable(const QString& path) const
@@ -109,7 +132,7 @@ void EntryWatcher::notifyEntryChanged(const Entry& entry)
 
 void EntryWatcher::entryChangedNotify(Entry entry, bool anyWay)
 {
-    if (m_disabled) {
+    if (d->disabled) {
         return;
     }
     if (anyWay) {
@@ -118,7 +141,7 @@ void EntryWatcher::entryChangedNotify(Entry entry, bool anyWay)
     }
     const QString local = entry.localPath();
     // The look-up leaves an empty set behind where there was none.
-    if (!m_inotifyWatcher->isPathRegistered(local) && !m_watchedEntries[local].contains(entry)) {
+    if (!d->inotifyWatcher->isPathRegistered(local) && !d->watchedEntries[local].contains(entry)) {
         return;
     }
     if (isRefreshable(local)) {
@@ -128,41 +151,41 @@ void EntryWatcher::entryChangedNotify(Entry entry, bool anyWay)
 
 void EntryWatcher::unregisterPath(QString path)
 {
-    m_watchedEntries.remove(path);
+    d->watchedEntries.remove(path);
 }
 
 void EntryWatcher::slotPathCreated(QString path, QString fileName)
 {
-    notifyPath(&EntryWatcher::entryCreated, path, fileName);
+    d->notifyPath(&EntryWatcher::entryCreated, path, fileName);
 }
 
 void EntryWatcher::slotPathDeleted(QString path, QString fileName)
 {
-    notifyPath(&EntryWatcher::entryDeleted, path, fileName);
+    d->notifyPath(&EntryWatcher::entryDeleted, path, fileName);
 }
 
 void EntryWatcher::slotPathChanged(QString path, QString fileName)
 {
-    notifyPath(&EntryWatcher::entryChanged, path, fileName);
+    d->notifyPath(&EntryWatcher::entryChanged, path, fileName);
 }
 
 void EntryWatcher::slotPathAttributesChanged(QString path, QString fileName)
 {
-    notifyPath(&EntryWatcher::entryAttributesChanged, path, fileName);
+    d->notifyPath(&EntryWatcher::entryAttributesChanged, path, fileName);
 }
 
-void EntryWatcher::notifyPath(Signal signal, const QString& path, const QString& fileName)
+void EntryWatcherPrivate::notifyPath(Signal signal, const QString& path, const QString& fileName)
 {
-    if (m_disabled) {
+    if (disabled) {
         return;
     }
-    const auto found = m_watchedEntries.constFind(path);
-    if (found == m_watchedEntries.constEnd()) {
+    const auto found = watchedEntries.constFind(path);
+    if (found == watchedEntries.constEnd()) {
         const Entry current = VFS::ptr()->entry(path + QLatin1Char('/') + fileName);
         // Here the entry is asked and below the disk, and the two differ: a link to a file, or a
         // dangling one, is reset only where the path has a key.
         const bool isReset = signal == &EntryWatcher::entryChanged && current.isDirLink();
-        Q_EMIT(this->*(isReset ? &EntryWatcher::entryReset : signal))(current);
+        Q_EMIT(q->*(isReset ? &EntryWatcher::entryReset : signal))(current);
         return;
     }
     // A copy, since slots may add and remove entries.
@@ -173,12 +196,12 @@ void EntryWatcher::notifyPath(Signal signal, const QString& path, const QString&
             current = VFS::ptr()->child(entry, fileName);
         } else if (signal == &EntryWatcher::entryDeleted && current.isDirPlace()) {
             // A place does not die with its directory.
-            Q_EMIT entryChanged(current);
+            Q_EMIT q->entryChanged(current);
             continue;
         }
         const bool isReset =
             signal == &EntryWatcher::entryChanged && QFileInfo(current.localPath()).isSymLink();
-        Q_EMIT(this->*(isReset ? &EntryWatcher::entryReset : signal))(current);
+        Q_EMIT(q->*(isReset ? &EntryWatcher::entryReset : signal))(current);
     }
 }
 

@@ -7,14 +7,13 @@
 #include "core/entry.h"
 #include "veyfmvfs_export.h"
 
-#include <QMap>
 #include <QObject>
-#include <QSet>
-#include <QStringList>
+
+#include <memory>
 
 namespace VeyFM {
 
-class InotifyWatcher;
+class EntryWatcherPrivate;
 
 /**
  * Tells what happens to entries: the one of VFS::entryWatcher() carries the news of the kernel
@@ -89,16 +88,7 @@ protected Q_SLOTS:
     /// @}
 
 private:
-    friend class VFS;
-
-    using Signal = void (EntryWatcher::*)(Entry);
-    void notifyPath(Signal signal, const QString& path, const QString& fileName);
-
-    InotifyWatcher* const m_inotifyWatcher;
-    // By local path, the entries that stand for it. Only a path that a place-based entry needs
-    // has a key; an ordinary entry is known to the kernel alone.
-    QMap<QString, QSet<Entry>> m_watchedEntries;
-    bool m_disabled = false;
+    const std::unique_ptr<EntryWatcherPrivate> d;
 };
 
 } // namespace VeyFM
