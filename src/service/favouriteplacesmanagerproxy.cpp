@@ -4,16 +4,31 @@
 #include "service/favouriteplacesmanagerproxy.h"
 
 #include "service/servicecall.h"
+#include "service/servicelist.h"
 #include "service/servicesignals.h"
 
 namespace VeyFM {
 
+class FavouritePlacesManagerProxyPrivate
+{
+public:
+    FavouritePlacesManagerProxyPrivate(
+        QWeakPointer<QDBusInterface> serviceInterface, QObject* proxy)
+        : interface(std::move(serviceInterface))
+        , favouritePlaces(proxy, "slotRead")
+    {
+    }
+
+    const QWeakPointer<QDBusInterface> interface;
+    ServiceList<FavouritePlace> favouritePlaces;
+};
+
 FavouritePlacesManagerProxy::FavouritePlacesManagerProxy(
     QWeakPointer<QDBusInterface> interface, QObject* parent)
     : QObject(parent)
-    , m_interface(std::move(interface))
+    , d(std::make_unique<FavouritePlacesManagerProxyPrivate>(std::move(interface), this))
 {
-    if (const auto alive = m_interface.toStrongRef()) {
+    if (const auto alive = d->interface.toStrongRef()) {
         followService(
             *alive, SIGNAL(favouritePlaceAdded(VeyFM::FavouritePlace)), this,
             SLOT(slotFavouritePlaceAdded(VeyFM::FavouritePlace)));
@@ -27,39 +42,37 @@ FavouritePlacesManagerProxy::~FavouritePlacesManagerProxy() = default;
 
 QList<FavouritePlace> FavouritePlacesManagerProxy::favouritePlaces()
 {
-    if (!m_favouritePlacesLoaded) {
-        m_favouritePlaces =
-            readFromService<QList<FavouritePlace>>(m_interface, QStringLiteral("favouritePlaces"));
-        // After a failed read too: what is not there now will be told by signals.
-        m_favouritePlacesLoaded = true;
-    }
-    return m_favouritePlaces;
+    return d->favouritePlaces.get([this] {
+        return readFromService<QList<FavouritePlace>>(
+            d->interface, QStringLiteral("favouritePlaces"));
+    });
+}
+
+void FavouritePlacesManagerProxy::slotRead()
+{
+    favouritePlaces();
 }
 
 void FavouritePlacesManagerProxy::addFavouritePlace(const FavouritePlace& place)
 {
-    tellService(m_interface, QStringLiteral("addFavouritePlace"), place);
+    tellService(d->interface, QStringLiteral("addFavouritePlace"), place);
 }
 
 void FavouritePlacesManagerProxy::removeFavouritePlace(const FavouritePlace& place)
 {
-    tellService(m_interface, QStringLiteral("removeFavouritePlace"), place);
+    tellService(d->interface, QStringLiteral("removeFavouritePlace"), place);
 }
 
 void FavouritePlacesManagerProxy::slotFavouritePlaceAdded(const FavouritePlace& place)
 {
-    if (m_favouritePlacesLoaded) {
-        m_favouritePlaces.append(place);
-    }
+    d->favouritePlaces.patch([&place](auto& places) { places.append(place); });
     Q_EMIT favouritePlaceAdded(place);
 }
 
 void FavouritePlacesManagerProxy::slotFavouritePlaceRemoved(const FavouritePlace& place)
 {
-    if (m_favouritePlacesLoaded) {
-        // By directory: every bookmark of it goes, whatever its name.
-        m_favouritePlaces.removeAll(place);
-    }
+    // By directory: every bookmark of it goes, whatever its name.
+    d->favouritePlaces.patch([&place](auto& places) { places.removeAll(place); });
     Q_EMIT favouritePlaceRemoved(place);
 }
 

@@ -11,9 +11,13 @@
 #include <QObject>
 #include <QWeakPointer>
 
+#include <memory>
+
 class QDBusInterface;
 
 namespace VeyFM {
+
+class FavouritePlacesManagerProxyPrivate;
 
 /**
  * The favourite bookmarks as the service holds them.
@@ -22,7 +26,10 @@ namespace VeyFM {
  * nothing else does. A first read that failed stays as an empty list. A change that is asked for
  * here shows in the list only when its signal has come back.
  *
- * To be used in the thread that owns the object. Calls block for one exchange with the service.
+ * Any thread may call favouritePlaces(). From a thread other than that of the object it takes what
+ * is there: a list that was not read yet is empty, and is read by the event loop of the object
+ * later. Everything else is for the thread of the object. Calls that ask the service block for
+ * one exchange with it.
  */
 class VEYFMVFS_EXPORT FavouritePlacesManagerProxy : public QObject
 {
@@ -49,13 +56,12 @@ Q_SIGNALS:
     /// @}
 
 private Q_SLOTS:
+    void slotRead();
     void slotFavouritePlaceAdded(const VeyFM::FavouritePlace& place);
     void slotFavouritePlaceRemoved(const VeyFM::FavouritePlace& place);
 
 private:
-    const QWeakPointer<QDBusInterface> m_interface;
-    QList<FavouritePlace> m_favouritePlaces;
-    bool m_favouritePlacesLoaded = false;
+    const std::unique_ptr<FavouritePlacesManagerProxyPrivate> d;
 };
 
 } // namespace VeyFM

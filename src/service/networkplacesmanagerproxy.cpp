@@ -4,16 +4,30 @@
 #include "service/networkplacesmanagerproxy.h"
 
 #include "service/servicecall.h"
+#include "service/servicelist.h"
 #include "service/servicesignals.h"
 
 namespace VeyFM {
 
+class NetworkPlacesManagerProxyPrivate
+{
+public:
+    NetworkPlacesManagerProxyPrivate(QWeakPointer<QDBusInterface> serviceInterface, QObject* proxy)
+        : interface(std::move(serviceInterface))
+        , networkPlaces(proxy, "slotRead")
+    {
+    }
+
+    const QWeakPointer<QDBusInterface> interface;
+    ServiceList<NetworkPlace> networkPlaces;
+};
+
 NetworkPlacesManagerProxy::NetworkPlacesManagerProxy(
     QWeakPointer<QDBusInterface> interface, QObject* parent)
     : QObject(parent)
-    , m_interface(std::move(interface))
+    , d(std::make_unique<NetworkPlacesManagerProxyPrivate>(std::move(interface), this))
 {
-    if (const auto alive = m_interface.toStrongRef()) {
+    if (const auto alive = d->interface.toStrongRef()) {
         followService(
             *alive, SIGNAL(networkPlaceAdded(VeyFM::NetworkPlace)), this,
             SLOT(slotNetworkPlaceAdded(VeyFM::NetworkPlace)));
@@ -30,56 +44,53 @@ NetworkPlacesManagerProxy::~NetworkPlacesManagerProxy() = default;
 
 QList<NetworkPlace> NetworkPlacesManagerProxy::networkPlaces()
 {
-    if (!m_networkPlacesLoaded) {
-        m_networkPlaces =
-            readFromService<QList<NetworkPlace>>(m_interface, QStringLiteral("networkPlaces"));
-        // After a failed read too: what is not there now will be told by signals.
-        m_networkPlacesLoaded = true;
-    }
-    return m_networkPlaces;
+    return d->networkPlaces.get([this] {
+        return readFromService<QList<NetworkPlace>>(d->interface, QStringLiteral("networkPlaces"));
+    });
+}
+
+void NetworkPlacesManagerProxy::slotRead()
+{
+    networkPlaces();
 }
 
 bool NetworkPlacesManagerProxy::addNetworkPlace(const NetworkPlace& place)
 {
-    return readFromService<bool>(m_interface, QStringLiteral("addNetworkPlace"), place);
+    return readFromService<bool>(d->interface, QStringLiteral("addNetworkPlace"), place);
 }
 
 void NetworkPlacesManagerProxy::removeNetworkPlace(const NetworkPlace& place)
 {
-    tellService(m_interface, QStringLiteral("removeNetworkPlace"), place);
+    tellService(d->interface, QStringLiteral("removeNetworkPlace"), place);
 }
 
 void NetworkPlacesManagerProxy::updateNetworkPlace(const NetworkPlace& place)
 {
-    tellService(m_interface, QStringLiteral("updateNetworkPlace"), place);
+    tellService(d->interface, QStringLiteral("updateNetworkPlace"), place);
 }
 
 void NetworkPlacesManagerProxy::slotNetworkPlaceAdded(const NetworkPlace& place)
 {
-    if (m_networkPlacesLoaded) {
-        m_networkPlaces.append(place);
-    }
+    d->networkPlaces.patch([&place](auto& places) { places.append(place); });
     Q_EMIT networkPlaceAdded(place);
 }
 
 void NetworkPlacesManagerProxy::slotNetworkPlaceRemoved(const NetworkPlace& place)
 {
-    if (m_networkPlacesLoaded) {
-        // By name: every bookmark of that name goes, whatever its URL.
-        m_networkPlaces.removeAll(place);
-    }
+    // By name: every bookmark of that name goes, whatever its URL.
+    d->networkPlaces.patch([&place](auto& places) { places.removeAll(place); });
     Q_EMIT networkPlaceRemoved(place);
 }
 
 void NetworkPlacesManagerProxy::slotNetworkPlaceUpdated(const NetworkPlace& place)
 {
-    if (m_networkPlacesLoaded) {
+    d->networkPlaces.patch([&place](auto& places) {
         // Found by name, so a bookmark can't be renamed in this way.
-        const int index = m_networkPlaces.indexOf(place);
+        const int index = places.indexOf(place);
         if (index >= 0) {
-            m_networkPlaces[index] = place;
+            places[index] = place;
         }
-    }
+    });
     Q_EMIT networkPlaceUpdated(place);
 }
 

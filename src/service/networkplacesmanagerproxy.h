@@ -11,15 +11,22 @@
 #include <QObject>
 #include <QWeakPointer>
 
+#include <memory>
+
 class QDBusInterface;
 
 namespace VeyFM {
+
+class NetworkPlacesManagerProxyPrivate;
 
 /**
  * The network bookmarks as the service holds them: a list that is read once and patched by the
  * service's signals, with the rules of FavouritePlacesManagerProxy.
  *
- * To be used in the thread that owns the object. Calls block for one exchange with the service.
+ * Any thread may call networkPlaces(). From a thread other than that of the object it takes what
+ * is there: a list that was not read yet is empty, and is read by the event loop of the object
+ * later. Everything else is for the thread of the object. Calls that ask the service block for
+ * one exchange with it.
  */
 class VEYFMVFS_EXPORT NetworkPlacesManagerProxy : public QObject
 {
@@ -54,14 +61,13 @@ Q_SIGNALS:
     /// @}
 
 private Q_SLOTS:
+    void slotRead();
     void slotNetworkPlaceAdded(const VeyFM::NetworkPlace& place);
     void slotNetworkPlaceRemoved(const VeyFM::NetworkPlace& place);
     void slotNetworkPlaceUpdated(const VeyFM::NetworkPlace& place);
 
 private:
-    const QWeakPointer<QDBusInterface> m_interface;
-    QList<NetworkPlace> m_networkPlaces;
-    bool m_networkPlacesLoaded = false;
+    const std::unique_ptr<NetworkPlacesManagerProxyPrivate> d;
 };
 
 } // namespace VeyFM

@@ -55,8 +55,9 @@ void SmbBrowserProxy::rescan()
     askService(m_interface, QStringLiteral("rescan"));
 }
 
-void SmbBrowserProxy::rescanWorkgroup(const QString& workgroup)
+void SmbBrowserProxy::rescanWorkgroup(const QString& given)
 {
+    const QString workgroup = given; // A slot of the host may change what was given.
     // Makes an unknown workgroup known.
     if (!m_workgroupMap[workgroup].hostsLoaded) {
         const QStringList known = hosts(workgroup);
@@ -67,8 +68,10 @@ void SmbBrowserProxy::rescanWorkgroup(const QString& workgroup)
     askService(m_interface, QStringLiteral("rescanWorkgroup"), workgroup);
 }
 
-void SmbBrowserProxy::rescanHost(const QString& host, const QString& workgroup)
+void SmbBrowserProxy::rescanHost(const QString& givenHost, const QString& givenWorkgroup)
 {
+    const QString host = givenHost;
+    const QString workgroup = givenWorkgroup;
     // Makes an unknown host, and its workgroup, known.
     if (!m_workgroupMap[workgroup].hostMap[host].sharesLoaded) {
         const StringMap known = shares(host, workgroup);

@@ -5,16 +5,30 @@
 
 #include "jobs/storageplacejob.h"
 #include "service/servicecall.h"
+#include "service/servicelist.h"
 #include "service/servicesignals.h"
 
 namespace VeyFM {
 
+class StoragePlacesManagerProxyPrivate
+{
+public:
+    StoragePlacesManagerProxyPrivate(QWeakPointer<QDBusInterface> serviceInterface, QObject* proxy)
+        : interface(std::move(serviceInterface))
+        , storagePlaces(proxy, "slotRead")
+    {
+    }
+
+    const QWeakPointer<QDBusInterface> interface;
+    ServiceList<StoragePlace> storagePlaces;
+};
+
 StoragePlacesManagerProxy::StoragePlacesManagerProxy(
     QWeakPointer<QDBusInterface> interface, QObject* parent)
     : QObject(parent)
-    , m_interface(std::move(interface))
+    , d(std::make_unique<StoragePlacesManagerProxyPrivate>(std::move(interface), this))
 {
-    if (const auto alive = m_interface.toStrongRef()) {
+    if (const auto alive = d->interface.toStrongRef()) {
         followService(
             *alive, SIGNAL(storagePlaceUpdated(VeyFM::StoragePlace)), this,
             SLOT(slotStoragePlaceUpdated(VeyFM::StoragePlace)));
@@ -31,34 +45,36 @@ StoragePlacesManagerProxy::~StoragePlacesManagerProxy() = default;
 
 QList<StoragePlace> StoragePlacesManagerProxy::availableStoragePlaces()
 {
-    if (!m_storagePlacesLoaded) {
-        m_storagePlaces = readFromService<QList<StoragePlace>>(
-            m_interface, QStringLiteral("availableStoragePlaces"));
-        // After a failed read too: what is not there now will be told by signals.
-        m_storagePlacesLoaded = true;
-    }
-    return m_storagePlaces;
+    return d->storagePlaces.get([this] {
+        return readFromService<QList<StoragePlace>>(
+            d->interface, QStringLiteral("availableStoragePlaces"));
+    });
+}
+
+void StoragePlacesManagerProxy::slotRead()
+{
+    availableStoragePlaces();
 }
 
 StorageDeviceInfo StoragePlacesManagerProxy::storageDeviceInfo(const StoragePlace& place) const
 {
     return readFromService<StorageDeviceInfo>(
-        m_interface, QStringLiteral("storageDeviceInfo"), place);
+        d->interface, QStringLiteral("storageDeviceInfo"), place);
 }
 
 Job* StoragePlacesManagerProxy::mountStoragePlace(const StoragePlace& place)
 {
-    return new StoragePlaceMountJob(place, m_interface.toStrongRef());
+    return new StoragePlaceMountJob(place, d->interface.toStrongRef());
 }
 
 Job* StoragePlacesManagerProxy::unmountStoragePlace(const StoragePlace& place)
 {
-    return new StoragePlaceUnmountJob(place, m_interface.toStrongRef());
+    return new StoragePlaceUnmountJob(place, d->interface.toStrongRef());
 }
 
 Job* StoragePlacesManagerProxy::ejectStoragePlaceDevice(const StoragePlace& place)
 {
-    return new StoragePlaceEjectJob(place, m_interface.toStrongRef());
+    return new StoragePlaceEjectJob(place, d->interface.toStrongRef());
 }
 
 void StoragePlacesManagerProxy::slotStoragePlaceUpdated(const StoragePlace& place)
@@ -66,27 +82,25 @@ void StoragePlacesManagerProxy::slotStoragePlaceUpdated(const StoragePlace& plac
     // The old state is known only here: a device that is not in the list gets a default record,
     // and receivers compare with that.
     StoragePlace previous;
-    const int index = m_storagePlacesLoaded ? m_storagePlaces.indexOf(place) : -1;
-    if (index >= 0) {
-        previous = m_storagePlaces.at(index);
-        m_storagePlaces[index] = place;
-    }
+    d->storagePlaces.patch([&place, &previous](auto& places) {
+        const int index = places.indexOf(place);
+        if (index >= 0) {
+            previous = places.at(index);
+            places[index] = place;
+        }
+    });
     Q_EMIT storagePlaceUpdated(place, previous);
 }
 
 void StoragePlacesManagerProxy::slotStoragePlaceAdded(const StoragePlace& place)
 {
-    if (m_storagePlacesLoaded) {
-        m_storagePlaces.append(place);
-    }
+    d->storagePlaces.patch([&place](auto& places) { places.append(place); });
     Q_EMIT storagePlaceAdded(place);
 }
 
 void StoragePlacesManagerProxy::slotStoragePlaceRemoved(const StoragePlace& place)
 {
-    if (m_storagePlacesLoaded) {
-        m_storagePlaces.removeAll(place);
-    }
+    d->storagePlaces.patch([&place](auto& places) { places.removeAll(place); });
     Q_EMIT storagePlaceRemoved(place);
 }
 

@@ -12,11 +12,14 @@
 #include <QObject>
 #include <QWeakPointer>
 
+#include <memory>
+
 class QDBusInterface;
 
 namespace VeyFM {
 
 class Job;
+class StoragePlacesManagerProxyPrivate;
 
 /**
  * The storage devices as the service knows them.
@@ -25,7 +28,10 @@ class Job;
  * patch it, and nothing else does. A first read that failed stays as an empty list, to which
  * only signals add.
  *
- * To be used in the thread that owns the object. Reads block for one exchange with the service.
+ * Any thread may call availableStoragePlaces(). From a thread other than that of the object it
+ * takes what is there: a list that was not read yet is empty, and is read by the event loop of the
+ * object later. Everything else is for the thread of the object. Calls that ask the service block
+ * for one exchange with it.
  */
 class VEYFMVFS_EXPORT StoragePlacesManagerProxy : public QObject
 {
@@ -71,14 +77,13 @@ Q_SIGNALS:
     /// @}
 
 private Q_SLOTS:
+    void slotRead();
     void slotStoragePlaceUpdated(const VeyFM::StoragePlace& place);
     void slotStoragePlaceAdded(const VeyFM::StoragePlace& place);
     void slotStoragePlaceRemoved(const VeyFM::StoragePlace& place);
 
 private:
-    const QWeakPointer<QDBusInterface> m_interface;
-    QList<StoragePlace> m_storagePlaces;
-    bool m_storagePlacesLoaded = false;
+    const std::unique_ptr<StoragePlacesManagerProxyPrivate> d;
 };
 
 } // namespace VeyFM

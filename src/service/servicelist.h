@@ -1,0 +1,86 @@
+// SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
+// SPDX-License-Identifier: LGPL-2.1-or-later
+
+#ifndef VEYFM_SERVICELIST_H
+#define VEYFM_SERVICELIST_H
+
+#include <QList>
+#include <QMetaObject>
+#include <QObject>
+#include <QThread>
+
+#include <mutex>
+
+namespace VeyFM {
+
+/**
+ * The records that a proxy keeps: read from the service once, and patched by its signals.
+ *
+ * The thread of the proxy alone reads and patches. Other threads get a copy of what is there, and
+ * never wait for the service: the lock is held for a copy or a change, never around a call, a
+ * signal or another lock.
+ */
+template <typename Record>
+class ServiceList
+{
+public:
+    /// @param readingSlot the slot of @p proxy that calls get(), for when another thread was first
+    ServiceList(QObject* proxy, const char* readingSlot)
+        : m_proxy(proxy)
+        , m_readingSlot(readingSlot)
+    {
+    }
+
+    /// The records, from @p read at the first call in the thread of the proxy. Another thread that
+    /// comes before gets none, and has them read there later.
+    template <typename Read>
+    QList<Record> get(Read read)
+    {
+        if (QThread::currentThread() != m_proxy->thread()) {
+            return copyForOthers();
+        }
+        if (!m_loaded) {
+            const QList<Record> records = read();
+            const std::lock_guard<std::mutex> locker(m_lock);
+            m_records = records;
+            // After a failed read too: what is not there now will be told by signals.
+            m_loaded = true;
+        }
+        return m_records;
+    }
+
+    /// Has @p patch change the records, if they have been read. In the thread of the proxy.
+    template <typename Patch>
+    void patch(Patch patch)
+    {
+        if (m_loaded) {
+            const std::lock_guard<std::mutex> locker(m_lock);
+            patch(m_records);
+        }
+    }
+
+private:
+    QList<Record> copyForOthers()
+    {
+        {
+            const std::lock_guard<std::mutex> locker(m_lock);
+            if (m_loaded || m_asked) {
+                return m_records;
+            }
+            m_asked = true;
+        }
+        QMetaObject::invokeMethod(m_proxy, m_readingSlot, Qt::QueuedConnection);
+        return QList<Record>();
+    }
+
+    QObject* const m_proxy;
+    const char* const m_readingSlot;
+    std::mutex m_lock; // for changes, and for whatever other threads do
+    QList<Record> m_records;
+    bool m_loaded = false;
+    bool m_asked = false;
+};
+
+} // namespace VeyFM
+
+#endif
