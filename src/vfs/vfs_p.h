@@ -5,6 +5,7 @@
 #define VEYFM_VFS_P_H
 
 #include "core/entrylist.h"
+#include "core/newsqueue.h"
 #include "service/favouriteplacesmanagerproxy.h"
 #include "service/fusemountsmanagerproxy.h"
 #include "service/networkmountsmanagerproxy.h"
@@ -78,7 +79,7 @@ public:
     /// The URL of a bookmark, or of something below it, by its path behind the Network place.
     QString bookmarkUrl(const QString& relativePath) const;
 
-    // Places for the service's records.
+    // Places for the service's records. Within a step of the news, like all that announces.
     void addStoragePlace(const StoragePlace& place, bool notify);
     void addFavouritePlace(const FavouritePlace& place, bool notify);
     void addNetworkPlace(const NetworkPlace& place, bool notify);
@@ -87,6 +88,15 @@ public:
     QString networkPlacePath(const NetworkPlace& place) const;
     Entry entryOfRecord(const QString& path) const;
     QString workgroupPath(const QString& workgroup) const;
+
+    /// Connects a signal of one of the proxies below to a slot of this.
+    template <typename Proxy, typename Signal, typename Slot>
+    void follow(const std::unique_ptr<Proxy>& proxy, Signal signal, Slot slot)
+    {
+        QObject::connect(proxy.get(), signal, q, [this, slot](const auto&... arguments) {
+            (this->*slot)(arguments...);
+        });
+    }
 
     // Fills of pending places, and news of the service.
     void _q_createStoragePlaces(const QString& path);
@@ -113,14 +123,17 @@ public:
         const QString& share, const QString& host, const QString& workgroup,
         const QString& localPath);
 
-    // Changes to the tree, announced to the watchers on request.
+    // Changes to the tree, announced to the watchers on request: additions by steps of their own.
     bool addEntryToPlace(const Entry& entry, const Entry& place, bool notify);
     EntryList addEntriesToPlace(const EntryList& entries, const Entry& place, bool notify);
     void destroyPlace(const Entry& place);
+    void destroyPlaceLater(const Entry& place);
 
     VFS* const q;
     NotifiedEntryWatcher entryWatcher;
     VFSPlaceBase placeBase;
+    // What the slots for news of the service do, all of them.
+    NewsQueue news;
     mutable QAtomicInt stopFlag;
     QWeakPointer<QDBusInterface> fileSystemInterface;
     std::unique_ptr<StoragePlacesManagerProxy> storagePlacesManager;

@@ -52,16 +52,15 @@ void VFSPrivate::_q_createStoragePlaces(const QString& path)
     Q_EMIT q->longTimeOperationStarted();
     if (storagePlacesManager) {
         // Only here: a process that never looks at devices is not woken by their news.
-        QObject::connect(
-            storagePlacesManager.get(),
-            SIGNAL(storagePlaceUpdated(VeyFM::StoragePlace, VeyFM::StoragePlace)), q,
-            SLOT(_q_serviceStoragePlaceUpdated(VeyFM::StoragePlace, VeyFM::StoragePlace)));
-        QObject::connect(
-            storagePlacesManager.get(), SIGNAL(storagePlaceAdded(VeyFM::StoragePlace)), q,
-            SLOT(_q_serviceStoragePlaceAdded(VeyFM::StoragePlace)));
-        QObject::connect(
-            storagePlacesManager.get(), SIGNAL(storagePlaceRemoved(VeyFM::StoragePlace)), q,
-            SLOT(_q_serviceStoragePlaceRemoved(VeyFM::StoragePlace)));
+        follow(
+            storagePlacesManager, &StoragePlacesManagerProxy::storagePlaceUpdated,
+            &VFSPrivate::_q_serviceStoragePlaceUpdated);
+        follow(
+            storagePlacesManager, &StoragePlacesManagerProxy::storagePlaceAdded,
+            &VFSPrivate::_q_serviceStoragePlaceAdded);
+        follow(
+            storagePlacesManager, &StoragePlacesManagerProxy::storagePlaceRemoved,
+            &VFSPrivate::_q_serviceStoragePlaceRemoved);
         const QList<StoragePlace> places = storagePlacesManager->availableStoragePlaces();
         for (const StoragePlace& place : places) {
             addStoragePlace(place, false);
@@ -83,7 +82,7 @@ void VFSPrivate::addStoragePlace(const StoragePlace& place, bool notify)
 
 void VFSPrivate::_q_serviceStoragePlaceAdded(const StoragePlace& place)
 {
-    addStoragePlace(place, true);
+    news.tell([this, place] { addStoragePlace(place, true); });
 }
 
 void VFSPrivate::_q_serviceStoragePlaceUpdated(
@@ -91,22 +90,32 @@ void VFSPrivate::_q_serviceStoragePlaceUpdated(
 {
     // The signals run before the tree knows the new mount point, and the entry that goes to the
     // watchers still has the old one. Receivers read the entry again.
-    if (previous.isMounted() != place.isMounted()) {
-        Q_EMIT q->storagePlaceMountStateChanged(place);
-    }
-    if (previous.isMountable() != place.isMountable()) {
-        Q_EMIT q->storagePlaceMountabilityChanged(place);
-    }
-    const Entry entry = entryOfRecord(place.name());
-    placeBase.setPlaceLocalPath(entry, place.mountPoint());
-    q->notifyWatchers(entry);
+    const bool isOtherState = previous.isMounted() != place.isMounted();
+    const bool isOtherAbility = previous.isMountable() != place.isMountable();
+    news.tell(
+        [this, place, isOtherState] {
+            if (isOtherState) {
+                Q_EMIT q->storagePlaceMountStateChanged(place);
+            }
+        },
+        [this, place, isOtherAbility] {
+            if (isOtherAbility) {
+                Q_EMIT q->storagePlaceMountabilityChanged(place);
+            }
+        },
+        [this, place] {
+            const Entry entry = entryOfRecord(place.name());
+            placeBase.setPlaceLocalPath(entry, place.mountPoint());
+            q->notifyWatchers(entry);
+        });
 }
 
 void VFSPrivate::_q_serviceStoragePlaceRemoved(const StoragePlace& place)
 {
     // While the signal runs the place is still in the tree.
-    Q_EMIT q->storagePlaceRemoved(place);
-    destroyPlace(entryOfRecord(place.name()));
+    news.tell(
+        [this, place] { Q_EMIT q->storagePlaceRemoved(place); },
+        [this, place] { destroyPlace(entryOfRecord(place.name())); });
 }
 
 void VFSPrivate::addFavouritePlace(const FavouritePlace& place, bool notify)
@@ -118,12 +127,12 @@ void VFSPrivate::addFavouritePlace(const FavouritePlace& place, bool notify)
 
 void VFSPrivate::_q_favouritePlaceAdded(const FavouritePlace& place)
 {
-    addFavouritePlace(place, true);
+    news.tell([this, place] { addFavouritePlace(place, true); });
 }
 
 void VFSPrivate::_q_favouritePlaceRemoved(const FavouritePlace& place)
 {
-    destroyPlace(entryOfRecord(q->favouritePlacePath(place)));
+    news.tell([this, place] { destroyPlace(entryOfRecord(q->favouritePlacePath(place))); });
 }
 
 QString VFSPrivate::networkPlacePath(const NetworkPlace& place) const
@@ -135,29 +144,33 @@ void VFSPrivate::addNetworkPlace(const NetworkPlace& place, bool notify)
 {
     const Entry entry = placeBase.createPlace(
         networkPlacePath(place), TypeFavouriteNetworkPlace, place.localPath());
-    const bool linked = addEntryToPlace(entry, networkEntry, notify);
     // A null entry tells that nothing new was linked. The signal goes out in either case, and
     // for the bookmarks read at start-up too.
-    Q_EMIT q->networkPlaceAdded(place, linked ? entry : Entry());
+    const Entry linked = addEntryToPlace(entry, networkEntry, notify) ? entry : Entry();
+    news.then([this, place, linked] { Q_EMIT q->networkPlaceAdded(place, linked); });
 }
 
 void VFSPrivate::_q_networkPlaceAdded(const NetworkPlace& place)
 {
-    addNetworkPlace(place, true);
+    news.tell([this, place] { addNetworkPlace(place, true); });
 }
 
 void VFSPrivate::_q_networkPlaceRemoved(const NetworkPlace& place)
 {
-    destroyPlace(Entry(networkPlacePath(place), QString(), TypeFavouriteNetworkPlace));
+    news.tell([this, path = networkPlacePath(place)] {
+        destroyPlace(Entry(path, QString(), TypeFavouriteNetworkPlace));
+    });
 }
 
 void VFSPrivate::_q_networkPlaceUpdated(const NetworkPlace& place)
 {
-    // The entry that goes out still has the old local path. Receivers read it again.
-    const Entry entry = entryOfRecord(networkPlacePath(place));
-    placeBase.setPlaceLocalPath(entry, place.localPath());
-    q->notifyWatchers(entry);
-    Q_EMIT q->networkPlaceUpdated(entry);
+    news.tell([this, place] {
+        // The entry that goes out still has the old local path. Receivers read it again.
+        const Entry entry = entryOfRecord(networkPlacePath(place));
+        placeBase.setPlaceLocalPath(entry, place.localPath());
+        news.then([this, entry] { q->notifyWatchers(entry); });
+        news.then([this, entry] { Q_EMIT q->networkPlaceUpdated(entry); });
+    });
 }
 
 EntryList VFSPrivate::addNetworkMounts(const QMap<QString, Entry>& mounts, bool notify)
@@ -184,32 +197,34 @@ VFSPrivate::addMountsOfKind(const QList<Entry>& mounts, const Entry& kindPlace, 
     for (const Entry& mount : mounts) {
         entries.append(placeBase.createPlace(mount));
     }
-    if (!entries.isEmpty()) {
-        // FTP and SFTP hang under Network from the first mount of their kind on.
-        if (!placeBase.placeHasChildEntry(networkEntry, kindPlace)) {
-            addEntryToPlace(kindPlace, networkEntry, notify);
-        }
+    if (entries.isEmpty()) {
+        return entries;
+    }
+    // FTP and SFTP hang under Network from the first mount of their kind on.
+    if (!placeBase.placeHasChildEntry(networkEntry, kindPlace)) {
+        addEntryToPlace(kindPlace, networkEntry, notify);
+    }
+    news.then([this, entries, kindPlace, notify] {
         // A service that calls a mount after a place above would make a ring of the tree, in which
         // every walk to the top goes on for ever. Such a mount stays without a link.
         EntryList linkable;
-        for (const Entry& entry : qAsConst(entries)) {
+        for (const Entry& entry : entries) {
             if (entry != kindPlace && placeBase.checkAndGetParentPlace(kindPlace, entry).isNull()) {
                 linkable.append(entry);
             }
         }
         addEntriesToPlace(linkable, kindPlace, notify);
-    }
+    });
     return entries;
 }
 
 void VFSPrivate::_q_fuseMountAdded(const QString& url, const Entry& entry)
 {
-    if (entry.isNull()) {
-        Q_EMIT q->fuseMountAdded(url, Entry());
-        return;
-    }
-    const EntryList mounted = addNetworkMounts({{url, entry}}, true);
-    Q_EMIT q->fuseMountAdded(url, mounted.value(0));
+    news.tell([this, url, entry] {
+        const Entry mount =
+            entry.isNull() ? Entry() : addNetworkMounts({{url, entry}}, true).value(0);
+        news.then([this, url, mount] { Q_EMIT q->fuseMountAdded(url, mount); });
+    });
 }
 
 } // namespace VeyFM

@@ -86,69 +86,90 @@ void VFSPrivate::_q_createSambaShares(const QString& path)
 
 void VFSPrivate::_q_smbWorkgroupsChanged(const QStringList& added, const QStringList& removed)
 {
-    EntryList workgroups;
-    for (const QString& name : added) {
-        workgroups.append(placeBase.createPendingPlace(
-            workgroupPath(name), TypeSambaWorkgroupPlace, q, "_q_createSambaHosts"));
-    }
-    addEntriesToPlace(workgroups, sambaNetworkEntry, true);
-    for (const QString& name : removed) {
-        destroyPlace(Entry(workgroupPath(name), QString(), TypeSambaWorkgroupPlace));
-    }
+    news.tell([this, added, removed] {
+        EntryList workgroups;
+        for (const QString& name : added) {
+            workgroups.append(placeBase.createPendingPlace(
+                workgroupPath(name), TypeSambaWorkgroupPlace, q, "_q_createSambaHosts"));
+        }
+        addEntriesToPlace(workgroups, sambaNetworkEntry, true);
+        for (const QString& name : removed) {
+            destroyPlaceLater(Entry(workgroupPath(name), QString(), TypeSambaWorkgroupPlace));
+        }
+    });
 }
 
 void VFSPrivate::_q_smbWorkgroupUpdated(
     const QString& workgroup, const QStringList& added, const QStringList& removed)
 {
-    // Opens the Samba place where the workgroup is not there yet.
-    const Entry place = placeBase.placeEntry(workgroupPath(workgroup));
-    if (place.isNull()) {
-        return;
-    }
-    EntryList hosts;
-    for (const QString& name : added) {
-        hosts.append(placeBase.createPendingPlace(
-            place.m_path + slash + name, TypeSambaServerPlace, q, "_q_createSambaShares"));
-    }
-    addEntriesToPlace(hosts, place, true);
-    for (const QString& name : removed) {
-        destroyPlace(Entry(place.m_path + slash + name, QString(), TypeSambaServerPlace));
-    }
+    const QString path = workgroupPath(workgroup);
+    news.tell(
+        // Opens the Samba place where the workgroup is not there yet. In a step of its own, since
+        // that tells the host something.
+        [this, path] { placeBase.placeEntry(path); },
+        [this, path, added, removed] {
+            const Entry place = placeBase.placeEntry(path);
+            if (place.isNull()) {
+                return;
+            }
+            EntryList hosts;
+            for (const QString& name : added) {
+                hosts.append(placeBase.createPendingPlace(
+                    place.m_path + slash + name, TypeSambaServerPlace, q, "_q_createSambaShares"));
+            }
+            addEntriesToPlace(hosts, place, true);
+            for (const QString& name : removed) {
+                destroyPlaceLater(
+                    Entry(place.m_path + slash + name, QString(), TypeSambaServerPlace));
+            }
+        });
 }
 
 void VFSPrivate::_q_smbHostUpdated(
     const QString& host, const QString& workgroup, const StringMap& added, const StringMap& removed)
 {
     const QString hostPath = workgroupPath(workgroup) + slash + host;
-    const Entry place = placeBase.placeEntry(hostPath);
-    if (place.isNull()) {
-        return;
-    }
-    EntryList shares;
-    for (auto it = added.cbegin(); it != added.cend(); ++it) {
-        shares.append(
-            placeBase.createPlace(hostPath + slash + it.key(), TypeSambaSharePlace, it.value()));
-    }
-    addEntriesToPlace(shares, place, true);
-    // By the values, which are local paths, and not by the keys, which are the names: a share
-    // that vanished stays in the tree unless its local path is its name. Not to be straightened
-    // out: views rely on shares not going away under them.
-    for (const QString& value : removed) {
-        destroyPlace(Entry(hostPath + slash + value, removed.value(value), TypeSambaSharePlace));
-    }
+    news.tell(
+        [this, hostPath] { placeBase.placeEntry(hostPath); },
+        [this, hostPath, added, removed] {
+            const Entry place = placeBase.placeEntry(hostPath);
+            if (place.isNull()) {
+                return;
+            }
+            EntryList shares;
+            for (auto it = added.cbegin(); it != added.cend(); ++it) {
+                shares.append(placeBase.createPlace(
+                    hostPath + slash + it.key(), TypeSambaSharePlace, it.value()));
+            }
+            addEntriesToPlace(shares, place, true);
+            // By the values, which are local paths, and not by the keys, which are the names: a
+            // share that vanished stays in the tree unless its local path is its name. Not to be
+            // straightened out: views rely on shares not going away under them.
+            for (const QString& value : removed) {
+                destroyPlaceLater(
+                    Entry(hostPath + slash + value, removed.value(value), TypeSambaSharePlace));
+            }
+        });
 }
 
 void VFSPrivate::_q_smbShareUpdated(
     const QString& share, const QString& host, const QString& workgroup, const QString& localPath)
 {
-    const Entry entry = q->smbShareEntry(share, host, workgroup);
-    if (entry.isNull()) {
-        return;
-    }
-    // The entry that goes out still has the old local path. Receivers read it again.
-    placeBase.setPlaceLocalPath(entry, localPath);
-    q->notifyWatchers(entry);
-    Q_EMIT q->smbShareUpdated(entry);
+    const auto entryOfShare = [this, share, host, workgroup] {
+        return q->smbShareEntry(share, host, workgroup);
+    };
+    news.tell(
+        [entryOfShare] { entryOfShare(); },
+        [this, entryOfShare, localPath] {
+            const Entry entry = entryOfShare();
+            if (entry.isNull()) {
+                return;
+            }
+            // The entry that goes out still has the old local path. Receivers read it again.
+            placeBase.setPlaceLocalPath(entry, localPath);
+            news.then([this, entry] { q->notifyWatchers(entry); });
+            news.then([this, entry] { Q_EMIT q->smbShareUpdated(entry); });
+        });
 }
 
 } // namespace VeyFM

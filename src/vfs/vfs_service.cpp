@@ -108,39 +108,34 @@ void VFSPrivate::initializeNetwork()
     addEntryToPlace(networkEntry, placesEntry, false);
 
     if (networkMountsManager) {
-        addNetworkMounts(networkMountsManager->mounts(), true);
-        QObject::connect(
-            networkMountsManager.get(), SIGNAL(mountAdded(QString, VeyFM::Entry)), q,
-            SLOT(_q_fuseMountAdded(QString, VeyFM::Entry)));
+        news.tell([this] { addNetworkMounts(networkMountsManager->mounts(), true); });
+        follow(
+            networkMountsManager, &NetworkMountsManagerProxy::mountAdded,
+            &VFSPrivate::_q_fuseMountAdded);
     }
     if (smbBrowser) {
-        QObject::connect(
-            smbBrowser.get(), SIGNAL(workgroupsChanged(QStringList, QStringList)), q,
-            SLOT(_q_smbWorkgroupsChanged(QStringList, QStringList)));
-        QObject::connect(
-            smbBrowser.get(), SIGNAL(workgroupUpdated(QString, QStringList, QStringList)), q,
-            SLOT(_q_smbWorkgroupUpdated(QString, QStringList, QStringList)));
-        QObject::connect(
-            smbBrowser.get(), SIGNAL(hostUpdated(QString, QString, StringMap, StringMap)), q,
-            SLOT(_q_smbHostUpdated(QString, QString, StringMap, StringMap)));
-        QObject::connect(
-            smbBrowser.get(), SIGNAL(shareUpdated(QString, QString, QString, QString)), q,
-            SLOT(_q_smbShareUpdated(QString, QString, QString, QString)));
+        follow(
+            smbBrowser, &SmbBrowserProxy::workgroupsChanged, &VFSPrivate::_q_smbWorkgroupsChanged);
+        follow(smbBrowser, &SmbBrowserProxy::workgroupUpdated, &VFSPrivate::_q_smbWorkgroupUpdated);
+        follow(smbBrowser, &SmbBrowserProxy::hostUpdated, &VFSPrivate::_q_smbHostUpdated);
+        follow(smbBrowser, &SmbBrowserProxy::shareUpdated, &VFSPrivate::_q_smbShareUpdated);
     }
     if (networkPlacesManager) {
-        const QList<NetworkPlace> bookmarks = networkPlacesManager->networkPlaces();
-        for (const NetworkPlace& place : bookmarks) {
-            addNetworkPlace(place, false);
-        }
-        QObject::connect(
-            networkPlacesManager.get(), SIGNAL(networkPlaceAdded(VeyFM::NetworkPlace)), q,
-            SLOT(_q_networkPlaceAdded(VeyFM::NetworkPlace)));
-        QObject::connect(
-            networkPlacesManager.get(), SIGNAL(networkPlaceRemoved(VeyFM::NetworkPlace)), q,
-            SLOT(_q_networkPlaceRemoved(VeyFM::NetworkPlace)));
-        QObject::connect(
-            networkPlacesManager.get(), SIGNAL(networkPlaceUpdated(VeyFM::NetworkPlace)), q,
-            SLOT(_q_networkPlaceUpdated(VeyFM::NetworkPlace)));
+        news.tell([this] {
+            const QList<NetworkPlace> bookmarks = networkPlacesManager->networkPlaces();
+            for (const NetworkPlace& place : bookmarks) {
+                addNetworkPlace(place, false);
+            }
+        });
+        follow(
+            networkPlacesManager, &NetworkPlacesManagerProxy::networkPlaceAdded,
+            &VFSPrivate::_q_networkPlaceAdded);
+        follow(
+            networkPlacesManager, &NetworkPlacesManagerProxy::networkPlaceRemoved,
+            &VFSPrivate::_q_networkPlaceRemoved);
+        follow(
+            networkPlacesManager, &NetworkPlacesManagerProxy::networkPlaceUpdated,
+            &VFSPrivate::_q_networkPlaceUpdated);
     }
 }
 

@@ -48,12 +48,12 @@ void VFSPrivate::initialize()
         for (const FavouritePlace& place : favourites) {
             addFavouritePlace(place, false);
         }
-        QObject::connect(
-            favouritePlacesManager.get(), SIGNAL(favouritePlaceAdded(VeyFM::FavouritePlace)), q,
-            SLOT(_q_favouritePlaceAdded(VeyFM::FavouritePlace)));
-        QObject::connect(
-            favouritePlacesManager.get(), SIGNAL(favouritePlaceRemoved(VeyFM::FavouritePlace)), q,
-            SLOT(_q_favouritePlaceRemoved(VeyFM::FavouritePlace)));
+        follow(
+            favouritePlacesManager, &FavouritePlacesManagerProxy::favouritePlaceAdded,
+            &VFSPrivate::_q_favouritePlaceAdded);
+        follow(
+            favouritePlacesManager, &FavouritePlacesManagerProxy::favouritePlaceRemoved,
+            &VFSPrivate::_q_favouritePlaceRemoved);
     }
     if (const auto fileSystem = fileSystemInterface.toStrongRef()) {
         followService(

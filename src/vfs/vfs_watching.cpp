@@ -15,9 +15,10 @@ void VFS::notifyWatchers(const EntryList& entries)
     directNotifyWatchers(entries, true);
 }
 
-void VFS::directNotifyWatchers(const EntryList& entries, bool anyWay)
+void VFS::directNotifyWatchers(const EntryList& given, bool anyWay)
 {
     Q_D(VFS);
+    const EntryList entries = given;
     for (const Entry& entry : entries) {
         d->entryWatcher.entryChangedNotify(entry, anyWay);
     }
@@ -42,7 +43,7 @@ bool VFSPrivate::addEntryToPlace(const Entry& entry, const Entry& place, bool no
 {
     const bool linked = placeBase.addEntryToPlace(entry, place);
     if (linked && notify) {
-        entryWatcher.notifyEntryCreated(entry);
+        news.then([this, entry] { entryWatcher.notifyEntryCreated(entry); });
     }
     return linked;
 }
@@ -52,7 +53,7 @@ EntryList VFSPrivate::addEntriesToPlace(const EntryList& entries, const Entry& p
     const EntryList linked = placeBase.addEntriesToPlace(entries, place);
     if (notify) {
         for (const Entry& entry : linked) {
-            entryWatcher.notifyEntryCreated(entry);
+            news.then([this, entry] { entryWatcher.notifyEntryCreated(entry); });
         }
     }
     return linked;
@@ -63,6 +64,11 @@ void VFSPrivate::destroyPlace(const Entry& place)
     if (placeBase.destroyPlace(place)) {
         entryWatcher.notifyEntryDeleted(place);
     }
+}
+
+void VFSPrivate::destroyPlaceLater(const Entry& place)
+{
+    news.then([this, place] { destroyPlace(place); });
 }
 
 } // namespace VeyFM

@@ -3,6 +3,7 @@
 
 #include "watch/entrywatcher.h"
 
+#include "core/newsqueue.h"
 #include "vfs/vfs.h"
 #include "watch/inotifywatcher.h"
 
@@ -26,6 +27,7 @@ public:
     }
 
     void notifyPath(Signal signal, const QString& path, const QString& fileName);
+    void notifyEntry(Signal signal, const Entry& entry, const QString& fileName);
 
     EntryWatcher* const q;
     InotifyWatcher* const inotifyWatcher; // a child of the watcher
@@ -33,6 +35,7 @@ public:
     // has a key; an ordinary entry is known to the kernel alone.
     QMap<QString, QSet<Entry>> watchedEntries;
     bool disabled = false;
+    NewsQueue news; // of the kernel
 };
 
 EntryWatcher::EntryWatcher(QObject* parent)
@@ -51,8 +54,9 @@ EntryWatcher::EntryWatcher(QObject* parent)
 
 EntryWatcher::~EntryWatcher() = default;
 
-void EntryWatcher::addEntry(const Entry& entry)
+void EntryWatcher::addEntry(const Entry& given)
 {
+    const Entry entry = given; // A slot of the host may run in here and change what was given.
     const QString local = entry.localPath();
     if (!isRefreshable(local)) {
         return;
@@ -69,14 +73,19 @@ void EntryWatcher::addEntry(const Entry& entry)
         d->watchedEntries[local].insert(entry);
     }
     // A path with a key goes by both its names: as the place and as the plain directory.
-    const auto found = d->watchedEntries.find(local);
-    if (found != d->watchedEntries.end()) {
-        found->insert(VFS::ptr()->entry(local));
+    if (d->watchedEntries.contains(local)) {
+        const Entry plain = VFS::ptr()->entry(local);
+        // Looked up afterwards, since that may have called a slot of the host.
+        const auto found = d->watchedEntries.find(local);
+        if (found != d->watchedEntries.end()) {
+            found->insert(plain);
+        }
     }
 }
 
-void EntryWatcher::removeEntry(const Entry& entry)
+void EntryWatcher::removeEntry(const Entry& given)
 {
+    const Entry entry = given;
     const QString local = entry.localPath();
     const auto entries = d->watchedEntries.find(local);
     if (entries == d->watchedEntries.end()) {
@@ -179,30 +188,35 @@ void EntryWatcherPrivate::notifyPath(Signal signal, const QString& path, const Q
     if (disabled) {
         return;
     }
-    const auto found = watchedEntries.constFind(path);
-    if (found == watchedEntries.constEnd()) {
-        const Entry current = VFS::ptr()->entry(path + QLatin1Char('/') + fileName);
-        // Here the entry is asked and below the disk, and the two differ: a link to a file, or a
-        // dangling one, is reset only where the path has a key.
-        const bool isReset = signal == &EntryWatcher::entryChanged && current.isDirLink();
-        Q_EMIT(q->*(isReset ? &EntryWatcher::entryReset : signal))(current);
+    news.tell([this, signal, path, fileName] {
+        const auto found = watchedEntries.constFind(path);
+        if (found == watchedEntries.constEnd()) {
+            const Entry current = VFS::ptr()->entry(path + QLatin1Char('/') + fileName);
+            // Here the entry is asked and below the disk, and the two differ: a link to a file, or
+            // a dangling one, is reset only where the path has a key.
+            const bool isReset = signal == &EntryWatcher::entryChanged && current.isDirLink();
+            Q_EMIT(q->*(isReset ? &EntryWatcher::entryReset : signal))(current);
+            return;
+        }
+        for (const Entry& entry : *found) {
+            news.then([this, signal, entry, fileName] { notifyEntry(signal, entry, fileName); });
+        }
+    });
+}
+
+void EntryWatcherPrivate::notifyEntry(Signal signal, const Entry& entry, const QString& fileName)
+{
+    Entry current = entry;
+    if (!fileName.isEmpty()) {
+        current = VFS::ptr()->child(entry, fileName);
+    } else if (signal == &EntryWatcher::entryDeleted && current.isDirPlace()) {
+        // A place does not die with its directory.
+        Q_EMIT q->entryChanged(current);
         return;
     }
-    // A copy, since slots may add and remove entries.
-    const QSet<Entry> entries = *found;
-    for (const Entry& entry : entries) {
-        Entry current = entry;
-        if (!fileName.isEmpty()) {
-            current = VFS::ptr()->child(entry, fileName);
-        } else if (signal == &EntryWatcher::entryDeleted && current.isDirPlace()) {
-            // A place does not die with its directory.
-            Q_EMIT q->entryChanged(current);
-            continue;
-        }
-        const bool isReset =
-            signal == &EntryWatcher::entryChanged && QFileInfo(current.localPath()).isSymLink();
-        Q_EMIT(q->*(isReset ? &EntryWatcher::entryReset : signal))(current);
-    }
+    const bool isReset =
+        signal == &EntryWatcher::entryChanged && QFileInfo(current.localPath()).isSymLink();
+    Q_EMIT(q->*(isReset ? &EntryWatcher::entryReset : signal))(current);
 }
 
 } // namespace VeyFM
