@@ -20,6 +20,7 @@ private Q_SLOTS:
     void sameMountAgain();
     void sftpHasItsOwnPlace();
     void placesAboveAreNotHungBelow();
+    void absolutePathsMakeNoPlace();
     void cleanupTestCase();
 
 private:
@@ -109,6 +110,29 @@ void MountUpdatesTest::placesAboveAreNotHungBelow()
     QCOMPARE(
         vfs->pathEntryList(vfs->entry(u"SFTP/h"_s)).paths(),
         QStringList({u"_"_s, u"Network"_s, u"SFTP"_s, u"SFTP/h"_s}));
+}
+
+void MountUpdatesTest::absolutePathsMakeNoPlace()
+{
+    // Whoever can tell the service of a mount must not be able to lead "/etc" elsewhere.
+    const QStringList before = childPaths(u"SFTP"_s);
+    for (const QString& path :
+         {u"/etc"_s, u"//etc"_s, u"/etc/"_s, u"/"_s, u"//"_s, u"/etc/passwd"_s, u"/../etc"_s}) {
+        for (const QString& url : {u"ftp://redirect"_s, u"sftp://redirect"_s}) {
+            for (const int type : {4002, 4003, 2005, 3500, 10001}) {
+                QCOMPARE(
+                    mountNews(url, {path, u"/elsewhere"_s, type}),
+                    QStringList(u"mountAdded %1 -"_s.arg(url)));
+            }
+        }
+        QVERIFY2(!vfs->placeBase()->hasPlace(path), qPrintable(path));
+        QVERIFY2(
+            !vfs->entry(path).isPlace() || path == u"/"_s || path == u"//"_s, qPrintable(path));
+    }
+    QCOMPARE(childPaths(u"SFTP"_s), before);
+    QCOMPARE(vfs->localPath(u"/etc/passwd"_s), u"/etc/passwd"_s);
+    QCOMPARE(vfs->localPath(u"/etc"_s), u"/etc"_s);
+    QCOMPARE(vfs->entry(u"/"_s), vfs->fileSystemEntry());
 }
 
 void MountUpdatesTest::cleanupTestCase()

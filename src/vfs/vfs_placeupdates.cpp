@@ -178,6 +178,10 @@ EntryList VFSPrivate::addNetworkMounts(const QMap<QString, Entry>& mounts, bool 
     QList<Entry> ftpMounts;
     QList<Entry> sftpMounts;
     for (auto it = mounts.cbegin(); it != mounts.cend(); ++it) {
+        // As a place it would stand before the directory of that path.
+        if (it.value().m_path.startsWith(slash)) {
+            continue;
+        }
         const QString scheme = QUrl(it.key()).scheme();
         if (scheme == QLatin1String("ftp")) {
             ftpMounts.append(it.value());
