@@ -4,7 +4,7 @@
 #include "core/entry.h"
 
 #include "core/accountnames.h"
-#include "vfs/localbytes.h"
+#include "core/localbytes.h"
 #include "vfs/vfs.h"
 
 #include <QFileInfo>

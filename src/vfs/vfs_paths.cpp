@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "vfs/localbytes.h"
+#include "core/localbytes.h"
 #include "vfs/vfs_p.h"
 
 #include <QDir>
