@@ -3,6 +3,8 @@
 
 #include "support/entries.h"
 
+#include <QDataStream>
+
 #include <algorithm>
 #include <random>
 

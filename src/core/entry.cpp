@@ -7,6 +7,9 @@
 #include "core/localbytes.h"
 #include "vfs/vfs.h"
 
+#include <QDBusArgument>
+#include <QDataStream>
+#include <QDebug>
 #include <QFileInfo>
 #include <QHashFunctions>
 

@@ -6,11 +6,12 @@
 
 #include "veyfmvfs_export.h"
 
-#include <QDBusArgument>
-#include <QDataStream>
-#include <QDebug>
 #include <QMetaType>
 #include <QString>
+
+class QDBusArgument;
+class QDataStream;
+class QDebug;
 
 namespace VeyFM {
 

@@ -6,6 +6,8 @@
 #include "core/pathorder.h"
 #include "core/pathset.h"
 
+#include <QDBusArgument>
+
 #include <algorithm>
 
 namespace VeyFM {

@@ -4,6 +4,7 @@
 #ifndef VEYFM_TESTS_DBUSWIRE_H
 #define VEYFM_TESTS_DBUSWIRE_H
 
+#include <QDBusArgument>
 #include <QDBusConnection>
 #include <QDBusMessage>
 #include <QDBusPendingCallWatcher>
