@@ -1,6 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
+#include "vfs/directoryreader.h"
 #include "vfs/vfs_p.h"
 
 #include <QDir>
@@ -9,9 +10,7 @@
 
 #include <cerrno>
 #include <cstring>
-#include <memory>
 
-#include <dirent.h>
 #include <fcntl.h>
 #include <sys/stat.h>
 
@@ -19,41 +18,15 @@ namespace VeyFM {
 
 namespace {
 
-struct CloseStream
-{
-    void operator()(DIR* stream) const
-    {
-        ::closedir(stream);
-    }
-};
-using DirectoryStream = std::unique_ptr<DIR, CloseStream>;
-
-// A stream of one's own is safe to read with readdir(3) in any thread; readdir_r(3) is deprecated
-// and fails on long names.
-const dirent* nextRecord(const DirectoryStream& stream)
-{
-    return ::readdir(stream.get());
-}
-
-bool isDots(const char* name)
-{
-    return name[0] == '.' && (name[1] == '\0' || (name[1] == '.' && name[2] == '\0'));
-}
-
-// The system would end a path at its first NUL, and open another directory.
-DIR* openDirectory(const QByteArray& path)
-{
-    return path.contains('\0') ? nullptr : ::opendir(path.constData());
-}
-
-bool canOpenDirectory(const QByteArray& path)
-{
-    return DirectoryStream(::opendir(path.constData())) != nullptr;
-}
-
 bool isListable(const Entry& entry)
 {
     return entry.isDir() || entry.isDirPlace() || entry.isArchiveFileMountPoint();
+}
+
+// What a record does not tell: what can be opened as a directory is one.
+bool opensAsDirectory(const QByteArray& path)
+{
+    return DirectoryReader(path).isOpen();
 }
 
 // Where a chain of links ends, link by link, which finds the end also where the kernel gives up:
@@ -90,11 +63,6 @@ QString joinedAscii(const QString& prefix, const char* name, int length)
 
 } // namespace
 
-DIR* VFSPrivate::openListing(const QByteArray& directory)
-{
-    return openDirectory(directory);
-}
-
 EntryList VFS::childs(const Entry& entry, EntryChildFilters filter) const
 {
     Q_D(const VFS);
@@ -124,8 +92,8 @@ bool VFSPrivate::appendDirectory(
     if (!directory.endsWith('/')) {
         directory += '/';
     }
-    DirectoryStream stream(openListing(directory));
-    if (!stream) {
+    DirectoryReader reader(directory);
+    if (!reader.isOpen()) {
         return true;
     }
     const bool skipSymLinks = filter.testFlag(VFS::SkipSymLinks);
@@ -135,16 +103,16 @@ bool VFSPrivate::appendDirectory(
     const QString pathPrefix = resolveChildPath(entry, QString());
     const bool samePrefix = pathPrefix == localPrefix;
 
-    while (const dirent* record = nextRecord(stream)) {
+    while (const dirent* record = reader.next()) {
         const char* const name = record->d_name;
         const auto kind = record->d_type;
         // The dots come before the stop flag, so an empty directory leaves a pending stop alone.
-        if ((kind == DT_DIR || kind == DT_UNKNOWN) && isDots(name)) {
+        if ((kind == DT_DIR || kind == DT_UNKNOWN) && DirectoryReader::isDots(name)) {
             continue;
         }
         if (stopFlag.loadRelaxed() == 1 && stopFlag.testAndSetOrdered(1, 0)) {
             // A cancelled listing abandons its stream. That is how it stands.
-            (void)stream.release();
+            reader.abandon();
             return false;
         }
         // A link that is left out still takes a pending stop.
@@ -175,12 +143,12 @@ bool VFSPrivate::appendDirectory(
         }
 
         int type = TypeFile;
-        if (kind == DT_DIR || (kind == DT_UNKNOWN && canOpenDirectory(directory + name))) {
+        if (kind == DT_DIR || (kind == DT_UNKNOWN && opensAsDirectory(directory + name))) {
             type = TypeDir;
         } else if (kind == DT_LNK) {
             struct stat status;
             bool isDirectory = false;
-            if (isValidName && ::fstatat(::dirfd(stream.get()), name, &status, 0) == 0) {
+            if (isValidName && ::fstatat(reader.descriptor(), name, &status, 0) == 0) {
                 isDirectory = S_ISDIR(status.st_mode);
             } else if (!isValidName || errno == ELOOP) {
                 isDirectory = chainEndsAtDirectory(local);
@@ -214,13 +182,13 @@ bool VFS::containsDirsOrPlaces(const Entry& entry) const
     if (directory.isEmpty() || !isListable(entry)) {
         return false;
     }
-    const DirectoryStream stream(openDirectory(directory));
-    while (const dirent* record = stream ? nextRecord(stream) : nullptr) {
+    DirectoryReader reader(directory);
+    while (const dirent* record = reader.next()) {
         const auto kind = record->d_type;
-        if ((kind != DT_DIR && kind != DT_UNKNOWN) || isDots(record->d_name)) {
+        if ((kind != DT_DIR && kind != DT_UNKNOWN) || DirectoryReader::isDots(record->d_name)) {
             continue;
         }
-        if (kind == DT_DIR || canOpenDirectory(directory + '/' + record->d_name)) {
+        if (kind == DT_DIR || opensAsDirectory(directory + '/' + record->d_name)) {
             return true;
         }
     }
@@ -240,9 +208,9 @@ bool VFS::hasChilds(const Entry& entry) const
     // and one that can't be read has none. To meet one of the two settles it.
     const QString local = entry.localPath();
     if (!local.isEmpty()) {
-        const DirectoryStream stream(openDirectory(local.toLocal8Bit()));
-        while (const dirent* record = stream ? nextRecord(stream) : nullptr) {
-            if (isDots(record->d_name)) {
+        DirectoryReader reader(local.toLocal8Bit());
+        while (const dirent* record = reader.next()) {
+            if (DirectoryReader::isDots(record->d_name)) {
                 return true;
             }
         }

@@ -26,8 +26,6 @@
 
 #include <memory>
 
-struct __dirstream;
-
 namespace VeyFM {
 
 /// The one watcher that VFS tells of resets, through a slot that is closed to hosts.
@@ -74,7 +72,6 @@ public:
     bool appendDirectory(
         const Entry& entry, const QString& localPath, VFS::EntryChildFilters filter,
         EntryList* children) const;
-    static __dirstream* openListing(const QByteArray& directory);
 
     /// The URL of a bookmark, or of something below it, by its path behind the Network place.
     QString bookmarkUrl(const QString& relativePath) const;

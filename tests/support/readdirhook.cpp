@@ -3,17 +3,33 @@
 
 #include "support/readdirhook.h"
 
+#include <cerrno>
+
 #include <dlfcn.h>
 
 namespace {
 
 ReaddirHook::Hook currentHook;
 ReaddirHook::Ending currentEnding = ReaddirHook::AsOnDisk;
+ReaddirHook::Failure currentFailure;
+
+// Whether the call fails, with errno set.
+bool fails(ReaddirHook::Call call)
+{
+    const int error = currentFailure ? currentFailure(call) : 0;
+    if (error != 0) {
+        errno = error;
+    }
+    return error != 0;
+}
 
 dirent* readRecord(DIR* stream)
 {
     using Readdir = dirent* (*)(DIR*);
     static const auto next = reinterpret_cast<Readdir>(::dlsym(RTLD_NEXT, "readdir"));
+    if (fails(ReaddirHook::Read)) {
+        return nullptr;
+    }
     dirent* record = next(stream);
     if (!record && currentEnding == ReaddirHook::Endless) {
         ::rewinddir(stream);
@@ -25,6 +41,13 @@ dirent* readRecord(DIR* stream)
     return record;
 }
 
+DIR* openStream(const char* path)
+{
+    using Opendir = DIR* (*)(const char*);
+    static const auto open = reinterpret_cast<Opendir>(::dlsym(RTLD_NEXT, "opendir"));
+    return fails(ReaddirHook::Open) ? nullptr : open(path);
+}
+
 } // namespace
 
 void ReaddirHook::set(const Hook& hook, Ending ending)
@@ -33,9 +56,15 @@ void ReaddirHook::set(const Hook& hook, Ending ending)
     currentEnding = ending;
 }
 
+void ReaddirHook::setFailure(const Failure& failure)
+{
+    currentFailure = failure;
+}
+
 void ReaddirHook::clear()
 {
     set(Hook());
+    setFailure(Failure());
 }
 
 extern "C" {
@@ -43,6 +72,11 @@ extern "C" {
 __attribute__((visibility("default"))) dirent* readdir(DIR* stream)
 {
     return readRecord(stream);
+}
+
+__attribute__((visibility("default"))) DIR* opendir(const char* path)
+{
+    return openStream(path);
 }
 
 } // extern "C"
