@@ -58,8 +58,13 @@ class TestInotifyWatcherStress : public QObject
 private Q_SLOTS:
     void withoutInotifyInstance();
     void largeBatch();
-    void queueOverflow();
     void manyWatches();
+    void nestedBatches();
+    void nestedEventLoop();
+    void nestedWithinOneEvent();
+    void nestedWithinVerdict();
+    void verdictWithinBatch();
+    void nestedDeletion();
     void slotRemovesPath();
     void slotAddsPath();
     void slotDeletesWatcher_data();
@@ -107,32 +112,6 @@ void TestInotifyWatcherStress::largeBatch()
     QCOMPARE(scene.processedLog(), expected); // one run: 300 times 48 bytes
 }
 
-void TestInotifyWatcherStress::queueOverflow()
-{
-    QFile limitFile(QStringLiteral("/proc/sys/fs/inotify/max_queued_events"));
-    QVERIFY(limitFile.open(QIODevice::ReadOnly));
-    const int limit = limitFile.readAll().trimmed().toInt();
-    if (limit > 200000) {
-        QSKIP("The kernel's event queue is too long to be filled here.");
-    }
-
-    WatchScene scene;
-    QVERIFY(scene.makeDir("dir"));
-    QVERIFY(scene.write("dir/a") && scene.write("dir/b"));
-    QVERIFY(scene.add("dir"));
-    const QByteArray a = QFile::encodeName(scene.path("dir/a"));
-    const QByteArray b = QFile::encodeName(scene.path("dir/b"));
-    for (int i = 0; i < limit + 100; ++i) { // equal events in a row would be merged
-        QCOMPARE(chmod(i % 2 == 0 ? a.constData() : b.constData(), 0600), 0);
-    }
-    const QStringList log = scene.processedLog();
-    QCOMPARE(log.size(), limit);
-    QCOMPARE(log.count(QStringLiteral("attributes dir|a")), (limit + 1) / 2);
-    QCOMPARE(log.count(QStringLiteral("attributes dir|b")), limit / 2);
-    QVERIFY(scene.unlink("dir/a"));
-    QCOMPARE(scene.processedLog(), lines({"deleted dir|a"}));
-}
-
 void TestInotifyWatcherStress::manyWatches()
 {
     WatchScene scene;
@@ -158,6 +137,127 @@ void TestInotifyWatcherStress::manyWatches()
     QCOMPARE(scene.processedLog(), expected);
     QVERIFY(scene.watcher->clear());
     QCOMPARE(WatchScene::kernelWatchCount(), 0);
+}
+
+// An event loop in a slot reads a newer batch. It is told behind the rest of the older one.
+void TestInotifyWatcherStress::nestedBatches()
+{
+    WatchScene scene;
+    QVERIFY(scene.makeDir("dir") && scene.makeDir("dir/x"));
+    QVERIFY(scene.add("dir"));
+    int depth = 0;
+    connect(scene.watcher.get(), &InotifyWatcher::pathCreated, scene.watcher.get(), [&] {
+        if (++depth == 1) {
+            scene.makeDir("dir/x");
+            scene.process();
+        } else if (depth == 2) {
+            scene.makeDir("dir/b");
+            scene.process();
+        }
+    });
+    QVERIFY(scene.makeDir("dir/a") && scene.removeDir("dir/x"));
+    QCOMPARE(
+        scene.processedLog(),
+        lines({"created dir|a", "deleted dir|x", "created dir|x", "created dir|b"}));
+    QCOMPARE(scene.processedLog(), QStringList());
+}
+
+void TestInotifyWatcherStress::nestedEventLoop()
+{
+    WatchScene scene;
+    QVERIFY(scene.makeDir("dir") && scene.makeDir("dir/x"));
+    QVERIFY(scene.add("dir"));
+    const auto runLoop = [&scene] {
+        scene.makeDir("dir/x");
+        QTRY_COMPARE(scene.log.size(), 3);
+    };
+    QMetaObject::Connection once;
+    once = connect(scene.watcher.get(), &InotifyWatcher::pathCreated, scene.watcher.get(), [&] {
+        disconnect(once);
+        runLoop();
+    });
+    QVERIFY(scene.makeDir("dir/a") && scene.removeDir("dir/x"));
+    QTRY_VERIFY(!scene.log.isEmpty());
+    QCOMPARE(scene.takeLog(), lines({"created dir|a", "deleted dir|x", "created dir|x"}));
+}
+
+// The links to a directory are told what happened there before anything newer is told at all.
+void TestInotifyWatcherStress::nestedWithinOneEvent()
+{
+    WatchScene scene;
+    QVERIFY(scene.makeDir("target") && scene.makeDir("target/x"));
+    QVERIFY(scene.makeLink("target", "link") && scene.add("link"));
+    QMetaObject::Connection once;
+    once = connect(scene.watcher.get(), &InotifyWatcher::pathDeleted, scene.watcher.get(), [&] {
+        disconnect(once);
+        scene.makeDir("target/x");
+        scene.process();
+    });
+    QVERIFY(scene.removeDir("target/x"));
+    QCOMPARE(
+        scene.processedLog(),
+        lines({"deleted target|x", "deleted link|x", "created target|x", "created link|x"}));
+}
+
+void TestInotifyWatcherStress::nestedWithinVerdict()
+{
+    WatchScene scene;
+    QVERIFY(scene.makeDir("dir") && scene.makeDir("target"));
+    QVERIFY(scene.makeLink("target", "dir/a") && scene.makeLink("target", "dir/b"));
+    QVERIFY(scene.add("dir") && scene.add("dir/a") && scene.add("dir/b"));
+    QVERIFY(scene.unlink("dir/a") && scene.unlink("dir/b"));
+    QCOMPARE(scene.processedLogWithoutAttributes(), QStringList());
+    QMetaObject::Connection once;
+    once = connect(scene.watcher.get(), &InotifyWatcher::pathDeleted, scene.watcher.get(), [&] {
+        disconnect(once);
+        scene.makeLink("target", "dir/a");
+        scene.makeLink("target", "dir/b");
+        scene.process();
+    });
+    QVERIFY(scene.call("notifyDeletedSymlinks"));
+    QStringList log = scene.takeLog();
+    QCOMPARE(log.mid(4), lines({"created dir|a", "created dir|b"}));
+    log = log.mid(0, 4);
+    std::sort(log.begin(), log.end());
+    QCOMPARE(
+        log,
+        lines({"deleted dir/a|", "deleted dir/b|", "unregistered dir/a", "unregistered dir/b"}));
+    QVERIFY(!scene.isRegistered("dir/a"));
+    QVERIFY(scene.call("notifyDeletedSymlinks"));
+    QCOMPARE(scene.takeLog(), QStringList());
+}
+
+// A link that has come back is not given up, however long a slot kept its return from being seen.
+void TestInotifyWatcherStress::verdictWithinBatch()
+{
+    WatchScene scene;
+    QVERIFY(scene.makeDir("dir") && scene.makeDir("target"));
+    QVERIFY(scene.makeLink("target", "dir/link"));
+    QVERIFY(scene.add("dir") && scene.add("dir/link"));
+    connect(scene.watcher.get(), &InotifyWatcher::pathCreated, scene.watcher.get(), [&] {
+        scene.call("notifyDeletedSymlinks");
+    });
+    QVERIFY(scene.unlink("dir/link") && scene.makeDir("dir/a"));
+    QVERIFY(scene.makeLink("target", "dir/link"));
+    QCOMPARE(scene.processedLogWithoutAttributes(), lines({"created dir|a", "changed dir/link|"}));
+    QVERIFY(scene.isLinkRegistered("dir/link"));
+}
+
+void TestInotifyWatcherStress::nestedDeletion()
+{
+    WatchScene scene;
+    QVERIFY(scene.makeDir("dir") && scene.add("dir"));
+    int depth = 0;
+    connect(scene.watcher.get(), &InotifyWatcher::pathCreated, scene.watcher.get(), [&] {
+        if (++depth == 1) {
+            scene.process();
+        } else {
+            scene.watcher.reset();
+        }
+    });
+    QVERIFY(scene.makeDir("dir/1") && scene.makeDir("dir/2") && scene.makeDir("dir/3"));
+    QTRY_VERIFY(!scene.watcher);
+    QCOMPARE(scene.takeLog(), lines({"created dir|1", "created dir|2"}));
 }
 
 void TestInotifyWatcherStress::slotRemovesPath()

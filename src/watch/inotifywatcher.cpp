@@ -3,6 +3,7 @@
 
 #include "watch/inotifywatcher.h"
 
+#include "watch/eventqueue.h"
 #include "watch/linktable.h"
 #include "watch/watchtable.h"
 
@@ -11,16 +12,13 @@
 #include <QSet>
 #include <QSocketNotifier>
 #include <QStringBuilder>
+#include <QStringList>
 #include <QTimer>
 
-#include <algorithm>
 #include <cerrno>
-#include <climits>
-#include <cstdlib>
 #include <cstring>
 
 #include <sys/inotify.h>
-#include <sys/ioctl.h>
 #include <unistd.h>
 
 namespace VeyFM {
@@ -45,61 +43,6 @@ constexpr PathSignal Deleted{&InotifyWatcher::pathDeleted, "pathDeleted"};
 constexpr PathSignal Changed{&InotifyWatcher::pathChanged, "pathChanged"};
 constexpr PathSignal AttributesChanged{
     &InotifyWatcher::pathAttributesChanged, "pathAttributesChanged"};
-
-// The events that wait, taken whole. The usual batch takes one read and fits on the stack.
-class EventBatch
-{
-public:
-    explicit EventBatch(int fd)
-        : m_size(read(fd, m_stack, sizeof(m_stack)))
-    {
-        // A read gives as many whole events as fit. Where one more would have fitted, none waits.
-        if (m_size > ssize_t(sizeof(m_stack) - LargestEvent)) {
-            readRest(fd);
-        }
-    }
-
-    const char* data() const
-    {
-        return m_heap ? m_heap.get() : m_stack;
-    }
-
-    /// In bytes, negative if nothing waited.
-    ssize_t size() const
-    {
-        return m_size;
-    }
-
-private:
-    struct Free
-    {
-        void operator()(char* memory) const
-        {
-            std::free(memory);
-        }
-    };
-
-    static constexpr size_t LargestEvent = sizeof(inotify_event) + NAME_MAX + 1;
-
-    void readRest(int fd)
-    {
-        int waiting = 0;
-        ioctl(fd, FIONREAD, &waiting);
-        if (waiting <= 0) {
-            return;
-        }
-        m_heap.reset(static_cast<char*>(std::malloc(size_t(m_size + waiting))));
-        if (!m_heap) {
-            qBadAlloc();
-        }
-        std::memcpy(m_heap.get(), m_stack, size_t(m_size));
-        m_size += std::max(ssize_t(0), read(fd, m_heap.get() + m_size, size_t(waiting)));
-    }
-
-    alignas(inotify_event) char m_stack[4096];
-    std::unique_ptr<char, Free> m_heap;
-    ssize_t m_size;
-};
 
 // Most watched paths are no links, which one readlink() tells more cheaply than any stat.
 bool isSymLink(const QString& path, const QByteArray& localPath)
@@ -143,19 +86,57 @@ public:
         return inotify_add_watch(fd, localPath.constData(), WatchMask);
     }
 
-    // These return false if a slot has deleted the watcher, and this object with it.
-    bool processEvents(const char* events, ssize_t size);
-    bool processEvent(const inotify_event& event);
-    bool childAppeared(uint32_t mask, const QString& path, const QString& fileName);
-    bool childWentAway(uint32_t mask, const QString& path, const QString& fileName);
-    bool selfWentAway(uint32_t mask, const QString& path, const QString& fileName);
-    bool notify(const PathSignal& signal, const QString& path, const QString& fileName);
+    /**
+     * Tells all that there is to tell. A slot that runs an event loop may lead back here, and then
+     * the inner call goes on where the outer one stands: news are told in the order in which they
+     * came, and the outer call finds nothing left.
+     *
+     * False if a slot has deleted the watcher, and this object with it.
+     */
+    bool tellAll();
+
+    void readEvents();
 
     InotifyWatcher* const q;
     const int fd; // negative if the kernel granted no instance; a read never blocks
     WatchTable watches;
     LinkTable links;
     QSet<QString> deletedSymlinks; // links that wait for the verdict, still among the watches
+    bool isVerdictDue = false;
+
+private:
+    // Each tells one thing at most, as the last that it does: a slot may delete this object.
+    bool step();
+    void beginEvent(const inotify_event& event);
+    void tellEffect();
+    void childAppeared(uint32_t bits);
+    void childWentAway(uint32_t bits);
+    void selfWentAway(uint32_t bits);
+    void tellOfChild(const PathSignal& signal);
+    void tell(const PathSignal& signal, const PathSignal* signalToLinks);
+    void tellNextLink();
+    void tellDeletedLink();
+    void forgetDeletedLink();
+
+    uint32_t takeBits(uint32_t bits)
+    {
+        const uint32_t taken = effects & bits;
+        effects &= ~bits;
+        return taken;
+    }
+
+    EventQueue events;
+    // What is being told, and which bits of it have not been looked at yet.
+    QString path;
+    QString fileName;
+    uint32_t effects = 0;
+    // What the links to that path are to be told, and which of them still are.
+    const PathSignal* linkSignal = nullptr;
+    bool areLinksDue = false;
+    QStringList linksToTell;
+    // The verdict at hand: which links are to be told deleted, and forgotten then.
+    QStringList linksToDelete;
+    QStringList linksToForget;
 };
 
 InotifyWatcher::InotifyWatcher(QObject* parent)
@@ -282,11 +263,9 @@ void InotifyWatcher::notifySymlinks(
 
 void InotifyWatcher::processInotifyMessages()
 {
-    {
-        const EventBatch events(d->fd);
-        if (!d->processEvents(events.data(), events.size())) {
-            return;
-        }
+    d->readEvents();
+    if (!d->tellAll()) {
+        return;
     }
 
     // Each run starts a timer of its own and the first to fire settles all links, so a link that
@@ -298,141 +277,167 @@ void InotifyWatcher::processInotifyMessages()
 
 void InotifyWatcher::notifyDeletedSymlinks()
 {
-    const QPointer<InotifyWatcher> alive(this);
-
-    // All are told of the deletions before anything is forgotten.
-    const QSet<QString> deleted = d->deletedSymlinks;
-    for (const QString& link : deleted) {
-        Q_EMIT pathDeleted(link, QString());
-        if (alive) {
-            notifySymlinks(Changed.name, link, QString());
-        }
-        if (!alive) {
-            return;
-        }
-    }
-    const QSet<QString> forgotten = d->deletedSymlinks;
-    for (const QString& link : forgotten) {
-        removePath(link, false);
-        Q_EMIT pathUnregistered(link);
-        if (!alive) {
-            return;
-        }
-    }
-    d->deletedSymlinks.clear();
+    d->isVerdictDue = true;
+    d->tellAll();
 }
 
-bool InotifyWatcherPrivate::processEvents(const char* events, ssize_t size)
+void InotifyWatcherPrivate::readEvents()
 {
-    ssize_t offset = 0;
-    while (offset < size) {
-        const auto* event = reinterpret_cast<const inotify_event*>(events + offset);
-        if (!processEvent(*event)) {
+    events.fill(fd);
+}
+
+bool InotifyWatcherPrivate::tellAll()
+{
+    const QPointer<InotifyWatcher> alive(q);
+    while (step()) {
+        if (!alive) {
             return false;
         }
-        offset += ssize_t(sizeof(inotify_event) + event->len);
     }
     return true;
+}
+
+// What has begun comes to its end before anything newer begins. False when nothing is left.
+bool InotifyWatcherPrivate::step()
+{
+    if (areLinksDue) {
+        // Only now, since the slots of the target may have added and removed links.
+        areLinksDue = false;
+        linksToTell = links.links(path).values();
+    } else if (!linksToTell.isEmpty()) {
+        tellNextLink();
+    } else if (effects != 0) {
+        tellEffect();
+    } else if (!linksToDelete.isEmpty()) {
+        tellDeletedLink();
+    } else if (!linksToForget.isEmpty()) {
+        forgetDeletedLink();
+    } else if (const inotify_event* const event = events.take()) {
+        beginEvent(*event);
+    } else if (isVerdictDue) {
+        isVerdictDue = false;
+        linksToDelete = linksToForget = deletedSymlinks.values();
+    } else {
+        return false;
+    }
+    return true;
+}
+
+void InotifyWatcherPrivate::beginEvent(const inotify_event& event)
+{
+    // No path: the watch was dropped since, maybe by a slot, or the queue overflowed.
+    path = watches.firstPath(event.wd);
+    if (!path.isEmpty()) {
+        fileName = event.len == 0 ? QString() : QString::fromLocal8Bit(event.name);
+        effects = event.mask;
+    }
 }
 
 // One event may carry several bits, and the order in which they are looked at is fixed.
-bool InotifyWatcherPrivate::processEvent(const inotify_event& event)
+void InotifyWatcherPrivate::tellEffect()
 {
-    // No path: the watch was dropped since, maybe by a slot, or the queue overflowed.
-    const QString path = watches.firstPath(event.wd);
-    if (path.isEmpty()) {
-        return true;
-    }
-    const QString fileName = event.len == 0 ? QString() : QString::fromLocal8Bit(event.name);
-    const uint32_t mask = event.mask;
-
-    if ((mask & IN_IGNORED) && !deletedSymlinks.contains(path)) {
-        const QPointer<InotifyWatcher> alive(q);
-        q->removePath(path, false);
-        Q_EMIT q->pathUnregistered(path);
-        if (!alive) {
-            return false;
+    if (takeBits(IN_IGNORED)) {
+        if (!deletedSymlinks.contains(path)) {
+            const QString ended = path;
+            q->removePath(ended, false);
+            Q_EMIT q->pathUnregistered(ended);
         }
+    } else if (const uint32_t appeared = takeBits(IN_CREATE | IN_MOVED_TO)) {
+        childAppeared(appeared);
+    } else if (const uint32_t gone = takeBits(IN_DELETE | IN_MOVED_FROM)) {
+        childWentAway(gone);
+    } else if (const uint32_t selfGone = takeBits(IN_DELETE_SELF | IN_MOVE_SELF)) {
+        selfWentAway(selfGone);
+    } else if (takeBits(IN_CLOSE_WRITE)) {
+        tellOfChild(Changed);
+    } else if (takeBits(IN_ATTRIB)) {
+        tellOfChild(AttributesChanged);
+    } else {
+        effects = 0;
     }
-    if ((mask & (IN_CREATE | IN_MOVED_TO)) && !childAppeared(mask, path, fileName)) {
-        return false;
-    }
-    if ((mask & (IN_DELETE | IN_MOVED_FROM)) && !childWentAway(mask, path, fileName)) {
-        return false;
-    }
-    if ((mask & (IN_DELETE_SELF | IN_MOVE_SELF)) && !selfWentAway(mask, path, fileName)) {
-        return false;
-    }
-    if ((mask & IN_CLOSE_WRITE) && !notify(Changed, path, fileName)) {
-        return false;
-    }
-    if ((mask & IN_ATTRIB) && !notify(AttributesChanged, path, fileName)) {
-        return false;
-    }
-    return true;
 }
 
-bool InotifyWatcherPrivate::childAppeared(
-    uint32_t mask, const QString& path, const QString& fileName)
+void InotifyWatcherPrivate::childAppeared(uint32_t bits)
 {
     // Only a link that is made anew ends the wait: one that is moved here is an ordinary arrival.
-    if ((mask & IN_CREATE) && !deletedSymlinks.isEmpty()) {
+    if ((bits & IN_CREATE) && !deletedSymlinks.isEmpty()) {
         const QString full = childPath(path, fileName);
         if (deletedSymlinks.remove(full)) {
             q->removePath(full, false);
             if (QFileInfo(full).isSymLink()) {
-                const QPointer<InotifyWatcher> alive(q);
                 q->addPath(full);
                 Q_EMIT q->pathChanged(full, QString());
-                return alive;
+                return;
             }
         }
     }
-    return notify(Created, path, fileName);
+    tellOfChild(Created);
 }
 
-bool InotifyWatcherPrivate::childWentAway(
-    uint32_t mask, const QString& path, const QString& fileName)
+void InotifyWatcherPrivate::childWentAway(uint32_t bits)
 {
     // Only a deletion is held back: a link that is moved away is reported at once.
-    if ((mask & IN_DELETE) && !links.isEmpty()) {
+    if ((bits & IN_DELETE) && !links.isEmpty()) {
         const QString full = childPath(path, fileName);
         if (links.contains(full)) {
             deletedSymlinks.insert(full);
-            return true;
+            return;
         }
     }
-    return notify(Deleted, path, fileName);
+    tell(Deleted, &Deleted);
 }
 
-bool InotifyWatcherPrivate::selfWentAway(
-    uint32_t mask, const QString& path, const QString& fileName)
+void InotifyWatcherPrivate::selfWentAway(uint32_t bits)
 {
-    if ((mask & IN_DELETE_SELF) && links.contains(path)) {
+    if ((bits & IN_DELETE_SELF) && links.contains(path)) {
         deletedSymlinks.insert(path);
-        return true;
+        return;
     }
-    const QPointer<InotifyWatcher> alive(q);
     q->removePath(path, true);
-    Q_EMIT q->pathDeleted(path, fileName);
     // The other way round than everywhere else: links are told of the loss of their target
     // itself, and for them that is a change.
-    if (alive && fileName.isEmpty()) {
-        q->notifySymlinks(Changed.name, path, fileName);
-    }
-    return alive;
+    tell(Deleted, fileName.isEmpty() ? &Changed : nullptr);
 }
 
 // Links are told of what happens to a child of their target, not of what happens to the target.
-bool InotifyWatcherPrivate::notify(
-    const PathSignal& signal, const QString& path, const QString& fileName)
+void InotifyWatcherPrivate::tellOfChild(const PathSignal& signal)
 {
-    const QPointer<InotifyWatcher> alive(q);
-    Q_EMIT(q->*signal.emitter)(path, fileName);
-    if (alive && !fileName.isEmpty()) {
-        q->notifySymlinks(signal.name, path, fileName);
+    tell(signal, fileName.isEmpty() ? nullptr : &signal);
+}
+
+void InotifyWatcherPrivate::tell(const PathSignal& signal, const PathSignal* signalToLinks)
+{
+    linkSignal = signalToLinks;
+    areLinksDue = signalToLinks != nullptr;
+    // Copies, which stay while an event loop of the slot goes on with the next event.
+    const QString toldPath = path;
+    const QString toldName = fileName;
+    Q_EMIT(q->*signal.emitter)(toldPath, toldName);
+}
+
+void InotifyWatcherPrivate::tellNextLink()
+{
+    const QString link = linksToTell.takeLast();
+    if (!deletedSymlinks.contains(link)) {
+        const QString toldName = fileName;
+        Q_EMIT(q->*linkSignal->emitter)(link, toldName);
     }
-    return alive;
+}
+
+void InotifyWatcherPrivate::tellDeletedLink()
+{
+    path = linksToDelete.takeLast();
+    fileName.clear();
+    tell(Deleted, &Changed);
+}
+
+// Not before all are told of the deletions.
+void InotifyWatcherPrivate::forgetDeletedLink()
+{
+    const QString link = linksToForget.takeLast();
+    q->removePath(link, false);
+    deletedSymlinks.remove(link);
+    Q_EMIT q->pathUnregistered(link);
 }
 
 } // namespace VeyFM

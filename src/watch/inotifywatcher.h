@@ -32,7 +32,9 @@ class InotifyWatcherPrivate;
  *
  * Not thread-safe: everything happens on the thread of the object, which needs a running event
  * loop. Signals are emitted synchronously from there. A connected slot may add and remove paths
- * and may delete the watcher.
+ * and may delete the watcher. It may also run an event loop, a dialog's say: whatever is reported
+ * there comes in the order in which it happened, with the rest of what was being reported first.
+ * Only of the signal at hand, slots that are connected behind that one hear when it returns.
  */
 class VEYFMVFS_EXPORT InotifyWatcher : public QObject
 {
@@ -48,10 +50,10 @@ public:
     /**
      * Watches @p path, and the target as well if it is a symbolic link.
      *
-     * @return true if a new watch was registered. False if the path is empty or watched already,
-     * if there is no inotify instance, or if the kernel refuses (no such path, no permission,
-     * watch limit reached). Also false for a link whose target can't be watched; the link itself
-     * is watched then nevertheless.
+     * @return true if a new watch was registered. False if the path is empty or is
+     * watched already, if there is no inotify instance, or if the kernel refuses (no such path,
+     * no permission, watch limit reached). Also false for a link whose target can't be watched;
+     * the link itself is watched then nevertheless.
      */
     bool addPath(const QString& path);
 
@@ -92,7 +94,8 @@ public:
     void notifySymlinks(const char* signal, const QString& path, const QString& fileName);
 
 Q_SIGNALS:
-    /// @p path is no longer watched, because it is gone. Not emitted by removePath() and clear().
+    /// The kernel no longer watches @p path, as a rule because it is gone. Not emitted by
+    /// removePath() and clear().
     void pathUnregistered(const QString& path);
 
     /// The child @p fileName appeared in the directory @p path.
