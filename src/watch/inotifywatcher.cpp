@@ -3,6 +3,7 @@
 
 #include "watch/inotifywatcher.h"
 
+#include "core/localbytes.h"
 #include "watch/eventqueue.h"
 #include "watch/linktable.h"
 #include "watch/watchtable.h"
@@ -16,7 +17,6 @@
 #include <QTimer>
 
 #include <cerrno>
-#include <cstring>
 
 #include <sys/inotify.h>
 #include <unistd.h>
@@ -45,12 +45,12 @@ constexpr PathSignal AttributesChanged{
     &InotifyWatcher::pathAttributesChanged, "pathAttributesChanged"};
 
 // Most watched paths are no links, which one readlink() tells more cheaply than any stat.
-bool isSymLink(const QString& path, const QByteArray& localPath)
+bool isSymLink(const QString& path, const LocalBytes& localPath)
 {
+    // QFileInfo takes what begins with a colon for a resource of the program, and no file.
     char firstByte;
-    const bool sameFile = path.startsWith(QLatin1Char('/')) &&
-                          std::strlen(localPath.constData()) == size_t(localPath.size());
-    if (sameFile && readlink(localPath.constData(), &firstByte, 1) == -1 && errno == EINVAL) {
+    if (path.startsWith(QLatin1Char('/')) && readlink(localPath.data(), &firstByte, 1) == -1 &&
+        errno == EINVAL) {
         return false;
     }
     return QFileInfo(path).isSymLink();
@@ -81,9 +81,10 @@ public:
 
     Q_DISABLE_COPY(InotifyWatcherPrivate)
 
-    int addWatch(const QByteArray& localPath) const
+    int addWatch(const LocalBytes& localPath) const
     {
-        return inotify_add_watch(fd, localPath.constData(), WatchMask);
+        // The system would end a path at its first NUL, and watch another one.
+        return localPath.isUsable() ? inotify_add_watch(fd, localPath.data(), WatchMask) : -1;
     }
 
     /**
@@ -162,7 +163,7 @@ bool InotifyWatcher::addPath(const QString& path)
         return false;
     }
 
-    const QByteArray localPath = path.toLocal8Bit();
+    const LocalBytes localPath(path);
     const int descriptor = d->addWatch(localPath);
     if (descriptor == -1) {
         return false;
@@ -174,7 +175,7 @@ bool InotifyWatcher::addPath(const QString& path)
 
     const QString target = QFileInfo(path).symLinkTarget();
     if (!d->links.isTarget(target)) {
-        const int targetDescriptor = d->addWatch(target.toLocal8Bit());
+        const int targetDescriptor = d->addWatch(LocalBytes(target));
         // The link stays watched, although the caller is told of a failure.
         if (targetDescriptor == -1) {
             return false;

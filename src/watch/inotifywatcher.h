@@ -50,7 +50,7 @@ public:
     /**
      * Watches @p path, and the target as well if it is a symbolic link.
      *
-     * @return true if a new watch was registered. False if the path is empty or is
+     * @return true if a new watch was registered. False if the path is empty, holds a NUL or is
      * watched already, if there is no inotify instance, or if the kernel refuses (no such path,
      * no permission, watch limit reached). Also false for a link whose target can't be watched;
      * the link itself is watched then nevertheless.
