@@ -5,6 +5,7 @@
 
 #include "core/localbytes.h"
 #include "watch/eventqueue.h"
+#include "watch/kernelwatches.h"
 #include "watch/linktable.h"
 #include "watch/watchtable.h"
 
@@ -97,6 +98,7 @@ public:
     bool tellAll();
 
     void readEvents();
+    void findLostWatches();
 
     InotifyWatcher* const q;
     const int fd; // negative if the kernel granted no instance; a read never blocks
@@ -104,6 +106,7 @@ public:
     LinkTable links;
     QSet<QString> deletedSymlinks; // links that wait for the verdict, still among the watches
     bool isVerdictDue = false;
+    bool isOverflowed = false;
 
 private:
     // Each tells one thing at most, as the last that it does: a slot may delete this object.
@@ -118,6 +121,7 @@ private:
     void tellNextLink();
     void tellDeletedLink();
     void forgetDeletedLink();
+    void dropLostWatch();
 
     uint32_t takeBits(uint32_t bits)
     {
@@ -138,6 +142,7 @@ private:
     // The verdict at hand: which links are to be told deleted, and forgotten then.
     QStringList linksToDelete;
     QStringList linksToForget;
+    QVector<WatchTable::Watch> lostWatches;
 };
 
 InotifyWatcher::InotifyWatcher(QObject* parent)
@@ -268,6 +273,16 @@ void InotifyWatcher::processInotifyMessages()
     if (!d->tellAll()) {
         return;
     }
+    if (d->isOverflowed) {
+        d->findLostWatches();
+        if (!d->tellAll()) {
+            return;
+        }
+    }
+    // Not at once, since events that come faster than they are told would never let go of us.
+    if (d->isOverflowed) {
+        QTimer::singleShot(0, this, &InotifyWatcher::processInotifyMessages);
+    }
 
     // Each run starts a timer of its own and the first to fire settles all links, so a link that
     // is deleted while a timer runs gets less than the full time.
@@ -285,6 +300,19 @@ void InotifyWatcher::notifyDeletedSymlinks()
 void InotifyWatcherPrivate::readEvents()
 {
     events.fill(fd);
+}
+
+// The kernel has dropped events, and the end of a watch may have been one of them. Its record
+// would stand in the way of watching that path ever again.
+void InotifyWatcherPrivate::findLostWatches()
+{
+    isOverflowed = false;
+    if (const auto known = kernelWatches(fd)) {
+        lostWatches = watches.without(*known);
+    }
+    // What the kernel reported before it was asked is told first: an end that is on its way yet
+    // is not lost.
+    readEvents();
 }
 
 bool InotifyWatcherPrivate::tellAll()
@@ -318,6 +346,8 @@ bool InotifyWatcherPrivate::step()
     } else if (isVerdictDue) {
         isVerdictDue = false;
         linksToDelete = linksToForget = deletedSymlinks.values();
+    } else if (!lostWatches.isEmpty()) {
+        dropLostWatch();
     } else {
         return false;
     }
@@ -326,6 +356,7 @@ bool InotifyWatcherPrivate::step()
 
 void InotifyWatcherPrivate::beginEvent(const inotify_event& event)
 {
+    isOverflowed = isOverflowed || (event.mask & IN_Q_OVERFLOW);
     // No path: the watch was dropped since, maybe by a slot, or the queue overflowed.
     path = watches.firstPath(event.wd);
     if (!path.isEmpty()) {
@@ -439,6 +470,18 @@ void InotifyWatcherPrivate::forgetDeletedLink()
     q->removePath(link, false);
     deletedSymlinks.remove(link);
     Q_EMIT q->pathUnregistered(link);
+}
+
+// A target goes too: its links stay known, and are told again once it is watched anew.
+void InotifyWatcherPrivate::dropLostWatch()
+{
+    const WatchTable::Watch lost = lostWatches.takeFirst();
+    // Maybe its end was told after all, or a slot has begun a new watch.
+    if (watches.descriptor(lost.path) == lost.descriptor && !deletedSymlinks.contains(lost.path)) {
+        links.forget(lost.path);
+        watches.remove(lost.path);
+        Q_EMIT q->pathUnregistered(lost.path);
+    }
 }
 
 } // namespace VeyFM

@@ -28,7 +28,10 @@ class InotifyWatcherPrivate;
  * replaced is reported as changed rather than as deleted and created.
  *
  * If the kernel grants no inotify instance, the watcher stays usable and does nothing. Events
- * that the kernel drops because its queue is full are lost without notice.
+ * that the kernel drops because its queue is full are lost without notice. The ends of watches are
+ * not: after an overflow the watches that the kernel no longer has are dropped, and
+ * pathUnregistered() tells of each. That takes `/proc`, and some milliseconds for a thousand
+ * watches.
  *
  * Not thread-safe: everything happens on the thread of the object, which needs a running event
  * loop. Signals are emitted synchronously from there. A connected slot may add and remove paths

@@ -28,6 +28,20 @@ QList<int> WatchTable::descriptors() const
     return m_paths.keys();
 }
 
+QVector<WatchTable::Watch> WatchTable::without(const QSet<int>& descriptors) const
+{
+    QVector<Watch> watches;
+    for (auto it = m_descriptors.cbegin(); it != m_descriptors.cend(); ++it) {
+        if (!descriptors.contains(it.value())) {
+            watches.append({it.key(), it.value()});
+        }
+    }
+    std::sort(watches.begin(), watches.end(), [](const Watch& left, const Watch& right) {
+        return left.path < right.path;
+    });
+    return watches;
+}
+
 void WatchTable::insert(const QString& path, int descriptor)
 {
     const int count = m_descriptors.size();

@@ -6,8 +6,10 @@
 
 #include <QHash>
 #include <QList>
+#include <QSet>
 #include <QString>
 #include <QStringList>
+#include <QVector>
 
 namespace VeyFM {
 
@@ -30,6 +32,15 @@ public:
 
     /// Every descriptor in use, once each, in no particular order.
     QList<int> descriptors() const;
+
+    struct Watch
+    {
+        QString path;
+        int descriptor;
+    };
+
+    /// The watches whose descriptor is not among those given, in ascending order of their paths.
+    QVector<Watch> without(const QSet<int>& descriptors) const;
 
     /// Records a watch. A descriptor that @p path had before is forgotten.
     void insert(const QString& path, int descriptor);
