@@ -7,6 +7,7 @@
 #include "core/mountpaths.h"
 #include "core/networkplace.h"
 #include "core/smburl.h"
+#include "service/networkmountsmanagerproxy.h"
 #include "vfs/vfs.h"
 
 #include <QtTest>
@@ -261,7 +262,7 @@ void HostileInputTest::hostThatIsTooLong_data()
 void HostileInputTest::hostThatIsTooLong()
 {
     QFETCH(QString, host);
-    const VFS* vfs = VFS::ptr();
+    VFS* vfs = VFS::ptr();
     const Stopwatch watch;
 
     // No host in the eyes of a parser, and what then counts as path has it in front.
@@ -276,6 +277,16 @@ void HostileInputTest::hostThatIsTooLong()
     QVERIFY(vfs->entry(QStringLiteral("smb://") + host).isNull());
     // No host, but a parser that guesses takes it for one.
     QVERIFY(vfs->entry(QStringLiteral("file:@") + host).isNull());
+
+    const QString sftp = QStringLiteral("sftp://") + host;
+    const QString name = vfs->createEntryForUrl(sftp, m_dir.path()).lastPathSection();
+    QCOMPARE(name, host.contains(u'@') ? host.section(u'@', 0, 0) + u'@' : QString());
+    const Entry unmounted = vfs->entry(sftp);
+    QCOMPARE(vfs->urlsFromEntries(unmounted).value(0).host(), QString());
+    QSignalSpy mounted(vfs, &VFS::fuseMountAdded);
+    Q_EMIT vfs->networkMountsManager()->mountAdded(
+        sftp, vfs->createEntryForUrl(QStringLiteral("sftp://h/"), m_dir.path()));
+    QCOMPARE(mounted.size(), 1);
     QVERIFY(watch.seconds() < limit);
 }
 

@@ -7,8 +7,50 @@
 
 #include <QTest>
 #include <QUrl>
+#include <QVector>
+
+#include <random>
 
 using namespace VeyFM;
+
+namespace {
+
+// A URL with a host of what parsers treat in ways of their own: marks that are put into order,
+// letters that become one, or many, or none, and what separates the parts of a URL.
+QString randomUrl(std::mt19937& random)
+{
+    static const QVector<uint> letters{
+        0x301,  0x316,  0x345,  0x313,  0x300,  0x340,  0xAD,    0x34F,   0x1806,  0x180B,
+        0xFE00, 0x200D, 0xFEFF, 0xFDFA, 0xFC5E, 0x627,  0x5D0,   0x1E9B,  0xDF,    0x130,
+        0xC5,   0x1100, 0x1161, 0x11A8, 0xAC00, 0x3A9,  0x1F82,  0x378,   0xE000,  0xFFFD,
+        0x2FF0, 0x2024, 0x3002, 0xFF0E, 0x3300, 0xFF10, 0x1D400, 0x2F800, 0xE0001, 'a',
+        'A',    '1',    '0',    '-',    '.',    '%',    '@',     ':',     '[',     ']'};
+    static const char* const heads[] = {"sftp://", "ftp://",  "file://",    "file:@",
+                                        "x+y://",  "SFTP://", "sftp://u:p@"};
+    static const char* const tails[] = {"", "/", "/p", "?q", "#f", ":80/p", ":99999", ".com/a@b:1"};
+    const auto below = [&random](int count) {
+        return int(random() % uint(count));
+    };
+
+    QVector<uint> some;
+    for (int i = below(6); i >= 0; --i) {
+        some.append(below(3) > 0 ? letters.at(below(letters.size())) : uint(below(0x3000)));
+    }
+    const int escapes = below(3);
+    QString host;
+    for (int length = below(3) == 0 ? below(900) : below(20); length > 0; --length) {
+        const uint letter = some.at(below(some.size()));
+        const QString one = QString::fromUcs4(&letter, 1);
+        const bool isEscape = escapes == 1 && below(3) == 0;
+        host += isEscape ? QString::fromLatin1(QUrl::toPercentEncoding(one)) : one;
+        if (escapes == 2 && below(9) == 0) {
+            host += QLatin1Char('%') + QString::number(below(256), 16);
+        }
+    }
+    return text(heads[below(7)]) + host + text(tails[below(8)]);
+}
+
+} // namespace
 
 /// Entries to URLs and back. How links in directories are resolved stands in vfs_canonicalpath.
 class TestVfsUrls : public QObject
@@ -35,6 +77,7 @@ private Q_SLOTS:
     void mountEntries_data();
     void mountEntries();
     void mountEntryOfOtherScheme();
+    void anyHost();
     void shares();
     void sections_data();
     void sections();
@@ -311,6 +354,43 @@ void TestVfsUrls::mountEntryOfOtherScheme()
         QVERIFY2(entry.isNull(), url);
         QVERIFY(entry.localPath().isEmpty());
     }
+}
+
+// Whatever a host is made of: the answer is that of QUrl, however it is come by.
+void TestVfsUrls::anyHost()
+{
+    const VFS* vfs = VFS::ptr();
+    std::mt19937 random(1);
+    int overlong = 0;
+    for (int i = 0; i < 4000; ++i) {
+        const QString url = randomUrl(random);
+        const QUrl parsed(url);
+        overlong += parsed.isValid() || url.size() < 300 ? 0 : 1;
+        const QString user = parsed.userName(QUrl::FullyDecoded);
+        const QString name =
+            (user.isEmpty() ? QString() : user + text("@")) + parsed.host(QUrl::FullyDecoded);
+        const Entry mount = vfs->createEntryForUrl(url, text("/mnt"));
+        const bool isFtp = parsed.scheme() == text("ftp");
+        QVERIFY2(
+            mount.path() == (isFtp                             ? text("FTP/") + name
+                             : parsed.scheme() == text("sftp") ? text("SFTP/") + name
+                                                               : QString()),
+            qPrintable(url));
+
+        if (parsed.scheme() == text("file")) {
+            const QString path =
+                vfs->normalizePath(QUrl::fromUserInput(url).path(QUrl::FullyDecoded));
+            const bool isLocal = parsed.host().isEmpty() && path.startsWith(QLatin1Char('/'));
+            QVERIFY2(vfs->entry(url).path() == (isLocal ? path : QString()), qPrintable(url));
+        } else if (!parsed.scheme().isEmpty()) {
+            QUrl expected = parsed;
+            expected.setScheme(text("vey-fm"));
+            const QUrl own = vfs->urlsFromEntries(makeEntry(url, QString(), TypeFuseUrl)).value(0);
+            QVERIFY2(own == expected && own.isValid() == expected.isValid(), qPrintable(url));
+            QCOMPARE(own.toString(), expected.toString());
+        }
+    }
+    QVERIFY(overlong > 100);
 }
 
 void TestVfsUrls::shares()

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "core/localbytes.h"
+#include "core/urlparsing.h"
 #include "vfs/vfs_p.h"
 
 #include <QDir>
@@ -20,69 +21,26 @@ namespace {
 
 const QLatin1Char slash('/');
 
-// QUrl knows best what a scheme is, and the text up to its first colon is all that it needs. Of
-// the whole text it would take the host apart as well, which takes time that grows with the
-// square of the host's length. Most texts have no colon, or begin with a slash, and need no parser.
-QString schemeOf(const QString& text)
-{
-    const int colon = text.startsWith(slash) ? -1 : text.indexOf(QLatin1Char(':'));
-    return colon < 0 ? QString() : QUrl(text.left(colon + 1)).scheme();
-}
-
 bool hasScheme(const QString& text)
 {
-    return !schemeOf(text).isEmpty();
+    return !UrlParsing::scheme(text).isEmpty();
 }
 
-bool isDotInHost(QChar letter)
-{
-    // Three more characters count as dots there.
-    return letter == QLatin1Char('.') || letter == QChar(0x3002) || letter == QChar(0xFF0E) ||
-           letter == QChar(0xFF61);
-}
-
-// Whether a URL has a host that can't be one, because it has a section so long that it remains too
-// long (63 letters is the limit) when all escapes are resolved. QUrl would find the same, late.
-bool hasOverlongHost(const QString& url)
-{
-    constexpr int limit = 1024;
-    const QStringView text(url);
-    const int colon = url.indexOf(QLatin1Char(':'));
-    if (!text.mid(colon + 1).startsWith(QLatin1String("//"))) {
-        return false;
-    }
-    bool behindUser = false;
-    int length = 0;
-    int longest = 0;
-    for (const QChar letter : text.mid(colon + 3)) {
-        if (letter == slash || letter == QLatin1Char('?') || letter == QLatin1Char('#')) {
-            break;
-        }
-        if (letter == QLatin1Char('@') && !behindUser) {
-            behindUser = true;
-            length = longest = 0;
-        } else if (isDotInHost(letter)) {
-            length = 0;
-        } else {
-            longest = std::max(longest, ++length);
-        }
-    }
-    return longest > limit;
-}
-
-// The local path of a "file" URL that has no host, or an invalid one.
+// The local path of a "file" URL that has no host, or an invalid one: that of
+// QUrl::fromUserInput(), which also tries the text as a host and path, without a scheme.
 QString pathOfFileUrl(const QString& text)
 {
-    const QString url = text.trimmed();
-    // fromUserInput() also tries the text as a host and path, without a scheme.
-    const QString asHttp = QLatin1String("http://") + url;
-    if (hasOverlongHost(url)) {
-        return QUrl(asHttp).path(QUrl::FullyDecoded);
+    const QString input = text.trimmed();
+    const QString asHttp = QLatin1String("http://") + input;
+    if (!UrlParsing::hasOverlongHost(input) && !UrlParsing::hasOverlongHost(asHttp)) {
+        return QUrl::fromUserInput(input).path(QUrl::FullyDecoded);
     }
-    if (hasOverlongHost(asHttp)) {
-        return QUrl(url).path(QUrl::FullyDecoded);
+    const QUrl url = UrlParsing::url(input);
+    const QUrl http = UrlParsing::url(asHttp);
+    if (url.isValid() && http.port() == -1) {
+        return url.path(QUrl::FullyDecoded);
     }
-    return QUrl::fromUserInput(url).path(QUrl::FullyDecoded);
+    return http.isValid() ? http.path(QUrl::FullyDecoded) : QString();
 }
 
 // The type of what lies at a local path. Neither a dangling link nor a device has one.
@@ -185,17 +143,14 @@ Entry VFS::entry(const QString& path) const
 
 Entry VFSPrivate::entryFromSchemePath(const QString& path) const
 {
-    const QString scheme = schemeOf(path);
-    if (scheme == QLatin1String("file") && (hasOverlongHost(path) || QUrl(path).host().isEmpty())) {
+    const QString scheme = UrlParsing::scheme(path);
+    if (scheme == QLatin1String("file") && UrlParsing::url(path).host().isEmpty()) {
         return entryFromRelativePath(pathOfFileUrl(path));
     }
     if (scheme == QLatin1String("vey-fm")) {
-        if (hasOverlongHost(path)) {
-            return Entry();
-        }
         // Written with no slash behind the colon. These six words are the same in every
         // language; any other place goes by its own, translated path.
-        const QString place = QUrl(path).path(QUrl::FullyDecoded);
+        const QString place = UrlParsing::url(path).path(QUrl::FullyDecoded);
         if (place == QLatin1String("Computer")) {
             return computerEntry;
         }
@@ -378,7 +333,7 @@ QString VFS::localPath(const QString& path) const
 QString VFS::localPath(const Entry& entry) const
 {
     Q_D(const VFS);
-    const QString scheme = schemeOf(entry.m_path);
+    const QString scheme = UrlParsing::scheme(entry.m_path);
     if (!scheme.isEmpty()) {
         return scheme == QLatin1String("file") ? pathOfFileUrl(entry.m_path) : QString();
     }

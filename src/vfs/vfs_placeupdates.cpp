@@ -3,6 +3,7 @@
 
 // How the tree follows the service's devices, bookmarks and mounts.
 
+#include "core/urlparsing.h"
 #include "vfs/vfs_p.h"
 
 namespace VeyFM {
@@ -182,7 +183,7 @@ EntryList VFSPrivate::addNetworkMounts(const QMap<QString, Entry>& mounts, bool 
         if (it.value().m_path.startsWith(slash)) {
             continue;
         }
-        const QString scheme = QUrl(it.key()).scheme();
+        const QString scheme = UrlParsing::scheme(it.key());
         if (scheme == QLatin1String("ftp")) {
             ftpMounts.append(it.value());
         } else if (scheme == QLatin1String("sftp")) {

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "core/smburl.h"
+#include "core/urlparsing.h"
 #include "vfs/standardpaths.h"
 #include "vfs/vfs_p.h"
 
@@ -89,7 +90,7 @@ QList<QUrl> VFS::urlsFromEntries(const EntryList& entries) const
     for (const Entry& entry : entries) {
         const QString local = entry.localPath();
         if (local.isEmpty()) {
-            QUrl url(entry.m_path);
+            QUrl url = UrlParsing::url(entry.m_path);
             url.setScheme(QStringLiteral("vey-fm"));
             urls.append(url);
             continue;
@@ -115,7 +116,7 @@ EntryList VFS::entriesFromUrls(const QList<QUrl>& urls) const
 Entry VFS::createEntryForUrl(const QString& url, const QString& localPath) const
 {
     Q_D(const VFS);
-    const QUrl parsed(url);
+    const QUrl parsed = UrlParsing::url(url);
     const bool isFtp = parsed.scheme() == QLatin1String("ftp");
     if (!isFtp && parsed.scheme() != QLatin1String("sftp")) {
         return Entry();
