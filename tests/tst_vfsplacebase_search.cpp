@@ -5,6 +5,8 @@
 
 #include <QtTest>
 
+#include <random>
+
 using namespace VeyFM;
 
 // From paths to places, and from places to the places above them.
@@ -18,6 +20,8 @@ private Q_SLOTS:
     void findsTheParentBelowTheRootAlone();
     void findsTheParentOfWhatIsNoPlace();
     void findsTheParentInManyDiamonds();
+    void findsTheParentOfPlacesAndOthers();
+    void findsTheParentInAnyTree();
     void findsAPlaceByItsDirectory();
     void findsTheFirstOfEqualDirectories();
     void findsTheFirstPlaceWithoutADirectory();
@@ -122,6 +126,93 @@ void TestVFSPlaceBaseSearch::findsTheParentInManyDiamonds()
     }
     QCOMPARE(base.checkAndGetParentPlace(above, root).path(), u"200l"_s);
     QVERIFY(base.checkAndGetParentPlace(makePlace(u"none"_s), root).isNull());
+}
+
+// An entry that hung somewhere before it became a place goes on to hang there, as no place.
+void TestVFSPlaceBaseSearch::findsTheParentOfPlacesAndOthers()
+{
+    VFSPlaceBase base;
+    const Entry root = base.createPlace(u"_"_s, TypePlace, QString());
+    const Entry a = base.createPlace(u"a"_s, TypePlace, QString());
+    const Entry b = base.createPlace(u"b"_s, TypePlace, QString());
+    const Entry x = makeDir(u"x"_s);
+    QVERIFY(base.addEntryToPlace(b, root) && base.addEntryToPlace(a, root));
+    QVERIFY(base.addEntryToPlace(x, a));
+    QCOMPARE(base.checkAndGetParentPlace(x, root), a);
+    QVERIFY(base.addEntryToPlace(base.createPlace(x), b));
+    QCOMPARE(base.checkAndGetParentPlace(x, root), b);
+    QCOMPARE(base.checkAndGetParentPlace(x, a), a);
+    QVERIFY(base.destroyPlace(x));
+    QCOMPARE(base.checkAndGetParentPlace(x, root), a);
+    base.clearPlace(a);
+    QVERIFY(base.checkAndGetParentPlace(x, root).isNull());
+
+    // Twice at one place, and gone with it.
+    QVERIFY(base.addEntryToPlace(x, b) && base.addEntryToPlace(x, b));
+    QVERIFY(base.removeEntryFromPlace(x, b));
+    QCOMPARE(base.checkAndGetParentPlace(x, root), b);
+    QVERIFY(base.destroyPlace(b));
+    QVERIFY(base.checkAndGetParentPlace(x, root).isNull());
+}
+
+// However a tree has come about, the parent is the one that a walk from the root meets first.
+void TestVFSPlaceBaseSearch::findsTheParentInAnyTree()
+{
+    std::mt19937 random(1);
+    const auto below = [&random](int count) {
+        return int(random() % uint(count));
+    };
+    VFSPlaceBase base;
+    const auto placeName = [](int i) {
+        return u"p%1"_s.arg(i, 2, 10, QLatin1Char('0'));
+    };
+    const auto anyEntry = [&] {
+        return below(4) > 0 ? makePlace(placeName(below(12))) : makeDir(u"f%1"_s.arg(below(4)));
+    };
+    const auto walk = [&base](const Entry& entry, const Entry& root) {
+        EntryList queue{root};
+        for (int i = 0; i < queue.size(); ++i) {
+            const EntryList children = base.childEntries(queue.at(i));
+            if (children.contains(entry)) {
+                return queue.at(i);
+            }
+            queue.mergeWith(children);
+        }
+        return Entry();
+    };
+    int found = 0;
+    for (int i = 0; i < 3000; ++i) {
+        const Entry place = makePlace(placeName(below(12)));
+        const Entry entry = anyEntry();
+        switch (below(12)) {
+        case 0:
+            base.destroyPlace(place);
+            break;
+        case 1:
+            base.removeEntryFromPlace(entry, place);
+            break;
+        case 2:
+            if (below(4) == 0) {
+                base.clearPlace(place);
+            }
+            break;
+        default:
+            base.createPlace(place);
+            // Upwards only, so that there is no circle.
+            if (entry.path() > place.path() || entry.isDir()) {
+                if (entry.isPlace()) {
+                    base.createPlace(entry);
+                }
+                base.addEntryToPlace(entry, place);
+            }
+        }
+        const Entry sought = anyEntry();
+        const Entry root = makePlace(placeName(below(3)));
+        const Entry parent = base.checkAndGetParentPlace(sought, root);
+        QCOMPARE(parent, walk(sought, root));
+        found += parent.isNull() ? 0 : 1;
+    }
+    QVERIFY2(found > 300, qPrintable(QString::number(found)));
 }
 
 void TestVFSPlaceBaseSearch::findsAPlaceByItsDirectory()

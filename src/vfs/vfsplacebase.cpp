@@ -96,6 +96,8 @@ bool VFSPlaceBasePrivate::link(const Entry& entry, const Node& place)
         // No place: it belongs to this parent alone, and may do so several times.
         child = Node::create();
         child->entry = entry;
+        child->index = &plainChildren;
+        plainChildren.insert(entry.path(), child.data());
     }
     auto& parents = child->parents;
     // Parents that are gone count for nothing, and would only gather.

@@ -7,8 +7,10 @@
 #include "core/entrylist.h"
 
 #include <QByteArray>
+#include <QMultiHash>
 #include <QPointer>
 #include <QSharedPointer>
+#include <QString>
 #include <QStringView>
 #include <QWeakPointer>
 
@@ -44,9 +46,23 @@ public:
         quint64 number;
     };
 
+    /// The children that are no places, by their paths. Each goes with the link to its parent.
+    using PlainChildren = QMultiHash<QString, const PlaceTreeNode*>;
+
     struct PlaceTreeNode
     {
+        PlaceTreeNode() = default;
+        PlaceTreeNode(const PlaceTreeNode&) = delete;
+        PlaceTreeNode& operator=(const PlaceTreeNode&) = delete;
+        ~PlaceTreeNode()
+        {
+            if (index) {
+                index->remove(entry.path(), this);
+            }
+        }
+
         Entry entry;
+        PlainChildren* index = nullptr; // of a child that is no place
         std::vector<ParentLink> parents;
         Children children;
         // Never used again, so that the link of a child that was dropped finds no other child.
@@ -92,10 +108,12 @@ public:
     bool isPending(const QString& path) const;
     void createIfPendingPlace(QStringView path) const;
     bool link(const Entry& entry, const Node& place);
+    std::vector<Node> parentsOf(const QString& path) const;
     QStringList parentPlacesHistory(QStringView path, const PlaceTreeNode& top) const;
 
     mutable std::recursive_mutex placeLock;
     mutable std::mutex containerLock;
+    PlainChildren plainChildren; // Outlives the nodes.
     ByPath<Node> placeNodes;
     // Look-ups that are const take from it.
     mutable ByPath<PendingPlace> pendingPlaces;

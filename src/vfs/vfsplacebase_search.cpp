@@ -37,17 +37,38 @@ QStringView withoutLeadingSlashes(QStringView path)
     return path;
 }
 
-} // namespace
-
-Entry VFSPlaceBase::checkAndGetParentPlace(const Entry& entry, const Entry& root) const
+// Whether the link leads to a parent that lives and still has the child.
+Node parentOf(const VFSPlaceBasePrivate::ParentLink& link)
 {
-    const PlaceLocker locker(d->placeLock);
-    const Node top = d->node(root);
-    if (!top) {
-        return Entry();
+    const Node parent = link.parent.toStrongRef();
+    const bool isChild = parent && parent->children.find(link.number) != parent->children.end();
+    return isChild ? parent : Node();
+}
+
+bool isBelow(const Node& node, const Node& top)
+{
+    QVector<Node> above{node};
+    QSet<const VFSPlaceBasePrivate::PlaceTreeNode*> seen{node.data()};
+    for (int i = 0; i < above.size(); ++i) {
+        const Node current = above.at(i);
+        if (current == top) {
+            return true;
+        }
+        for (const auto& link : current->parents) {
+            const Node parent = parentOf(link);
+            if (parent && !seen.contains(parent.data())) {
+                seen.insert(parent.data());
+                above.append(parent);
+            }
+        }
     }
-    // Level by level, earlier siblings first. A node hangs below several others, and is looked at
-    // once.
+    return false;
+}
+
+// The first place below another, level by level and earlier siblings first, that has the entry as
+// a child. A node hangs below several others, and is looked at once.
+Entry firstParent(const Entry& entry, const Node& top)
+{
     QVector<const VFSPlaceBasePrivate::PlaceTreeNode*> queue{top.data()};
     QSet<const VFSPlaceBasePrivate::PlaceTreeNode*> queued{top.data()};
     for (int i = 0; i < queue.size(); ++i) {
@@ -62,6 +83,48 @@ Entry VFSPlaceBase::checkAndGetParentPlace(const Entry& entry, const Entry& root
         }
     }
     return Entry();
+}
+
+} // namespace
+
+std::vector<Node> VFSPlaceBasePrivate::parentsOf(const QString& path) const
+{
+    std::vector<Node> parents;
+    const auto addParentsOf = [&parents](const PlaceTreeNode& child) {
+        for (const auto& link : child.parents) {
+            if (const Node parent = parentOf(link)) {
+                parents.push_back(parent);
+            }
+        }
+    };
+    if (const Node place = node(path)) {
+        addParentsOf(*place);
+    }
+    for (auto it = plainChildren.constFind(path);
+         it != plainChildren.constEnd() && it.key() == path; ++it) {
+        addParentsOf(*it.value());
+    }
+    return parents;
+}
+
+Entry VFSPlaceBase::checkAndGetParentPlace(const Entry& entry, const Entry& root) const
+{
+    const PlaceLocker locker(d->placeLock);
+    const Node top = d->node(root);
+    if (!top) {
+        return Entry();
+    }
+    // Most entries have no parent here at all, and most of the others one, which asks for no walk
+    // through the tree.
+    std::vector<Node> parents = d->parentsOf(entry.path());
+    const auto isElsewhere = [&top](const Node& parent) {
+        return !isBelow(parent, top);
+    };
+    parents.erase(std::remove_if(parents.begin(), parents.end(), isElsewhere), parents.end());
+    if (parents.size() > 1) {
+        return firstParent(entry, top);
+    }
+    return parents.empty() ? Entry() : parents.front()->entry;
 }
 
 Entry VFSPlaceBase::dirPlaceEntry(const QString& localPath) const
