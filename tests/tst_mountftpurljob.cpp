@@ -20,6 +20,7 @@ public:
 
 protected:
     void addMountedUrls() override;
+    void addUnsafeUrls() override;
 
 private Q_SLOTS:
     void mountsWithoutAQuestion_data();
@@ -34,6 +35,15 @@ void MountFtpURLJobTest::addMountedUrls()
 {
     // Nothing is cut off a path below the home directory, unlike for SFTP.
     QTest::newRow("home") << u"ftp://host/~/a"_s << u"ftp://host/~/"_s << u"/mnt//~/a"_s;
+}
+
+// A comma begins the next option.
+void MountFtpURLJobTest::addUnsafeUrls()
+{
+    QTest::newRow("comma in the user") << u"ftp://bob,allow_other@host/a"_s;
+    QTest::newRow("encoded comma in the user") << u"ftp://bob%2callow_other@host/a"_s;
+    QTest::newRow("comma in the host") << u"ftp://ho,st/a"_s;
+    QTest::newRow("encoded comma in the host") << u"ftp://ho%2cst/a"_s;
 }
 
 void MountFtpURLJobTest::mountsWithoutAQuestion_data()

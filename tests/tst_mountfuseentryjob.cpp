@@ -286,6 +286,10 @@ void MountFuseEntryJobTest::errorsPassThrough_data()
     QTest::newRow("upper case") << u"SFTP://host"_s << false << 5 << unsupported;
     QTest::newRow("no tool may have it")
         << u"sftp:///a"_s << false << 5 << u"Mounting sftp resource failed"_s;
+    QTest::newRow("option") << u"sftp://[]-oProxyCommand=x@host/"_s << false << 5
+                            << u"Mounting sftp resource failed"_s;
+    QTest::newRow("another host") << u"sftp://elsewhere%3a@host/"_s << false << 5
+                                  << u"Mounting sftp resource failed"_s;
     QTest::newRow("given up") << u"sftp://host"_s << true << 2
                               << u"Accessing sftp resource was cancelled"_s;
 }

@@ -39,6 +39,16 @@ void MountSFtpURLJobTest::addUnsafeUrls()
     QTest::newRow("user is an option") << u"sftp://-oProxyCommand=x@host/a"_s;
     QTest::newRow("encoded option") << u"sftp://%2doProxyCommand=x@host/a"_s;
     QTest::newRow("option in brackets") << u"sftp://%5B-oProxyCommand=x%5D@host/a"_s;
+    // sshfs takes all brackets off, wherever they stand.
+    QTest::newRow("option behind brackets") << u"sftp://[]-oProxyCommand=x@host/a"_s;
+    QTest::newRow("option behind encoded brackets") << u"sftp://%5b%5d-oProxyCommand=x@host/a"_s;
+    QTest::newRow("option behind an address") << u"sftp://%5B%5D%5B%5D-oProxyCommand=x@[::1]/a"_s;
+    QTest::newRow("brackets in the user") << u"sftp://a[b]c@host/a"_s;
+    QTest::newRow("open bracket in the user") << u"sftp://bob[@host/a"_s;
+    QTest::newRow("closed bracket in the user") << u"sftp://bob]@host/a"_s;
+    // A colon ends the host.
+    QTest::newRow("colon in the user") << u"sftp://elsewhere%3ax@host/a"_s;
+    QTest::newRow("colon and dash in the user") << u"sftp://a%3A-oProxyCommand=x@host/a"_s;
 }
 
 void MountSFtpURLJobTest::commandLine_data()

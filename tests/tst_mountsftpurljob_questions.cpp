@@ -66,6 +66,7 @@ private Q_SLOTS:
     void terminalNotReady_data();
     void terminalNotReady();
     void changedUserStandsBeforeTheHost();
+    void changedUserIsNoOption_data();
     void changedUserIsNoOption();
 };
 
@@ -257,10 +258,19 @@ void MountSFtpURLJobQuestionsTest::changedUserStandsBeforeTheHost()
     QCOMPARE(job->url(), u"sftp://bob@host/~/a"_s);
 }
 
+void MountSFtpURLJobQuestionsTest::changedUserIsNoOption_data()
+{
+    QTest::addColumn<QString>("user");
+    QTest::newRow("option") << u"-oProxyCommand=x"_s;
+    QTest::newRow("behind brackets") << u"[]-oProxyCommand=x"_s;
+    QTest::newRow("another host") << u"elsewhere:x"_s;
+}
+
 void MountSFtpURLJobQuestionsTest::changedUserIsNoOption()
 {
+    QFETCH(QString, user);
     tool->expect(fails);
-    auth->answers = {Auth::changeUser(u"-oProxyCommand=x"_s)};
+    auth->answers = {Auth::changeUser(user)};
     const auto job = makeJob<MountSFtpURLJob>(u"sftp://host"_s);
     startToEnd(job.get());
     QCOMPARE(job->error(), 5);

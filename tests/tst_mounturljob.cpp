@@ -156,6 +156,12 @@ void MountURLJobTest::errorsPassThrough_data()
                                   << u"Accessing ftp resource was cancelled"_s;
     QTest::newRow("sftp fails") << QByteArray("sshfs") << u"sftp://host"_s << Runs{{"exit 1"}} << 0
                                 << 5 << u"Mounting sftp resource failed"_s;
+    QTest::newRow("sftp to an option")
+        << QByteArray("sshfs") << u"sftp://[]-oProxyCommand=x@host/"_s << Runs{} << 0 << 5
+        << u"Mounting sftp resource failed"_s;
+    QTest::newRow("ftp with an option")
+        << QByteArray("curlftpfs") << u"ftp://bob,allow_other@host/"_s << Runs{} << 0 << 5
+        << u"Mounting ftp resource failed"_s;
     QTest::newRow("sftp given up") << QByteArray("sshfs") << u"sftp://host"_s
                                    << Runs{{"out Connection reset by peer", "exit 1"}} << 1 << 2
                                    << u"Accessing sftp resource was cancelled"_s;

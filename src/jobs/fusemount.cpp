@@ -4,31 +4,18 @@
 #include "jobs/fusemount_p.h"
 
 #include "core/mountpaths.h"
+#include "core/urltext.h"
 #include "jobs/job.h"
-#include "jobs/urlscheme_p.h"
 #include "service/fusemountsmanagerproxy.h"
 #include "vfs/vfs.h"
 
 #include <QDir>
 #include <QPointer>
 
-#include <algorithm>
-
 namespace VeyFM {
 
-namespace {
-
-bool isHarmless(const QString& name)
-{
-    return std::none_of(name.begin(), name.end(), [](QChar c) {
-        return c == QLatin1Char('/') || c.category() == QChar::Other_Control;
-    });
-}
-
-} // namespace
-
 FuseMount::FuseMount(const QString& url, QSharedPointer<Authenticator> authenticator)
-    : scheme(writtenScheme(url))
+    : scheme(UrlText::writtenScheme(url))
     , url(url)
     , authenticator(std::move(authenticator))
 {
@@ -57,20 +44,14 @@ QString FuseMount::account() const
     return name.isEmpty() ? host() : name + QLatin1Char('@') + host();
 }
 
-bool FuseMount::isSafe(const QString& target) const
+QString FuseMount::toolHost() const
 {
-    const QLatin1Char dash('-');
-    // Brackets may stand around a host, and sshfs takes them off.
-    const QLatin1String dashInBrackets("[-");
-    // Without a port that fits into its number, say, a URL is none, and all of those share a key.
-    return url.isValid() && !host().isEmpty() && !host().startsWith(dash) &&
-           !target.startsWith(dash) && !target.startsWith(dashInBrackets) && isHarmless(user()) &&
-           isHarmless(host());
+    return UrlText::toolHost(url);
 }
 
-bool FuseMount::prepareRun(const QString& target) const
+bool FuseMount::prepareRun() const
 {
-    if (!isSafe(target)) {
+    if (!UrlText::isSafeForTool(url)) {
         removeMountDirectory();
         return false;
     }

@@ -27,10 +27,12 @@ public:
     /// "user@host", or "host" without a user.
     QString account() const;
 
+    /// The host as a tool wants it, which is not that of the directory for an IPv6 address.
+    QString toolHost() const;
+
     /// Tells the authenticator what it will be asked about. False, with the directory of an
-    /// earlier attempt removed, if user and host must not be handed to a tool whose first argument
-    /// is @p target.
-    bool prepareRun(const QString& target) const;
+    /// earlier attempt removed, if user and host must not be handed to a tool.
+    bool prepareRun() const;
 
     /// Where the service says that the URL's root is mounted already; empty if nowhere. Its word
     /// is taken as it stands.
@@ -65,10 +67,6 @@ public:
 
 private:
     Q_DISABLE_COPY(FuseMount)
-
-    // A user or host that begins with a dash would be an option of the tool, which can run
-    // commands; a slash would leave the mount directory.
-    bool isSafe(const QString& target) const;
 
     bool m_isAsking = false;
 };

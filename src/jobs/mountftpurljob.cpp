@@ -114,7 +114,7 @@ void MountFtpURLJob::updateMountPath()
 void MountFtpURLJob::run()
 {
     Q_D(MountFtpURLJob);
-    if (!d->mount.prepareRun(d->mount.host())) {
+    if (!d->mount.prepareRun()) {
         finishedWithError(5, tr("Mounting ftp resource failed"));
         return;
     }
@@ -125,7 +125,7 @@ void MountFtpURLJob::run()
     if (!user.isEmpty()) {
         arguments << QStringLiteral("-o") << QLatin1String("user=") + user;
     }
-    arguments << d->mount.host() << d->mount.mountPath;
+    arguments << d->mount.toolHost() << d->mount.mountPath;
 
     if (!d->process) {
         d->process = new QProcess(this);

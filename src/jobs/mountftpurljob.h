@@ -22,6 +22,10 @@ class MountFtpURLJobPrivate;
  * Ends with code 5 for another scheme, for a host or user that no tool may be given, and when the
  * tool fails; with code 2 when the user gives up. A tool that can't be started leaves the job
  * running.
+ *
+ * No tool may be given a host that begins with a dash, nor a host or user with a slash, a comma or
+ * a control character, encoded or not. A host in brackets has to be an IPv6 address, with a zone
+ * or without.
  */
 class VEYFMVFS_EXPORT MountFtpURLJob : public Job
 {

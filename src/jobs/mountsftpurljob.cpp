@@ -121,14 +121,16 @@ void MountSFtpURLJob::run()
 bool MountSFtpURLJob::runOnce()
 {
     Q_D(MountSFtpURLJob);
-    if (!d->mount.prepareRun(d->mount.account())) {
+    if (!d->mount.prepareRun()) {
         finishedWithError(5, tr("Mounting sftp resource failed"));
         return false;
     }
     updateMountPath();
 
     // Always the whole tree; the path below it is added to the result alone.
-    const QString target = d->mount.account() + QLatin1Char(':') +
+    const QString user = d->mount.user();
+    const QString target = (user.isEmpty() ? user : user + QLatin1Char('@')) + d->mount.toolHost() +
+                           QLatin1Char(':') +
                            (isBelowHome(d->mount.url) ? QString() : QString(slash));
     if (!d->process) {
         d->process = std::make_unique<VeySu::PtyProcess>();

@@ -28,6 +28,10 @@ class MountSFtpURLJobPrivate;
  * password prompt, or refuses the key of a host, leaves the job unfinished: start() returns and
  * finished() never comes. So does a login that is refused in the run in which the key of the host
  * was confirmed.
+ *
+ * No tool may be given a host or user that begins with a dash or holds a slash or a control
+ * character, nor a user with a colon or brackets, encoded or not. A host in brackets has to be an
+ * IPv6 address, with a zone or without.
  */
 class VEYFMVFS_EXPORT MountSFtpURLJob : public Job
 {

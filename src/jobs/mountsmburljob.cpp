@@ -4,8 +4,8 @@
 #include "jobs/mountsmburljob.h"
 
 #include "core/smburl.h"
+#include "core/urltext.h"
 #include "jobs/checksmbshareauthjob.h"
-#include "jobs/urlscheme_p.h"
 #include "service/smbbrowserproxy.h"
 #include "vfs/vfs.h"
 
@@ -39,7 +39,7 @@ QString MountSmbURLJob::localPath() const
 
 void MountSmbURLJob::start()
 {
-    if (writtenScheme(m_url) != QLatin1String("smb")) {
+    if (UrlText::writtenScheme(m_url) != QLatin1String("smb")) {
         finishedWithError(5, tr("Url scheme is not smb"));
         return;
     }

@@ -3,10 +3,10 @@
 
 #include "jobs/mounturljob.h"
 
+#include "core/urltext.h"
 #include "jobs/mountftpurljob.h"
 #include "jobs/mountsftpurljob.h"
 #include "jobs/mountsmburljob.h"
-#include "jobs/urlscheme_p.h"
 
 namespace VeyFM {
 
@@ -32,7 +32,7 @@ QString MountURLJob::localPath() const
 
 void MountURLJob::start()
 {
-    const QString scheme = writtenScheme(m_url);
+    const QString scheme = UrlText::writtenScheme(m_url);
     Job* job = nullptr;
     if (scheme == QLatin1String("smb")) {
         job = new MountSmbURLJob(m_authenticator, m_url, this);

@@ -81,6 +81,40 @@ void FuseMountUrlTest::twoPathsShareAMount()
     QCOMPARE(recordedMounts(), QStringList());
 }
 
+void FuseMountUrlTest::addresses_data()
+{
+    QTest::addColumn<QString>("host");
+    QTest::addColumn<QByteArray>("given");
+    QTest::addColumn<QString>("name");
+    // In brackets, since a colon ends the host otherwise; but not in the name of the directory.
+    QTest::newRow("loopback") << u"[::1]"_s << QByteArray("[::1]") << u"::1"_s;
+    QTest::newRow("port") << u"[::1]:2222"_s << QByteArray("[::1]") << u"::1"_s;
+    QTest::newRow("long form") << u"[2001:DB8:0:0:0:0:0:1]"_s << QByteArray("[2001:db8::1]")
+                               << u"2001:db8::1"_s;
+    QTest::newRow("mapped") << u"[::ffff:192.0.2.1]"_s << QByteArray("[::ffff:192.0.2.1]")
+                            << u"::ffff:192.0.2.1"_s;
+    QTest::newRow("zone") << u"[fe80::1%25eth0]"_s << QByteArray("[fe80::1%eth0]")
+                          << u"fe80::1%eth0"_s;
+    QTest::newRow("zone of a strange name")
+        << u"[fe80::1%25a-b.2_c~]"_s << QByteArray("[fe80::1%a-b.2_c~]") << u"fe80::1%a-b.2_c~"_s;
+    QTest::newRow("version 4") << u"192.0.2.1"_s << QByteArray("192.0.2.1") << u"192.0.2.1"_s;
+}
+
+void FuseMountUrlTest::addresses()
+{
+    QFETCH(QString, host);
+    QFETCH(QByteArray, given);
+    QFETCH(QString, name);
+    tool->expect({});
+    const FuseMountJob job = makeMountJob(url(u"bob@"_s + host + u"/a"_s));
+    finish(job);
+    QCOMPARE(job->error(), 0);
+    const bool isFtp = protocol.scheme == u"ftp"_s;
+    QCOMPARE(tool->arguments(1).value(isFtp ? 2 : 0), isFtp ? given : "bob@" + given + ":/");
+    QCOMPARE(job.localPath(), mountDir(directory(u"bob@"_s + name)) + u"//a"_s);
+    QCOMPARE(auth->server(), name);
+}
+
 void FuseMountUrlTest::unsafeUrls_data()
 {
     QTest::addColumn<QString>("url");
@@ -97,6 +131,17 @@ void FuseMountUrlTest::unsafeUrls_data()
     QTest::newRow("newline in the user") << url(u"bob%0aann@host/a"_s);
     QTest::newRow("zero byte in the user") << url(u"bob%00ann@host/a"_s);
     QTest::newRow("delete in the user") << url(u"bob%7f@host/a"_s);
+    QTest::newRow("nothing in brackets") << url(u"[]/a"_s);
+    QTest::newRow("option in brackets") << url(u"[-oProxyCommand=x]/a"_s);
+    QTest::newRow("name in brackets") << url(u"bob@[host]/a"_s);
+    QTest::newRow("address of version 4 in brackets") << url(u"[127.0.0.1]/a"_s);
+    QTest::newRow("address of a version to come") << url(u"[v7.host]/a"_s);
+    QTest::newRow("broken address") << url(u"[1::2::3]/a"_s);
+    QTest::newRow("text behind the brackets") << url(u"[::1]-oProxyCommand=x/a"_s);
+    QTest::newRow("encoded brackets") << url(u"%5B::1%5D/a"_s);
+    QTest::newRow("option as a zone") << url(u"[fe80::1%25-oProxyCommand=x]/a"_s);
+    QTest::newRow("slash in the zone") << url(u"[fe80::1%25a%2fb]/a"_s);
+    QTest::newRow("comma in the zone") << url(u"[fe80::1%25a,allow_other]/a"_s);
     addUnsafeUrls();
 }
 

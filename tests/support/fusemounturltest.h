@@ -27,6 +27,8 @@ private Q_SLOTS:
     void alreadyMounted();
     void registeredWithoutAPath();
     void twoPathsShareAMount();
+    void addresses_data();
+    void addresses();
     void unsafeUrls_data();
     void unsafeUrls();
 };

@@ -4,6 +4,7 @@
 #include "mount/mounturl.h"
 
 #include "core/smburl.h"
+#include "core/urltext.h"
 
 #include <QRegularExpression>
 #include <QStringList>
@@ -28,12 +29,6 @@ constexpr int longestName = 255; // Of a directory, in bytes; and of a host, whi
 const QLatin1String badInUsers("'\"`;&<>|(){}[]$:/");
 const QLatin1String badInShares("'\"`\\/%;<>|{}[]:*?#");
 const QLatin1String badInWorkgroups("'\"`\\/%@:");
-
-bool hasControl(const QString& text)
-{
-    return std::any_of(
-        text.begin(), text.end(), [](QChar c) { return c.category() == QChar::Other_Control; });
-}
 
 /// What nobody sees in a name, or what turns the direction of writing.
 bool hasInvisible(const QString& name)
@@ -241,6 +236,10 @@ QString whyNotFuse(const QString& text, const QString& scheme, const QString& au
     if (!why.isEmpty()) {
         return why;
     }
+    // The job's own look, which is less strict.
+    if (!UrlText::isSafeForTool(url)) {
+        return QStringLiteral("%1 can't be told of this user and host").arg(toolOf(scheme));
+    }
     // With the sign of a mount of the home directory behind it.
     if (QStringLiteral("%1@%2~").arg(user, host).toLocal8Bit().size() > longestName) {
         return QStringLiteral("the names of the user and the host are too long together");
@@ -252,7 +251,7 @@ QString whyNotFuse(const QString& text, const QString& scheme, const QString& au
         return QStringLiteral("a '#' ends the path: write %23 for one that is part of it");
     }
     const QString path = url.path(QUrl::FullyDecoded);
-    if (hasControl(path)) {
+    if (UrlText::hasControl(path)) {
         return QStringLiteral("a control character in the path");
     }
     if (!survivesLocale(path)) {
@@ -295,7 +294,7 @@ QString whyNotMountable(const QString& url)
     if (url.size() > longestUrl) {
         return QStringLiteral("longer than %1 characters").arg(longestUrl);
     }
-    if (hasControl(url)) {
+    if (UrlText::hasControl(url)) {
         return QStringLiteral("a control character in the URL");
     }
     if (!survivesLocale(url)) {
