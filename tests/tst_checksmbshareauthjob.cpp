@@ -64,6 +64,10 @@ private Q_SLOTS:
     void passwordWithoutAUserIsDropped();
     void commandIsSplitIntoWords_data();
     void commandIsSplitIntoWords();
+    void namesAreNoOptions_data();
+    void namesAreNoOptions();
+    void usersAreNoOptions_data();
+    void usersAreNoOptions();
     void conversation_data();
     void conversation();
     void triesWithoutBound();
@@ -260,6 +264,9 @@ void CheckSmbShareAuthJobTest::commandIsSplitIntoWords_data()
     QTest::newRow("no shell") << u"a;b$(touch${IFS}x)`y`|z>w*"_s
                               << QByteArrayList({"//LOCALHOST/a;b$(touch${IFS}x)`y`|z>w*"});
     QTest::newRow("placeholders") << u"%3%1"_s << QByteArrayList({"//LOCALHOST/%3%1"});
+    QTest::newRow("dashes") << u"a- b-c"_s << QByteArrayList({"//LOCALHOST/a-", "b-c"});
+    QTest::newRow("dash at the beginning") << u"-x"_s << QByteArrayList({"//LOCALHOST/-x"});
+    QTest::newRow("nothing") << QString() << QByteArrayList({"//LOCALHOST/"});
 }
 
 void CheckSmbShareAuthJobTest::commandIsSplitIntoWords()
@@ -269,6 +276,73 @@ void CheckSmbShareAuthJobTest::commandIsSplitIntoWords()
     m_smbclient->expect(listed);
     makeJob(share)->checkAuth(QString(), QString());
     QCOMPARE(m_smbclient->arguments(1), words + QByteArrayList({"-U", "%", "-c", "du"}));
+}
+
+void CheckSmbShareAuthJobTest::namesAreNoOptions_data()
+{
+    QTest::addColumn<QString>("host");
+    QTest::addColumn<QString>("share");
+    const auto share = [](const char* name, const QString& text) {
+        QTest::newRow(name) << host << text;
+    };
+    share("option", u"pub -Tc .profile a.txt"_s);
+    share("options behind words", u"pub a -N -c \"get payload .bashrc\""_s);
+    share("quoted option", u"pub \"-Tc\" .profile"_s);
+    share("quoted dash", u"pub \"-\"Tc .profile"_s);
+    share("nothing in quotes before it", u"pub \"\"-Tc .profile"_s);
+    share("dash alone", u"pub -"_s);
+    share("the end of options", u"pub --"_s);
+    share("one that we write too", u"pub -c du"_s);
+    share("behind a wide blank", u"pub\u2003-Tc .profile"_s);
+    share("behind a tab", u"pub\t-Tc .profile"_s);
+    share("behind a newline", u"pub\n-Tc .profile"_s);
+    share("tab", u"a\tb"_s);
+    share("zero byte", u"a"_s + QChar(QChar::Null) + u"b"_s);
+    share("our own mark of a dash", u"a \u0001c"_s);
+    share("delete", u"a\u007f"_s);
+    share("control character of Latin 1", u"a\u0085"_s);
+    QTest::newRow("host is an option") << u"LOCALHOST -L x"_s << u"share"_s;
+    QTest::newRow("host with a newline") << u"LOCAL\nHOST"_s << u"share"_s;
+    // What one opens the other closes.
+    QTest::newRow("quotes over both") << u"LOCALHOST\" "_s << u"share\" -Tc x"_s;
+}
+
+// Other programs of the network may have told them. No tool runs, which reads as a missing one.
+void CheckSmbShareAuthJobTest::namesAreNoOptions()
+{
+    QFETCH(QString, host);
+    QFETCH(QString, share);
+    CheckSmbShareAuthJob job(m_auth, share, host, QString());
+    job.setDeleteOnFinish(false);
+    QSignalSpy finished(&job, &Job::finished);
+    QVERIFY(job.checkKerberosAuth() != 0);
+    QCOMPARE(job.checkAuth(QString(), QString()), 0);
+    QCOMPARE(job.checkAuth(u"bob"_s, u"secret"_s), 0);
+    job.start();
+    QCOMPARE(finished.count(), 1);
+    QCOMPARE(job.error(), 0);
+    QVERIFY(job.hostForKerberos().isEmpty());
+    QCOMPARE(m_auth->calls, QStringList());
+    QCOMPARE(m_smbclient->runs(), 0);
+}
+
+void CheckSmbShareAuthJobTest::usersAreNoOptions_data()
+{
+    QTest::addColumn<QString>("share");
+    QTest::addColumn<QString>("user");
+    QTest::newRow("option") << u"share"_s << u"-x"_s;
+    QTest::newRow("option behind a word") << u"share"_s << u"bob -N"_s;
+    QTest::newRow("quoted option") << u"share"_s << u"\"-x\""_s;
+    QTest::newRow("newline") << u"share"_s << u"bob\nann"_s;
+    QTest::newRow("quotes from the share on") << u"a\""_s << u"b\" -U \"x"_s;
+}
+
+void CheckSmbShareAuthJobTest::usersAreNoOptions()
+{
+    QFETCH(QString, share);
+    QFETCH(QString, user);
+    QCOMPARE(makeJob(share)->checkAuth(user, u"secret"_s), 0);
+    QCOMPARE(m_smbclient->runs(), 0);
 }
 
 void CheckSmbShareAuthJobTest::conversation_data()

@@ -30,6 +30,8 @@ private Q_SLOTS:
     void path_data();
     void path();
     void canonicalHostAfterATicket();
+    void namesAreNoOptions_data();
+    void namesAreNoOptions();
     void errorsOfTheCheckPassThrough();
     void noNetworkPath_data();
     void noNetworkPath();
@@ -141,6 +143,26 @@ void MountSmbURLJobTest::canonicalHostAfterATicket()
     job->start();
     QCOMPARE(job->error(), 0);
     QCOMPARE(job->localPath(), u"/net/localhost/share/a"_s);
+}
+
+void MountSmbURLJobTest::namesAreNoOptions_data()
+{
+    QTest::addColumn<QString>("url");
+    QTest::addColumn<QString>("path");
+    QTest::newRow("share") << u"smb://host/pub -N -c \"get payload .bashrc\""_s
+                           << u"/net/host/pub -N -c \"get payload .bashrc\"/"_s;
+    QTest::newRow("host") << u"smb://host -L x/pub/a"_s << u"/net/host -L x/pub/a"_s;
+}
+
+void MountSmbURLJobTest::namesAreNoOptions()
+{
+    QFETCH(QString, url);
+    QFETCH(QString, path);
+    const auto job = makeJob<MountSmbURLJob>(url);
+    startToEnd(job.get());
+    QCOMPARE(tool->runs(), 0);
+    QCOMPARE(job->error(), 0); // As where smbclient is missing.
+    QCOMPARE(job->localPath(), path);
 }
 
 void MountSmbURLJobTest::errorsOfTheCheckPassThrough()

@@ -56,6 +56,7 @@ private Q_SLOTS:
     void shareWithALocalPath();
     void shareIsAttached_data();
     void shareIsAttached();
+    void shareIsNoOption();
     void shareErrorsPassThrough();
     void shareOutsideTheGroup();
     void cleanupTestCase();
@@ -113,12 +114,14 @@ void UpdateJobsTest::initTestCase()
         "NetworkPlacesManager.networkPlaces": [
             ["Mounted", "sftp://m", "/mnt/m"], ["Ftp", "ftp://host/a", ""],
             ["Sftp", "sftp://host/a", ""], ["Web", "http://host", ""],
-            ["Changes", "ftp://host/old", ""], ["Smb", "smb://localhost/pub", ""]],
+            ["Changes", "ftp://host/old", ""], ["Smb", "smb://localhost/pub", ""],
+            ["Option", "sftp://[]-oProxyCommand=x@host/", ""]],
         "SmbBrowser.workgroups": ["WG", "Other"],
         "SmbBrowser.hosts": [],
         "SmbBrowser.hosts WG": ["localhost", "h2"],
         "SmbBrowser.shares": {},
-        "SmbBrowser.shares localhost WG": {"pub": "", "home": "/mnt/home"}}})";
+        "SmbBrowser.shares localhost WG": {"pub": "", "home": "/mnt/home",
+            "pub -Tc .profile a.txt": ""}}})";
     QVERIFY2(startVfs(script), qPrintable(service.errorString()));
     // Down to the shares, as a view that was opened there.
     vfs->childs(vfs->sambaNetworkEntry());
@@ -258,6 +261,8 @@ void UpdateJobsTest::bookmarkErrorsPassThrough_data()
     using Runs = QList<QByteArrayList>;
     QTest::newRow("scheme") << u"Network/Web"_s << Runs{} << 5
                             << u"This network protocol is not supported"_s;
+    QTest::newRow("option") << u"Network/Option"_s << Runs{} << 5
+                            << u"Mounting sftp resource failed"_s;
     QTest::newRow("given up") << u"Network/Smb"_s << Runs{{"exit 1"}, denied} << 2
                               << u"Login cancelled"_s;
 }
@@ -276,7 +281,7 @@ void UpdateJobsTest::bookmarkErrorsPassThrough()
     startToEnd(job.get());
     QCOMPARE(job->error(), code);
     QCOMPARE(job->errorString(), error);
-    QCOMPARE(service->takeCalls(), QStringList());
+    QCOMPARE(calls(u"NetworkPlacesManager"_s), QStringList());
 }
 
 void UpdateJobsTest::bookmarkOutsideTheGroup()
@@ -471,6 +476,23 @@ void UpdateJobsTest::shareIsAttached()
     QVERIFY(finished.wait(20000));
     disconnect(connection);
     QCOMPARE(endsWhenTold, 0);
+    QCOMPARE(job->error(), 0);
+}
+
+// Told by a server whose owner would like to write files here.
+void UpdateJobsTest::shareIsNoOption()
+{
+    const auto job = makeSmbJob(place(u"Samba/WG/localhost/pub -Tc .profile a.txt"_s));
+    QSignalSpy finished(job.get(), &Job::finished);
+    job->start();
+    QCOMPARE(tool->runs(), 0);
+    QCOMPARE(auth->calls, QStringList());
+    // As where smbclient is missing.
+    QCOMPARE(
+        service->takeCalls(), QStringList(u"SmbBrowser.shareLocalPath[\"pub -Tc .profile "
+                                          "a.txt\",\"localhost\",\"WG\",\"\"]"_s));
+    emitSmb(u"shareUpdated"_s, {u"home"_s, u"localhost"_s, u"WG"_s, u"/mnt/home"_s});
+    QVERIFY(finished.wait(20000));
     QCOMPARE(job->error(), 0);
 }
 

@@ -4,6 +4,7 @@
 #include "jobs/checksmbshareauthjob.h"
 
 #include "core/fuse.h"
+#include "core/urltext.h"
 #include "vfs/standardpaths.h"
 
 #include <QPointer>
@@ -19,10 +20,14 @@ namespace {
 constexpr int toolTimeoutMs = 30000;
 
 // Runs a tool to its end, or until it takes too long, and returns what it printed, line by line.
-// The command is split into words with no shell. How the tool ended is not looked at.
-QStringList linesOf(QProcess& process, const QString& command)
+// How the tool ended is not looked at. The pieces of the command are by turns ours and names, which
+// a server may have told: where they would be options, the tool is as good as missing.
+QStringList linesOf(QProcess& process, const QStringList& pieces)
 {
-    QStringList words = QProcess::splitCommand(command);
+    QStringList words = UrlText::commandWords(pieces);
+    if (words.isEmpty()) {
+        return {};
+    }
     const QString program = words.takeFirst();
     process.start(program, words, QIODevice::ReadWrite);
     // A tool that asks for a password itself, for a user with an empty one, is refused at once.
@@ -75,8 +80,9 @@ int CheckSmbShareAuthJob::checkKerberosAuth()
 {
     const QString canonicalHost = StandardPaths::toCanonicalHostName(host());
     QProcess process;
-    const QStringList lines =
-        linesOf(process, QStringLiteral("smbclient //%1/%2 -k -c du").arg(canonicalHost, share()));
+    const QStringList lines = linesOf(
+        process, {QStringLiteral("smbclient //"), canonicalHost, QStringLiteral("/"), share(),
+                  QStringLiteral(" -k -c du")});
     const bool listed = std::any_of(lines.begin(), lines.end(), [](const QString& line) {
         return line.contains(QLatin1String("Total number of bytes"));
     });
@@ -90,17 +96,15 @@ int CheckSmbShareAuthJob::checkKerberosAuth()
 int CheckSmbShareAuthJob::checkAuth(const QString& user, const QString& password) const
 {
     QProcess process;
-    QString userArgument = QStringLiteral("-U %"); // A guest.
-    if (!user.isEmpty()) {
-        userArgument = QLatin1String("-U ") + user;
-        if (!password.isEmpty()) {
-            QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
-            environment.insert(QStringLiteral("PASSWD"), password);
-            process.setProcessEnvironment(environment);
-        }
+    if (!user.isEmpty() && !password.isEmpty()) {
+        QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+        environment.insert(QStringLiteral("PASSWD"), password);
+        process.setProcessEnvironment(environment);
     }
+    const QString guest = QStringLiteral("%");
     const QStringList lines = linesOf(
-        process, QStringLiteral("smbclient //%1/%2 %3 -c du").arg(host(), share(), userArgument));
+        process, {QStringLiteral("smbclient //"), host(), QStringLiteral("/"), share(),
+                  QStringLiteral(" -U "), user.isEmpty() ? guest : user, QStringLiteral(" -c du")});
     QProcessEnvironment environment = process.processEnvironment();
     environment.remove(QStringLiteral("PASSWD"));
     process.setProcessEnvironment(environment);

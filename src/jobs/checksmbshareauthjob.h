@@ -21,7 +21,9 @@ namespace VeyFM {
  * try. There is no bound on the number of tries.
  *
  * Ends with code 4 for a user outside the "fuse" group, and with code 2 and "Login cancelled".
- * A tool that is missing or fails in any other way than by a refusal counts as access.
+ * A tool that is missing or fails in any other way than by a refusal counts as access. So does a
+ * share, host or user whose name would become an option of the tool, or holds a control character:
+ * the tool is not run then. A blank in a name ends the word that it is in.
  */
 class VEYFMVFS_EXPORT CheckSmbShareAuthJob : public Job
 {

@@ -29,6 +29,9 @@ const char configuration[] = R"([global]
 [private]
     path = /run/sandbox/home/alice
     valid users = alice
+[public -Tc .profile name.txt]
+    path = /run/sandbox/home/bob
+    guest ok = yes
 )";
 
 } // namespace

@@ -12,7 +12,8 @@ struct SandboxAccount;
  * Debian's Samba server on port 445 of server.test, for alice and bob. It has the shares
  *
  *   "public"    for everybody, guests too,
- *   "private"   for alice alone.
+ *   "private"   for alice alone,
+ *   "public -Tc .profile name.txt", for everybody, whose name is a trap.
  *
  * The files of the Samba of the machine, settings too, are out of sight for the whole sandbox.
  */

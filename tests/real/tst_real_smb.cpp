@@ -3,6 +3,7 @@
 
 #include "jobs/checksmbshareauthjob.h"
 #include "jobs/mountsmburljob.h"
+#include "jobs/updatesmbentryjob.h"
 #include "real/realmounttest.h"
 #include "real/smbserver.h"
 #include "vfs/standardpaths.h"
@@ -45,6 +46,8 @@ private Q_SLOTS:
     void givenUp_data();
     void givenUp();
     void emptyPasswordIsRefused();
+    void shareIsNoCommand();
+    void urlIsNoCommand();
     void cleanupTestCase();
 
 private:
@@ -74,7 +77,11 @@ void RealSmbTest::initTestCase()
         return;
     }
     QVERIFY2(
-        startVfs(R"({"values": {"SmbBrowser.smbNetworkLocalPath": "/net/smb"}})"),
+        startVfs(R"({"values": {
+            "SmbBrowser.smbNetworkLocalPath": "/net/smb",
+            "SmbBrowser.workgroups": ["SANDBOX"],
+            "SmbBrowser.hosts SANDBOX": ["server.test"],
+            "SmbBrowser.shares server.test SANDBOX": {"public -Tc .profile name.txt": ""}}})"),
         qPrintable(service.errorString()));
 }
 
@@ -256,6 +263,55 @@ void RealSmbTest::emptyPasswordIsRefused()
     QVERIFY(timer.elapsed() < 20000); // A run that nobody ends takes 30 seconds.
     QCOMPARE(auth->calls.mid(0, 2), QStringList({firstAsked, u"rejected alice"_s}));
     QCOMPARE(job->error(), 2);
+}
+
+// The server advertises a share that has smbclient write a file, for whoever splits the name.
+void RealSmbTest::shareIsNoCommand()
+{
+    const QString name = u"public -Tc .profile name.txt"_s;
+    const QString profile = QDir::home().filePath(u".profile"_s);
+    const QByteArray mine = "mine";
+    QFile file(profile);
+    QVERIFY(file.open(QIODevice::WriteOnly) && file.write(mine) == mine.size());
+    file.close();
+    QCOMPARE(QDir::currentPath(), QDir::homePath());
+    QProcess list;
+    list.start(u"smbclient"_s, {u"-L"_s, u"server.test"_s, u"-U"_s, u"%"_s, u"-g"_s});
+    QVERIFY(list.waitForFinished());
+    QVERIFY(list.readAllStandardOutput().contains("Disk|" + name.toLatin1() + '|'));
+
+    vfs->childs(vfs->sambaNetworkEntry());
+    vfs->childs(vfs->entry(u"Samba/SANDBOX"_s));
+    vfs->childs(vfs->entry(u"Samba/SANDBOX/server.test"_s));
+    const Entry share = vfs->placeBase()->placeEntry(u"Samba/SANDBOX/server.test/"_s + name);
+    QVERIFY(share.isSambaSharePlace());
+    UpdateSmbEntryJob job(auth, share);
+    job.setDeleteOnFinish(false);
+    service->takeCalls();
+    job.start();
+    QCOMPARE(service->takeCalls().filter(u"shareLocalPath"_s).size(), 1);
+    QCOMPARE(job.error(), 0);
+    QCOMPARE(auth->calls, QStringList());
+    QCOMPARE(fileContents(profile), mine);
+
+    // What the words would have done.
+    QProcess trap;
+    trap.start(
+        u"smbclient"_s, QStringList(u"//server.test/"_s + name.section(u' ', 0, 0)) +
+                            name.split(u' ').mid(1) + QStringList({u"-U"_s, u"%"_s}));
+    QVERIFY(trap.waitForFinished());
+    QVERIFY(fileContents(profile).contains("name.txt")); // An archive.
+    QVERIFY(QFile::remove(profile));
+}
+
+void RealSmbTest::urlIsNoCommand()
+{
+    // The last quote swallows what the job has behind it.
+    const auto job =
+        makeJob<MountSmbURLJob>(u"smb://server.test/public -N -c \"get name.txt stolen\" \""_s);
+    startToEnd(job.get());
+    QCOMPARE(job->error(), 0);
+    QVERIFY(!QDir::home().exists(u"stolen"_s));
 }
 
 void RealSmbTest::cleanupTestCase()
