@@ -6,6 +6,7 @@
 #include "core/mountpaths.h"
 #include "core/urltext.h"
 #include "jobs/job.h"
+#include "jobs/mountdirectory_p.h"
 #include "service/fusemountsmanagerproxy.h"
 #include "vfs/vfs.h"
 
@@ -69,16 +70,18 @@ void FuseMount::registerMount() const
     VFS::ptr()->fuseMountsManager()->addMount(MountPaths::mountRootUrl(url), mountPath);
 }
 
-void FuseMount::setMountPath(const QString& path)
+bool FuseMount::setMountPath(const QString& path)
 {
     if (path == mountPath) {
-        return;
+        return true;
     }
     removeMountDirectory();
     mountPath = path;
-    if (!QDir(mountPath).exists()) {
-        QDir().mkpath(mountPath);
+    if (!makeMountDirectory(mountPath)) {
+        mountPath.clear(); // It is not ours to remove.
+        return false;
     }
+    return true;
 }
 
 void FuseMount::removeMountDirectory() const

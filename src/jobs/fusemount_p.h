@@ -41,8 +41,8 @@ public:
     void registerMount() const;
 
     /// Makes the directory of the mount, and removes the one of an earlier attempt if that
-    /// differs.
-    void setMountPath(const QString& path);
+    /// differs. False if nothing must be mounted there.
+    bool setMountPath(const QString& path);
     /// Removes the directory, if there is one and it is empty.
     void removeMountDirectory() const;
 

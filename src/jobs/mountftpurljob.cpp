@@ -105,20 +105,19 @@ QString MountFtpURLJob::ftpDirPath()
     return VFS::ptr()->settings()->mountRootPath() + QLatin1String("/ftp");
 }
 
-void MountFtpURLJob::updateMountPath()
+bool MountFtpURLJob::updateMountPath()
 {
     Q_D(MountFtpURLJob);
-    d->mount.setMountPath(ftpDirPath() + slash + d->mount.account());
+    return d->mount.setMountPath(ftpDirPath() + slash + d->mount.account());
 }
 
 void MountFtpURLJob::run()
 {
     Q_D(MountFtpURLJob);
-    if (!d->mount.prepareRun()) {
+    if (!d->mount.prepareRun() || !updateMountPath()) {
         finishedWithError(5, tr("Mounting ftp resource failed"));
         return;
     }
-    updateMountPath();
 
     QStringList arguments;
     const QString user = d->mount.user();

@@ -26,6 +26,9 @@ class MountFtpURLJobPrivate;
  * No tool may be given a host that begins with a dash, nor a host or user with a slash, a comma or
  * a control character, encoded or not. A host in brackets has to be an IPv6 address, with a zone
  * or without.
+ *
+ * The directory is made for the user alone. Where a link or the directory of another user is in its
+ * place, that fails as the tool does.
  */
 class VEYFMVFS_EXPORT MountFtpURLJob : public Job
 {
@@ -49,7 +52,7 @@ private Q_SLOTS:
 private:
     Q_DECLARE_PRIVATE(MountFtpURLJob)
     static QString ftpDirPath();
-    void updateMountPath();
+    bool updateMountPath();
     void run();
     bool checkAlreadyMounted();
     void handleEvents();

@@ -101,14 +101,14 @@ QString MountSFtpURLJob::sftpDirPath()
     return VFS::ptr()->settings()->mountRootPath() + QLatin1String("/sftp");
 }
 
-void MountSFtpURLJob::updateMountPath()
+bool MountSFtpURLJob::updateMountPath()
 {
     Q_D(MountSFtpURLJob);
     QString path = sftpDirPath() + slash + d->mount.account();
     if (isBelowHome(d->mount.url)) {
         path += QLatin1Char('~');
     }
-    d->mount.setMountPath(path);
+    return d->mount.setMountPath(path);
 }
 
 void MountSFtpURLJob::run()
@@ -121,11 +121,10 @@ void MountSFtpURLJob::run()
 bool MountSFtpURLJob::runOnce()
 {
     Q_D(MountSFtpURLJob);
-    if (!d->mount.prepareRun()) {
+    if (!d->mount.prepareRun() || !updateMountPath()) {
         finishedWithError(5, tr("Mounting sftp resource failed"));
         return false;
     }
-    updateMountPath();
 
     // Always the whole tree; the path below it is added to the result alone.
     const QString user = d->mount.user();

@@ -32,6 +32,9 @@ class MountSFtpURLJobPrivate;
  * No tool may be given a host or user that begins with a dash or holds a slash or a control
  * character, nor a user with a colon or brackets, encoded or not. A host in brackets has to be an
  * IPv6 address, with a zone or without.
+ *
+ * The directory is made for the user alone. Where a link or the directory of another user is in its
+ * place, that fails as the tool does.
  */
 class VEYFMVFS_EXPORT MountSFtpURLJob : public Job
 {
@@ -51,7 +54,7 @@ public:
 private:
     Q_DECLARE_PRIVATE(MountSFtpURLJob)
     static QString sftpDirPath();
-    void updateMountPath();
+    bool updateMountPath();
     bool checkAlreadyMounted();
     void run();
     bool runOnce();

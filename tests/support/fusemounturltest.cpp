@@ -3,6 +3,9 @@
 
 #include "support/fusemounturltest.h"
 
+#include <sys/stat.h>
+#include <unistd.h>
+
 using namespace VeyFM;
 
 void FuseMountUrlTest::otherScheme_data()
@@ -155,4 +158,50 @@ void FuseMountUrlTest::unsafeUrls()
     QCOMPARE(auth->calls, QStringList());
     QVERIFY(!QFileInfo::exists(mountDir(QString())));
     QCOMPARE(recordedMounts(), QStringList());
+}
+
+void FuseMountUrlTest::directoriesAreForTheUserAlone()
+{
+    tool->expect({});
+    const mode_t before = ::umask(0);
+    const FuseMountJob job = makeMountJob(url(u"host"_s));
+    finish(job);
+    ::umask(before);
+    QCOMPARE(job->error(), 0);
+    const QString relative = directory(u"host"_s);
+    for (const QString& path : {QString(), relative.section(u'/', 0, 1), relative}) {
+        struct stat info = {};
+        QCOMPARE(::stat(QFile::encodeName(mountDir(path)).constData(), &info), 0);
+        QCOMPARE(int(info.st_mode & 07777), 0700);
+    }
+}
+
+void FuseMountUrlTest::linkInPlaceOfTheDirectory()
+{
+    QVERIFY(QDir().mkpath(mountDir(directory(u"other"_s))));
+    const QString link = mountDir(directory(u"host"_s));
+    QVERIFY(QFile::link(u"other"_s, link));
+    const FuseMountJob job = makeMountJob(url(u"host/a"_s));
+    finish(job);
+    QCOMPARE(job->error(), 5);
+    QCOMPARE(job->errorString(), failure());
+    QCOMPARE(auth->calls, QStringList());
+    QCOMPARE(recordedMounts(), QStringList());
+    QVERIFY(QFileInfo(link).isSymLink());
+    QVERIFY(isMountDir(directory(u"other"_s)));
+}
+
+void FuseMountUrlTest::directoryOfAnotherUser()
+{
+    const QString path = mountDir(directory(u"host"_s));
+    QVERIFY(QDir().mkpath(path));
+    if (::chown(QFile::encodeName(path).constData(), 65534, 65534) != 0) {
+        QSKIP("only root can make the directory of another user");
+    }
+    const FuseMountJob job = makeMountJob(url(u"host/a"_s));
+    finish(job);
+    QCOMPARE(job->error(), 5);
+    QCOMPARE(job->errorString(), failure());
+    QCOMPARE(recordedMounts(), QStringList());
+    QVERIFY(isMountDir(directory(u"host"_s))); // It is not ours to remove.
 }

@@ -31,6 +31,9 @@ private Q_SLOTS:
     void addresses();
     void unsafeUrls_data();
     void unsafeUrls();
+    void directoriesAreForTheUserAlone();
+    void linkInPlaceOfTheDirectory();
+    void directoryOfAnotherUser();
 };
 
 #endif
