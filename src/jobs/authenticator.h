@@ -20,6 +20,8 @@ namespace VeyFM {
  *
  * After a refused login the FTP and SFTP jobs call requestPassword() twice, and use the second
  * answer. An implementation that remembers its last answer until credentialsRejected() asks once.
+ * It has to remember one for each server(): an SFTP job may ask about a jump host on the way, and
+ * about its own host behind that.
  *
  * An implementation may run an event loop while it asks, and the job be deleted in there.
  */
@@ -34,10 +36,11 @@ public:
      *
      * @param isRetry whether an earlier answer was refused; the FTP and SFTP jobs say so always
      * @param title heading for the user, may be empty
-     * @param message text for the user, may be empty
+     * @param message text for the user, may be empty; the tool's own where the SFTP job is asked
+     *     for something else than a password, such as the passphrase of a key or a code
      * @param user in: the user name known so far; out: the one to use
      * @param userChanged in: false, or what the Samba job was told before; out: whether the user
-     *     edited the name
+     *     edited the name. That of a jump host can't be changed: the SFTP job fails
      * @param cancelled in: likewise; out: whether the user gave up. Who answers the Samba job
      *     after having given up at its first question clears it
      */
@@ -63,7 +66,7 @@ public:
 
     QString protocol() const; ///< "smb", "ftp" or "sftp".
     QString domain() const;   ///< The workgroup, for Samba.
-    QString server() const;   ///< The host.
+    QString server() const;   ///< The host, or the jump host that asks.
     QString object() const;   ///< The share, for Samba.
 
 private:

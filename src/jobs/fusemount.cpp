@@ -50,14 +50,29 @@ QString FuseMount::toolHost() const
     return UrlText::toolHost(url);
 }
 
-bool FuseMount::prepareRun() const
+bool FuseMount::prepareRun()
 {
     if (!UrlText::isSafeForTool(url)) {
         removeMountDirectory();
         return false;
     }
+    m_other.reset();
     authenticator->setResource(scheme, QString(), host(), QString());
     return true;
+}
+
+void FuseMount::setOther(const std::optional<Account>& other)
+{
+    if (!m_other && !other) {
+        return;
+    }
+    m_other = other;
+    authenticator->setResource(scheme, QString(), other ? other->host : host(), QString());
+}
+
+QString FuseMount::askedUser() const
+{
+    return m_other ? m_other->user : user();
 }
 
 QString FuseMount::registeredMountPath() const
@@ -98,7 +113,7 @@ FuseMount::Answer FuseMount::requestPassword(
     const QSharedPointer<Authenticator> asked = authenticator; // Outlives its own call.
     bool userChanged = false;
     bool cancelled = false;
-    QString name = user();
+    QString name = askedUser();
     m_isAsking = true;
     *password = asked->requestPassword(true, title, message, name, &userChanged, &cancelled);
     if (!alive) {
@@ -107,6 +122,9 @@ FuseMount::Answer FuseMount::requestPassword(
     m_isAsking = false;
     if (cancelled) {
         return Cancelled;
+    }
+    if (userChanged && m_other) {
+        return OtherUserChanged;
     }
     if (userChanged) {
         url.setUserName(name, QUrl::DecodedMode);
@@ -132,8 +150,8 @@ bool FuseMount::credentialsRejected(const Job* job) const
 {
     const QPointer<const Job> alive(job);
     const QSharedPointer<Authenticator> told = authenticator;
-    if (!user().isEmpty()) {
-        told->credentialsRejected(user());
+    if (!askedUser().isEmpty()) {
+        told->credentialsRejected(askedUser());
     }
     return alive;
 }

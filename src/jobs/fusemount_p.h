@@ -5,10 +5,13 @@
 #define VEYFM_FUSEMOUNT_P_H
 
 #include "jobs/authenticator.h"
+#include "jobs/sshprompt_p.h"
 
 #include <QSharedPointer>
 #include <QString>
 #include <QUrl>
+
+#include <optional>
 
 namespace VeyFM {
 
@@ -30,9 +33,9 @@ public:
     /// The host as a tool wants it, which is not that of the directory for an IPv6 address.
     QString toolHost() const;
 
-    /// Tells the authenticator what it will be asked about. False, with the directory of an
+    /// Tells the authenticator that it will be asked about the URL. False, with the directory of an
     /// earlier attempt removed, if user and host must not be handed to a tool.
-    bool prepareRun() const;
+    bool prepareRun();
 
     /// Where the service says that the URL's root is mounted already; empty if nowhere. Its word
     /// is taken as it stands.
@@ -49,13 +52,24 @@ public:
     // An authenticator may run an event loop, and the job, with this object, be deleted in there.
     // The functions that call it tell, and touch nothing then; the directory goes with the job.
 
-    enum Answer { Answered, UserChanged, Cancelled, JobDeleted };
-    /// Asks for the password; a changed user name goes into the URL.
+    enum Answer {
+        Answered,
+        UserChanged,      ///< In the URL.
+        OtherUserChanged, ///< That of another host, whom nobody can tell the tool.
+        Cancelled,
+        JobDeleted,
+    };
+    /// Asks for the password of the URL's user, or of whom setOther() has named; a changed user
+    /// name goes into the URL.
     Answer requestPassword(
         const Job* job, const QString& title, const QString& message, QString* password);
+    /// Has what follows, up to the next run, be about a user on another host, such as one on the
+    /// way to the URL's; or about the URL again.
+    void setOther(const std::optional<Account>& other);
     /// Asks for a yes or no. False for a deleted job.
     bool askQuestion(const Job* job, const QString& title, const QString& text, bool* yes);
-    /// Tells the authenticator, if there is a user that it can be told of. False for a deleted job.
+    /// Tells the authenticator of whom it was asked about last, if there is a user that it can be
+    /// told of. False for a deleted job.
     bool credentialsRejected(const Job* job) const;
     /// False for a deleted job.
     bool credentialsAccepted(const Job* job) const;
@@ -68,7 +82,11 @@ public:
 private:
     Q_DISABLE_COPY(FuseMount)
 
+    /// Whom the questions are about.
+    QString askedUser() const;
+
     bool m_isAsking = false;
+    std::optional<Account> m_other;
 };
 
 } // namespace VeyFM

@@ -34,6 +34,10 @@ FuseMountJobPrivate::End FuseMountJobPrivate::takeEnd(int exitCode)
     if (std::exchange(restartRequested, false)) {
         return UserChanged;
     }
+    if (std::exchange(failed, false)) {
+        mount.removeMountDirectory();
+        return Failed;
+    }
     if (std::exchange(accessDenied, false)) {
         // This answer goes nowhere, since the tool has ended: the new run asks again. An
         // authenticator that remembers asks its user once.
@@ -46,6 +50,9 @@ FuseMountJobPrivate::End FuseMountJobPrivate::takeEnd(int exitCode)
             return GivenUp;
         case FuseMount::UserChanged:
             return UserChanged;
+        case FuseMount::OtherUserChanged:
+            mount.removeMountDirectory();
+            return Failed;
         case FuseMount::Answered:
             return RunAgain;
         }

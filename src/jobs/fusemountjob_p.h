@@ -39,6 +39,7 @@ public:
     bool accessDenied = false;
     bool restartRequested = false;
     bool cancelled = false;
+    bool failed = false; ///< Whatever the tool says of its end.
 };
 
 } // namespace VeyFM

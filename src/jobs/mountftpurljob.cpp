@@ -199,6 +199,7 @@ void MountFtpURLJob::handleOutput(const QByteArray& output)
         d->process->terminate();
         finishedWithError(2, tr("Accessing ftp resource was cancelled"));
         break;
+    case FuseMount::OtherUserChanged: // There is no other host.
     case FuseMount::UserChanged:
         d->restartRequested = true;
         d->process->terminate();

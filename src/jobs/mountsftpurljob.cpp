@@ -5,15 +5,20 @@
 
 #include "core/mountpaths.h"
 #include "jobs/fusemountjob_p.h"
+#include "jobs/sshprompt_p.h"
 #include "vfs/vfs.h"
 #include "vfs/vfssettings.h"
 
 #include <veysu.h>
 
+#include <QDeadlineTimer>
 #include <QRegExp>
 
 #include <memory>
+#include <optional>
 
+#include <poll.h>
+#include <termios.h>
 #include <unistd.h>
 
 namespace VeyFM {
@@ -25,14 +30,22 @@ public:
 
     FuseMount::Answer requestPassword(QString* password) override
     {
+        return requestPassword(MountSFtpURLJob::tr("Enter host password for user:"), password);
+    }
+    FuseMount::Answer requestPassword(const QString& message, QString* password)
+    {
         // The title says so on the very first question too.
         return mount.requestPassword(
-            q_ptr, MountSFtpURLJob::tr("Access denied"),
-            MountSFtpURLJob::tr("Enter host password for user:"), password);
+            q_ptr, MountSFtpURLJob::tr("Access denied"), message, password);
     }
+
+    bool takeAccount();
+    bool waitsForAnswer() const;
+    void type(const QByteArray& line);
 
     // Made by the first run, and used again. Goes, with the tool, before the directory may.
     std::unique_ptr<VeySu::PtyProcess> process;
+    SshPrompt prompt;
 };
 
 namespace {
@@ -44,17 +57,67 @@ bool isBelowHome(const QUrl& url)
     return url.path(QUrl::FullyDecoded).startsWith(QLatin1String("/~"));
 }
 
+constexpr int silenceMs = 1000;
+constexpr int lookMs = 50;
+
 // A tool that no longer listens shows in its end, so the result is of no use.
-void typeLine(int terminal, const QByteArray& text)
+void send(int terminal, const QByteArray& bytes)
 {
-    if (!text.isEmpty()) {
+    if (!bytes.isEmpty()) {
         [[maybe_unused]] const ssize_t written =
-            ::write(terminal, text.constData(), size_t(text.size()));
+            ::write(terminal, bytes.constData(), size_t(bytes.size()));
     }
-    [[maybe_unused]] const ssize_t ended = ::write(terminal, "\n", 1);
+}
+
+bool showsWhatIsTyped(int terminal)
+{
+    termios mode = {};
+    return ::tcgetattr(terminal, &mode) == 0 && (mode.c_lflag & ECHO) != 0;
 }
 
 } // namespace
+
+void MountSFtpURLJobPrivate::type(const QByteArray& line)
+{
+    const int terminal = process->fd();
+    prompt.clear(showsWhatIsTyped(terminal) ? line + '\n' : QByteArray());
+    send(terminal, line);
+    send(terminal, "\n");
+}
+
+// Has the authenticator know whom the prompt is about. False when that is not certain: a server on
+// the way may have made its prompt look like that of the URL's host, or the other way round.
+bool MountSFtpURLJobPrivate::takeAccount()
+{
+    const QVector<Account> accounts = prompt.accounts();
+    if (accounts.size() > 1) {
+        return false;
+    }
+    // As the tool got the name, and with the case that it writes.
+    const QString own = QString::fromLocal8Bit(mount.host().toLocal8Bit());
+    const bool isOther =
+        !accounts.isEmpty() && accounts.first().host.compare(own, Qt::CaseInsensitive) != 0;
+    mount.setOther(isOther ? std::make_optional(accounts.first()) : std::nullopt);
+    return true;
+}
+
+// Whether the tool, having printed part of a line, adds nothing to it for a while. One that has
+// ended waits for nothing, though a helper in the background may hold its terminal, whose session
+// ended with the tool.
+bool MountSFtpURLJobPrivate::waitsForAnswer() const
+{
+    if (!prompt.isOpen()) {
+        return false;
+    }
+    const QDeadlineTimer silence(silenceMs);
+    pollfd wanted = {process->fd(), POLLIN, 0};
+    while (!silence.hasExpired()) {
+        if (::tcgetsid(wanted.fd) < 0 || ::poll(&wanted, 1, lookMs) > 0) {
+            return false;
+        }
+    }
+    return ::tcgetsid(wanted.fd) >= 0;
+}
 
 MountSFtpURLJob::MountSFtpURLJob(
     QSharedPointer<Authenticator> authenticator, const QString& url, QObject* parent)
@@ -147,17 +210,16 @@ bool MountSFtpURLJob::converseSshfs()
 {
     Q_D(MountSFtpURLJob);
     bool questionAnswered = false;
+    d->prompt.clear();
     while (true) {
         const QByteArray output = d->process->readAll(true);
         if (output.isEmpty()) {
             break;
         }
+        d->prompt.append(output);
         if (output.contains(" password:")) {
-            if (!answerPasswordPrompt()) {
+            if (!answerPrompt(PasswordPrompt)) {
                 return false;
-            }
-            if (d->cancelled || d->restartRequested) {
-                break;
             }
         } else if (output.contains("Connection reset by peer")) {
             // Behind a question this reads as the result of its answer, also where that was a
@@ -176,9 +238,37 @@ bool MountSFtpURLJob::converseSshfs()
                 return false;
             }
             questionAnswered = true;
+        } else if (d->waitsForAnswer()) {
+            if (!answerPrompt(OtherPrompt)) {
+                return false;
+            }
+        }
+        if (d->cancelled || d->restartRequested || d->failed) {
+            endConversation();
+            break;
         }
     }
     return processFinished(d->process->waitForChild());
+}
+
+// Has the tool end without the answer that it wants. An empty one will do for the URL's host, where
+// there is one try. A tool on the way to it has more, and another login or key may come: they are
+// interrupted, as a person would.
+void MountSFtpURLJob::endConversation()
+{
+    Q_D(MountSFtpURLJob);
+    d->type(QByteArray());
+    while (true) {
+        const QByteArray output = d->process->readAll(true);
+        if (output.isEmpty()) {
+            break;
+        }
+        d->prompt.append(output);
+        if (d->waitsForAnswer()) {
+            d->prompt.clear();
+            send(d->process->fd(), "\003");
+        }
+    }
 }
 
 bool MountSFtpURLJob::askHostKeyQuestion(const QByteArray& output)
@@ -200,33 +290,41 @@ bool MountSFtpURLJob::askHostKeyQuestion(const QByteArray& output)
     if (!d->mount.askQuestion(this, tr("Question"), text, &yes)) {
         return false;
     }
-    typeLine(d->process->fd(), yes ? "yes" : "no");
+    d->type(yes ? "yes" : "no");
     return true;
 }
 
 // False when the job has ended.
-bool MountSFtpURLJob::answerPasswordPrompt()
+bool MountSFtpURLJob::answerPrompt(Prompt prompt)
 {
     Q_D(MountSFtpURLJob);
+    if (!d->takeAccount()) {
+        d->failed = true;
+        return true;
+    }
     QString password;
-    switch (d->requestPassword(&password)) {
+    const bool isOther = prompt == OtherPrompt;
+    switch (isOther ? d->requestPassword(d->prompt.text(), &password)
+                    : d->requestPassword(&password)) {
     case FuseMount::JobDeleted:
         return false;
     case FuseMount::Cancelled:
         d->cancelled = true;
-        typeLine(d->process->fd(), QByteArray());
         break;
     case FuseMount::UserChanged:
         d->restartRequested = true;
-        typeLine(d->process->fd(), QByteArray());
+        break;
+    case FuseMount::OtherUserChanged:
+        d->failed = true;
         break;
     case FuseMount::Answered:
-        if (d->process->WaitSlave() != 0) {
+        // Other answers may be shown as they are typed.
+        if (!isOther && d->process->WaitSlave() != 0) {
             // The tool is neither waited for nor ended, and its directory stays.
             finishedWithError(5, tr("Can't pass password to sshfs"));
             return false;
         }
-        typeLine(d->process->fd(), password.toLocal8Bit());
+        d->type(password.toLocal8Bit());
         break;
     }
     return true;

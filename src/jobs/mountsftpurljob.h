@@ -20,14 +20,20 @@ class MountSFtpURLJobPrivate;
  * mount is recorded in the service, so that other processes find it; one that is recorded there
  * already is taken.
  *
+ * A prompt that names another host than the URL's, such as that of a jump host, is asked about that
+ * host and for the user whom it names. One in other words than those for a password (the passphrase
+ * of a key, a code) is asked with the tool's own text as the message, once the tool has been silent
+ * for a second behind it.
+ *
  * Everything happens inside start(), which blocks for as long as the tool runs. A path that
  * begins with "/~" means the user's home directory on the host, and is a mount of its own.
  *
- * Ends with code 5 for another scheme, for a host or user that no tool may be given, and when the
- * tool fails; with code 2 when the user gives up after a refusal. A user who gives up at a
- * password prompt, or refuses the key of a host, leaves the job unfinished: start() returns and
- * finished() never comes. So does a login that is refused in the run in which the key of the host
- * was confirmed.
+ * Ends with code 5 for another scheme, for a host or user that no tool may be given, when the tool
+ * fails, when it can't be told which host a prompt is from, and when the user of another host is
+ * changed, which nobody can tell the tool; with code 2 when the user gives up after a refusal. A
+ * user who gives up at a password prompt, or refuses the key of a host, leaves the job unfinished:
+ * start() returns and finished() never comes. So does a login that is refused in the run in which
+ * the key of the host was confirmed.
  *
  * No tool may be given a host or user that begins with a dash or holds a slash or a control
  * character, nor a user with a colon or brackets, encoded or not. A host in brackets has to be an
@@ -61,7 +67,9 @@ private:
     bool converseSshfs();
     bool processFinished(int status);
     bool askHostKeyQuestion(const QByteArray& output);
-    bool answerPasswordPrompt();
+    enum Prompt { PasswordPrompt, OtherPrompt };
+    bool answerPrompt(Prompt prompt);
+    void endConversation();
 };
 
 } // namespace VeyFM

@@ -26,9 +26,20 @@ inline void add(const char* host)
     file.write(QByteArray(host) + ' ' + SshServer::publicKey(host) + '\n');
 }
 
+/// What ssh reads before it connects; "clear()" takes it away too.
+inline void setConfiguration(const QByteArray& lines)
+{
+    QDir::home().mkpath(QStringLiteral(".ssh"));
+    QFile file(QDir::homePath() + QStringLiteral("/.ssh/config"));
+    QVERIFY(file.open(QIODevice::WriteOnly));
+    file.setPermissions(QFile::ReadOwner | QFile::WriteOwner);
+    file.write(lines);
+}
+
 inline void clear()
 {
     QFile::remove(path());
+    QFile::remove(QDir::homePath() + QStringLiteral("/.ssh/config"));
 }
 
 } // namespace KnownHosts

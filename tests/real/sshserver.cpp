@@ -3,12 +3,14 @@
 
 #include "real/sshserver.h"
 
+#include "real/sandbox.h"
 #include "real/sandboxsystem.h"
 
 #include <QFile>
 #include <QProcess>
 
 #include <sys/stat.h>
+#include <unistd.h>
 
 namespace {
 
@@ -38,7 +40,21 @@ QByteArray SshServer::directory(const char* host)
 
 QByteArray SshServer::configuration() const
 {
-    const bool password = m_login == Password;
+    const char* logins = "";
+    switch (m_login) {
+    case Password:
+        logins = "PubkeyAuthentication no\nPasswordAuthentication yes\n"
+                 "KbdInteractiveAuthentication no\nUsePAM no\n";
+        break;
+    case KeyboardInteractive:
+        logins = "PubkeyAuthentication no\nPasswordAuthentication no\n"
+                 "KbdInteractiveAuthentication yes\nUsePAM yes\n";
+        break;
+    case Key:
+        logins = "PubkeyAuthentication yes\nPasswordAuthentication no\n"
+                 "KbdInteractiveAuthentication no\nUsePAM no\n";
+        break;
+    }
     return QByteArray("ListenAddress ") + m_host +
            "\n"
            "HostKey " +
@@ -47,12 +63,16 @@ QByteArray SshServer::configuration() const
            "PidFile none\n"
            "LogLevel VERBOSE\n"
            "UseDNS no\n"
-           "AuthorizedKeysFile none\n"
-           "PubkeyAuthentication no\n"
-           "PasswordAuthentication " +
-           (password ? "yes\nKbdInteractiveAuthentication no\nUsePAM no\n"
-                     : "no\nKbdInteractiveAuthentication yes\nUsePAM yes\n") +
+           "AuthorizedKeysFile " +
+           directory(m_host) + "/client.pub\n" + logins +
            "Subsystem sftp /usr/lib/openssh/sftp-server\n";
+}
+
+bool SshServer::makeClientKey() const
+{
+    const QByteArray file = directory(m_host) + "/client";
+    return run({keygen, "-q", "-t", "ed25519", "-N", passphrase, "-C", "tester", "-f", file}) &&
+           ::chown(file.constData(), Sandbox::tester.id, Sandbox::tester.id) == 0;
 }
 
 bool SshServer::start()
@@ -63,8 +83,9 @@ bool SshServer::start()
     ::mkdir("/run/sshd", 0755);
     return ::mkdir(folder.constData(), 0755) == 0 &&
            SandboxSystem::writeFile(config, configuration()) &&
-           (m_login == Password || SandboxSystem::replaceFile("/etc/pam.d/sshd", pam)) &&
+           (m_login != KeyboardInteractive || SandboxSystem::replaceFile("/etc/pam.d/sshd", pam)) &&
            run({keygen, "-q", "-t", "ed25519", "-N", "", "-C", "sandbox", "-f", folder + "/key"}) &&
+           (m_login != Key || makeClientKey()) &&
            listen({"/usr/sbin/sshd", "-D", "-e", "-f", config}, m_host, 22);
 }
 
@@ -72,6 +93,11 @@ QByteArray SshServer::publicKey(const char* host)
 {
     QFile file(QFile::decodeName(directory(host) + "/key.pub"));
     return file.open(QIODevice::ReadOnly) ? file.readAll().trimmed() : QByteArray();
+}
+
+QString SshServer::clientKey(const char* host)
+{
+    return QFile::decodeName(directory(host) + "/client");
 }
 
 QString SshServer::fingerprint(const char* host)

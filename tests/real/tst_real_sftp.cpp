@@ -5,15 +5,6 @@
 #include "real/knownhosts.h"
 #include "real/realmounttest.h"
 
-#include <QDeadlineTimer>
-
-#include <atomic>
-#include <csignal>
-#include <fcntl.h>
-#include <termios.h>
-#include <thread>
-#include <unistd.h>
-
 using namespace VeyFM;
 
 namespace {
@@ -37,14 +28,12 @@ QString askedForKey()
                SshServer::fingerprint(Sandbox::serverHost));
 }
 
-// Whether a terminal does not show what is typed, as while it waits for a password.
-bool hidesInput(const QString& terminal)
+const QString askedInOtherWords =
+    QStringLiteral("retry [sftp  other.test ] Access denied|(alice@other.test) Password: |alice");
+
+bool hasVersion6()
 {
-    const int fd = ::open(QFile::encodeName(terminal).constData(), O_RDONLY | O_NOCTTY | O_CLOEXEC);
-    termios mode = {};
-    const bool hidden = fd >= 0 && ::tcgetattr(fd, &mode) == 0 && (mode.c_lflag & ECHO) == 0;
-    ::close(fd);
-    return hidden;
+    return QFile::exists(QStringLiteral("/proc/net/if_inet6"));
 }
 
 } // namespace
@@ -66,7 +55,15 @@ private Q_SLOTS:
     void toolsOutliveTheJob();
     void cannotConnect_data();
     void cannotConnect();
-    void otherPromptIsWaitedFor();
+    void otherPromptIsAsked();
+    void otherPromptRefuses();
+    void jumpHostIsAskedAboutByItself();
+    void jumpHostRefuses();
+    void givenUpAtAJumpHost();
+    void hostOfAnotherName();
+    void passphraseOfAKey();
+    void givenUpAtAPassphrase();
+    void addressOfVersion6();
 
 private:
     /// Everything happens inside start(). True when it said that it has ended.
@@ -246,43 +243,112 @@ void RealSftpTest::cannotConnect()
     verifyNothingLeft();
 }
 
-// "(alice@other.test) Password: " is a prompt that the job does not know.
-void RealSftpTest::otherPromptIsWaitedFor()
+// "(alice@other.test) Password: ", which PAM makes of it, is shown as it is.
+void RealSftpTest::otherPromptIsAsked()
 {
     KnownHosts::add(Sandbox::otherHost);
-    const auto job = makeJob<MountSFtpURLJob>(u"sftp://alice@other.test/"_s);
-    std::atomic<bool> prompted = false;
-    std::atomic<bool> ended = false;
-    std::atomic<bool> waited = false;
-    std::thread user([&] {
-        const auto terminalHidesInput = [] {
-            const QList<int> tools = processesNamed("sshfs");
-            return tools.size() == 1 &&
-                   hidesInput(QFile::symLinkTarget(u"/proc/%1/fd/0"_s.arg(tools.first())));
-        };
-        const QDeadlineTimer patience(20000);
-        while (!prompted && !ended && !patience.hasExpired()) {
-            prompted = terminalHidesInput();
-        }
-        const QDeadlineTimer bound(1000);
-        while (prompted && !ended && !bound.hasExpired()) {
-            ::usleep(10000);
-        }
-        waited = !ended && terminalHidesInput();
-        for (const int tool : processesNamed("sshfs")) {
-            ::kill(tool, SIGTERM);
-        }
-    });
-    const bool finished = starts(job.get());
-    ended = true;
-    user.join();
-    QVERIFY(prompted);
-    QVERIFY(waited);
-    QVERIFY(finished);
-    QCOMPARE(job->error(), 5);
-    QCOMPARE(job->errorString(), u"Mounting sftp resource failed"_s);
-    QCOMPARE(auth->calls, QStringList());
-    verifyNothingLeft();
+    auth->answers = {password(Sandbox::alice)};
+    const auto job = makeJob<MountSFtpURLJob>(u"sftp://alice@other.test/~/"_s);
+    QVERIFY(starts(job.get()));
+    QCOMPARE(auth->calls, QStringList({askedInOtherWords, accepted}));
+    QCOMPARE(fileContents(job->localPath() + u"name.txt"_s), QByteArray("alice"));
+}
+
+void RealSftpTest::otherPromptRefuses()
+{
+    KnownHosts::add(Sandbox::otherHost);
+    auth->answers = {wrongPassword(), wrongPassword(), password(Sandbox::alice)};
+    QVERIFY(starts(makeJob<MountSFtpURLJob>(u"sftp://alice@other.test/"_s).get()));
+    QCOMPARE(
+        auth->calls, QStringList(
+                         {askedInOtherWords, u"rejected alice"_s,
+                          asked(u"alice"_s, Sandbox::otherHost), askedInOtherWords, accepted}));
+}
+
+void RealSftpTest::jumpHostIsAskedAboutByItself()
+{
+    KnownHosts::add(Sandbox::otherHost);
+    KnownHosts::setConfiguration("Host other.test\nProxyJump bob@server.test\n");
+    auth->answers = {password(Sandbox::bob), password(Sandbox::alice)};
+    const auto job = makeJob<MountSFtpURLJob>(u"sftp://alice@other.test/~/"_s);
+    QVERIFY(starts(job.get()));
+    QCOMPARE(auth->calls, QStringList({asked(u"bob"_s), askedInOtherWords, accepted}));
+    QCOMPARE(fileContents(job->localPath() + u"name.txt"_s), QByteArray("alice"));
+}
+
+void RealSftpTest::jumpHostRefuses()
+{
+    KnownHosts::add(Sandbox::otherHost);
+    KnownHosts::setConfiguration("Host other.test\nProxyJump bob@server.test\n");
+    // ssh asks three times there.
+    auth->answers = {wrongPassword(), wrongPassword(),        wrongPassword(),
+                     wrongPassword(), password(Sandbox::bob), password(Sandbox::alice)};
+    QVERIFY(starts(makeJob<MountSFtpURLJob>(u"sftp://alice@other.test/"_s).get()));
+    const QString askBob = asked(u"bob"_s);
+    QCOMPARE(
+        auth->calls, QStringList(
+                         {askBob, askBob, askBob, u"rejected bob"_s, askBob, askBob,
+                          askedInOtherWords, accepted}));
+}
+
+void RealSftpTest::givenUpAtAJumpHost()
+{
+    KnownHosts::add(Sandbox::otherHost);
+    KnownHosts::setConfiguration("Host other.test\nProxyJump bob@server.test\n");
+    auth->answers = {Auth::cancel()};
+    verifySilentEnd(u"sftp://alice@other.test/"_s);
+    QCOMPARE(auth->calls, QStringList(asked(u"bob"_s)));
+}
+
+// Of the host that ssh goes to in the end.
+void RealSftpTest::hostOfAnotherName()
+{
+    KnownHosts::setConfiguration("Host work\nHostName server.test\n");
+    auth->answers = {password(Sandbox::alice)};
+    QVERIFY(starts(makeJob<MountSFtpURLJob>(u"sftp://alice@work/"_s).get()));
+    QCOMPARE(auth->calls, QStringList({asked(u"alice"_s), accepted}));
+}
+
+void RealSftpTest::passphraseOfAKey()
+{
+    const QString key = SshServer::clientKey(Sandbox::keyHost);
+    KnownHosts::add(Sandbox::keyHost);
+    KnownHosts::setConfiguration("Host key.test\nIdentityFile " + QFile::encodeName(key) + '\n');
+    auth->answers = {Auth::password(QString::fromLatin1(SshServer::passphrase))};
+    const auto job = makeJob<MountSFtpURLJob>(u"sftp://alice@key.test/~/"_s);
+    QVERIFY(starts(job.get()));
+    QCOMPARE(
+        auth->calls,
+        QStringList(
+            {u"retry [sftp  key.test ] Access denied|Enter passphrase for key '%1': |alice"_s.arg(
+                 key),
+             accepted}));
+    QCOMPARE(fileContents(job->localPath() + u"name.txt"_s), QByteArray("alice"));
+}
+
+void RealSftpTest::givenUpAtAPassphrase()
+{
+    KnownHosts::add(Sandbox::keyHost);
+    KnownHosts::setConfiguration(
+        "Host key.test\nIdentityFile " + QFile::encodeName(SshServer::clientKey(Sandbox::keyHost)) +
+        '\n');
+    auth->answers = {Auth::cancel()};
+    verifySilentEnd(u"sftp://alice@key.test/"_s);
+    QCOMPARE(auth->calls.size(), 1);
+}
+
+void RealSftpTest::addressOfVersion6()
+{
+    if (!hasVersion6()) {
+        QSKIP("no IPv6 here");
+    }
+    KnownHosts::add("::1");
+    auth->answers = {password(Sandbox::alice)};
+    const auto job = makeJob<MountSFtpURLJob>(u"sftp://alice@[::1]/~/"_s);
+    QVERIFY(starts(job.get()));
+    QCOMPARE(auth->calls, QStringList({asked(u"alice"_s, "::1"), accepted}));
+    QCOMPARE(job->localPath(), mountDir(u"/sftp/alice@::1~//"_s));
+    QCOMPARE(fileContents(job->localPath() + u"name.txt"_s), QByteArray("alice"));
 }
 
 int main(int argc, char** argv)
@@ -292,6 +358,10 @@ int main(int argc, char** argv)
     sandbox.addServer(std::make_unique<SshServer>(Sandbox::serverHost));
     sandbox.addServer(
         std::make_unique<SshServer>(Sandbox::otherHost, SshServer::KeyboardInteractive));
+    sandbox.addServer(std::make_unique<SshServer>(Sandbox::keyHost, SshServer::Key));
+    if (hasVersion6()) {
+        sandbox.addServer(std::make_unique<SshServer>("::1"));
+    }
     return sandbox.run([&] { return runSandboxTests<RealSftpTest>(argc, argv); });
 }
 
