@@ -21,7 +21,9 @@ private Q_SLOTS:
     void otherUser();
     void cannotConnect_data();
     void cannotConnect();
-    void morePromptsThanPasswords();
+    void otherPrompts();
+    void otherPromptGivenUp();
+    void descriptorOfAHostOfAnotherName();
     void interrupted();
     void fromDescriptor();
     void sambaLogin();
@@ -204,20 +206,51 @@ void RealToolTest::cannotConnect()
     QVERIFY(!QFile::exists(mountDir(QString())));
 }
 
-void RealToolTest::morePromptsThanPasswords()
+// From a jump host, and in other words than for a password.
+void RealToolTest::otherPrompts()
 {
-    // The question of this server is none that a job knows.
+    KnownHosts::add(Sandbox::serverHost);
     KnownHosts::add(Sandbox::otherHost);
-    const auto session = onTerminal("mount --timeout 2 sftp://alice@other.test/");
+    KnownHosts::setConfiguration("Host other.test\nProxyJump bob@server.test\n");
+    const auto session = onTerminal("mount sftp://alice@other.test/~/name.txt");
+    QVERIFY(session->waitFor("Password for bob on sftp://server.test: "));
+    session->type(keys(Sandbox::bob.password));
+    QVERIFY(session->waitFor("(alice@other.test) Password: "));
+    session->type(keys(Sandbox::alice.password));
+    QCOMPARE(session->waitForEnd(), 0);
+    QCOMPARE(fileContents(mountDir(u"/sftp/alice@other.test~/name.txt"_s)), QByteArray("alice"));
+}
+
+void RealToolTest::otherPromptGivenUp()
+{
+    KnownHosts::add(Sandbox::serverHost);
+    KnownHosts::setConfiguration("Host other.test\nProxyJump bob@server.test\n");
+    const auto session = onTerminal("mount sftp://alice@other.test/");
+    QVERIFY(session->waitFor("Password for bob on sftp://server.test: "));
+    session->type("\004");
     QCOMPARE(session->waitForEnd(), 1);
-    QCOMPARE(
-        session->output(),
-        QByteArray("veyfm-vfs: sftp://alice@other.test/: no progress within 2 s: sshfs may be "
-                   "waiting for more than a password; look with 'ssh alice@other.test' whether the "
-                   "host answers and lets you in\n"));
+    QVERIFY2(
+        session->output().endsWith("veyfm-vfs: sftp://alice@other.test/: cancelled\n"),
+        session->output().constData());
     QTRY_VERIFY(processesNamed("ssh").isEmpty());
     QVERIFY(processesNamed("sshfs").isEmpty());
     QVERIFY(!QFile::exists(mountDir(QString())));
+}
+
+// By the name that the configuration has for it.
+void RealToolTest::descriptorOfAHostOfAnotherName()
+{
+    KnownHosts::add(Sandbox::serverHost);
+    KnownHosts::setConfiguration("Host work\nHostName server.test\n");
+    QProcess process;
+    process.setProcessEnvironment(m_service->environment());
+    process.start(
+        toolPath(), ToolScene::words("mount --password-fd 0 sftp://alice@work/~/name.txt"));
+    process.write(keys(Sandbox::alice.password));
+    process.closeWriteChannel();
+    QVERIFY(process.waitForFinished());
+    QCOMPARE(process.readAllStandardError(), QByteArray());
+    QCOMPARE(process.exitCode(), 0);
 }
 
 void RealToolTest::interrupted()

@@ -3,8 +3,10 @@
 
 #include "mount/terminalauthenticator.h"
 
+#include "jobs/mountsftpurljob.h"
 #include "mount/descendants.h"
 #include "mount/mounturl.h"
+#include "mount/sshconfig.h"
 #include "report.h"
 #include "spinner.h"
 #include "terminal.h"
@@ -37,6 +39,17 @@ void leaveNoCoreFile()
 QString wasCancelled()
 {
     return QStringLiteral("cancelled");
+}
+
+QString threeWereRefused()
+{
+    return QStringLiteral("three passwords were refused");
+}
+
+/// Whether ssh asks for something else than a password, in words of its own.
+bool isOwnWords(const QString& protocol, const QString& message)
+{
+    return protocol == sftp && message != MountSFtpURLJob::tr("Enter host password for user:");
 }
 
 /// Why no tool can be given this password, or empty.
@@ -128,9 +141,10 @@ void TerminalAuthenticator::beginJob()
     m_userChangedLast = false;
 }
 
-void TerminalAuthenticator::setUser(const QString& user)
+void TerminalAuthenticator::setAccount(const QString& user, const QString& host)
 {
     m_user = user;
+    m_host = host;
 }
 
 QString TerminalAuthenticator::sshCommand() const
@@ -138,7 +152,7 @@ QString TerminalAuthenticator::sshCommand() const
     // Other names would have to be quoted.
     static const QRegularExpression plain(
         QStringLiteral("^[\\w.@+-]+$"), QRegularExpression::UseUnicodePropertiesOption);
-    const QString host = server();
+    const QString host = m_host.isEmpty() ? server() : m_host;
     return QStringLiteral("ssh ") +
            (plain.match(m_user).hasMatch() ? m_user + QLatin1Char('@') + host : host);
 }
@@ -174,7 +188,7 @@ bool TerminalAuthenticator::isWorthAnotherJob()
     if (!m_whyGivenUp.isEmpty() || !m_keyConfirmed || !m_passwordGiven) {
         return false;
     }
-    m_wasRefused = true;
+    m_tries[resource()].wasRefused = true;
     return true;
 }
 
@@ -185,6 +199,17 @@ QString TerminalAuthenticator::resource() const
         text += QLatin1Char('/') + object();
     }
     return text;
+}
+
+QString TerminalAuthenticator::whose(const QString& user) const
+{
+    return user.isEmpty() ? resource() : QStringLiteral("%1 on %2").arg(user, resource());
+}
+
+/// Whether it is another host than that of the URL that asks.
+bool TerminalAuthenticator::isOnTheWay() const
+{
+    return protocol() == sftp && !isSshNameOf(server(), m_user, m_host);
 }
 
 QString TerminalAuthenticator::giveUp(const QString& why, bool* cancelled)
@@ -199,13 +224,13 @@ QString TerminalAuthenticator::giveUp(const QString& why, bool* cancelled)
 void TerminalAuthenticator::credentialsRejected(const QString& user)
 {
     Q_UNUSED(user)
-    m_wasRefused = true;
+    m_tries[resource()].wasRefused = true;
 }
 
 void TerminalAuthenticator::credentialsAccepted()
 {
     m_wasAccepted = true;
-    m_wasRefused = false;
+    m_tries[resource()].wasRefused = false;
 }
 
 QString TerminalAuthenticator::requestPassword(
@@ -217,15 +242,10 @@ QString TerminalAuthenticator::requestPassword(
     if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty()) {
         return giveUp(wasCancelled(), cancelled);
     }
-    if (m_triedResource != resource()) {
-        m_triedResource = resource();
-        m_tries = 0;
-        m_wasRefused = false;
-    }
     // A job that asks when its tool has ended throws the answer away.
     const bool isUsed = protocol() == smb || hasRunningDescendants();
     if (!isUsed) {
-        m_wasRefused = true; // Without a user the jobs do not tell.
+        m_tries[resource()].wasRefused = true; // Without a user the jobs do not tell.
     }
     QString why = whyNoMoreTries(isUsed);
     if (!why.isEmpty()) {
@@ -233,7 +253,10 @@ QString TerminalAuthenticator::requestPassword(
     }
 
     const Asking asking(*this);
-    if (isUsed && m_wasRefused && isPersonAsked()) {
+    if (isUsed && isOwnWords(protocol(), message)) {
+        return answerOwnWords(message, user, cancelled);
+    }
+    if (isUsed && m_tries.value(resource()).wasRefused && isPersonAsked()) {
         m_prompt.show(message.isEmpty() || protocol() != smb ? title : message);
     }
     QString name = user;
@@ -257,18 +280,39 @@ QString TerminalAuthenticator::requestPassword(
         return QString();
     }
     Secret password;
-    why = whyNoPassword(name, password);
+    why = whyNoPassword(name, QStringLiteral("Password for %1: ").arg(whose(name)), password);
     if (!why.isEmpty()) {
         return giveUp(why, cancelled);
     }
-    ++m_tries;
+    ++m_tries[resource()].count;
     return password.text();
+}
+
+QString
+TerminalAuthenticator::answerOwnWords(const QString& question, const QString& user, bool* cancelled)
+{
+    const bool isPassphrase = question.startsWith(QLatin1String("Enter passphrase for key"));
+    if (isPassphrase && !isPersonAsked()) {
+        return QString(); // There may be another way to log in.
+    }
+    Tries& tries = m_tries[isPassphrase ? question : resource()];
+    QString why = tries.count == mostTries ? threeWereRefused() : QString();
+    Secret answer;
+    if (why.isEmpty()) {
+        why = whyNoPassword(user, question, answer);
+    }
+    if (!why.isEmpty()) {
+        return giveUp(why, cancelled);
+    }
+    ++tries.count;
+    m_passwordGiven = true;
+    return answer.text();
 }
 
 void TerminalAuthenticator::noteChangedUser(const QString& user)
 {
     m_user = user;
-    m_wasRefused = false;
+    m_tries[resource()].wasRefused = false;
     m_userChangedLast = true;
     const std::lock_guard<std::mutex> lock(m_changedUsersLock);
     m_changedUsers.append(user);
@@ -277,11 +321,12 @@ void TerminalAuthenticator::noteChangedUser(const QString& user)
 /// Why there is no use in another try; empty when there is.
 QString TerminalAuthenticator::whyNoMoreTries(bool isUsed) const
 {
-    if (!m_wasRefused) {
+    const Tries tries = m_tries.value(resource());
+    if (!tries.wasRefused) {
         return QString();
     }
-    if (m_tries == mostTries) {
-        return QStringLiteral("three passwords were refused");
+    if (tries.count == mostTries) {
+        return threeWereRefused();
     }
     if (m_descriptorRead) {
         return QStringLiteral("the password was refused");
@@ -366,29 +411,17 @@ QString TerminalAuthenticator::whyNoUserName(QString& user)
 }
 
 /// Why there is no password; else it goes into @p password.
-QString TerminalAuthenticator::whyNoPassword(const QString& user, Secret& password)
+QString
+TerminalAuthenticator::whyNoPassword(const QString& user, const QString& question, Secret& password)
 {
-    const QString whose =
-        user.isEmpty() ? resource() : QStringLiteral("%1 on %2").arg(user, resource());
     if (m_login.passwordDescriptor >= 0) {
-        if (m_descriptorRead) {
-            return QStringLiteral("a second password is needed, for ") + whose;
-        }
-        m_descriptorRead = true;
-        if (m_prompt.readLine(m_login.passwordDescriptor, password)) {
-            return whyUnfit(password, protocol());
-        }
-        m_isDescriptorSilent = m_prompt.isCancelled();
-        return m_isDescriptorSilent ? wasCancelled()
-                                    : QStringLiteral("no password could be read from descriptor %1")
-                                          .arg(m_login.passwordDescriptor);
+        return whyNotFromDescriptor(user, password);
     }
     if (!isPersonAsked()) {
         return whyNoAnswer(
-            QStringLiteral("a password for ") + whose, QStringLiteral("--password-fd"));
+            QStringLiteral("a password for ") + whose(user), QStringLiteral("--password-fd"));
     }
     while (true) {
-        const QString question = QStringLiteral("Password for %1: ").arg(whose);
         if (!m_prompt.ask(question, Prompt::Hidden, password)) {
             return whyNotAnswered();
         }
@@ -398,6 +431,26 @@ QString TerminalAuthenticator::whyNoPassword(const QString& user, Secret& passwo
         }
         m_prompt.show(why);
     }
+}
+
+QString TerminalAuthenticator::whyNotFromDescriptor(const QString& user, Secret& password)
+{
+    if (m_descriptorRead) {
+        return QStringLiteral("a second password is needed, for ") + whose(user);
+    }
+    if (isOnTheWay()) {
+        return QStringLiteral("a password for %1 is needed, and that of --password-fd is for %2: "
+                              "let that host take a key, or type both")
+            .arg(whose(user), m_host);
+    }
+    m_descriptorRead = true;
+    if (m_prompt.readLine(m_login.passwordDescriptor, password)) {
+        return whyUnfit(password, protocol());
+    }
+    m_isDescriptorSilent = m_prompt.isCancelled();
+    return m_isDescriptorSilent ? wasCancelled()
+                                : QStringLiteral("no password could be read from descriptor %1")
+                                      .arg(m_login.passwordDescriptor);
 }
 
 bool TerminalAuthenticator::askQuestion(const QString& title, const QString& text)

@@ -9,6 +9,7 @@
 #include "mount/prompt.h"
 #include "mount/secret.h"
 
+#include <QHash>
 #include <QStringList>
 
 #include <functional>
@@ -25,6 +26,10 @@ namespace Tool {
  * by its tool having ended, and the person is not troubled with it. There are three tries, and
  * one for a password that is not typed. Then, and when the person gives up, every question of the
  * job is answered with "cancelled", and whyGivenUp() says why.
+ *
+ * What ssh asks in other words than for a password is asked in its words. Where nobody can be, it
+ * has to do without the passphrase of a key, and a password that is not typed goes to the host of
+ * the URL alone, not to one on the way.
  *
  * From the first object on the process leaves no core file.
  */
@@ -45,8 +50,9 @@ public:
     /// resource are counted on.
     void beginJob();
 
-    /// Whom the URL of the next job names; may be empty. Its questions may change that.
-    void setUser(const QString& user);
+    /// Whom the URL of the next job names. The user may be empty, and its questions may change
+    /// that.
+    void setAccount(const QString& user, const QString& host);
 
     /// What a person types to look at the host of an SFTP job.
     QString sshCommand() const;
@@ -84,26 +90,36 @@ public:
 private:
     class Asking;
 
+    /// What became of the answers to one question.
+    struct Tries
+    {
+        int count = 0;
+        bool wasRefused = false;
+    };
+
     QString resource() const;
+    QString whose(const QString& user) const;
+    bool isOnTheWay() const;
     bool isPersonAsked() const;
     bool isUserAsked(const QString& user, bool isUsed) const;
+    QString answerOwnWords(const QString& question, const QString& user, bool* cancelled);
     QString whyNoAnswer(const QString& needed, const QString& options) const;
     QString whyNotAnswered() const;
     QString whyNoMoreTries(bool isUsed) const;
     QString whyNoUserName(QString& user);
-    QString whyNoPassword(const QString& user, Secret& password);
+    QString whyNoPassword(const QString& user, const QString& question, Secret& password);
+    QString whyNotFromDescriptor(const QString& user, Secret& password);
     void noteChangedUser(const QString& user);
     QString giveUp(const QString& why, bool* cancelled);
 
     const Login m_login;
     Prompt m_prompt;
     QString m_user;
+    QString m_host;
     std::function<void(bool)> m_askingHandler;
 
-    QString m_triedResource; ///< What the next two are about.
-    int m_tries = 0;
-    bool m_wasRefused = false;
-    bool m_passwordGiven = false; ///< Since the last refusal.
+    QHash<QString, Tries> m_tries; ///< By resource, or by the question that is not its password.
+    bool m_passwordGiven = false;  ///< Since the last refusal.
     bool m_descriptorRead = false;
     bool m_isDescriptorSilent = false;
     bool m_wasAccepted = false;

@@ -62,7 +62,7 @@ public:
     {
         while (true) {
             const QString jobUrl = url();
-            m_authenticator->setUser(userOf(jobUrl));
+            m_authenticator->setAccount(userOf(jobUrl), QUrl(jobUrl).host(QUrl::FullyDecoded));
             MadeJob job(m_authenticator, jobUrl);
             const JobResult result = m_watch.run(job, m_doing);
             m_wasStopped =
