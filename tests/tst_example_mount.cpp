@@ -30,6 +30,9 @@ private Q_SLOTS:
     void cleanup();
     void asksOnceForWhatTheJobAsksTwice();
     void takesWhatIsMounted();
+    void showsEachFolderOfAServer();
+    void asksForEachHostByItself();
+    void asksInOtherWords();
     void endsWhereTheJobDoesNot_data();
     void endsWhereTheJobDoesNot();
     void tellsFailures();
@@ -49,13 +52,16 @@ private:
 
 void ExampleMountTest::initTestCase()
 {
-    QVERIFY2(service.start(object(R"({"echo": true})")), qPrintable(service.errorString()));
+    QVERIFY2(
+        service.start(object(R"({"echo": true, "remember": true})")),
+        qPrintable(service.errorString()));
 }
 
 void ExampleMountTest::init()
 {
     tool = std::make_unique<StandIn>("sshfs");
     service->setValue(QStringLiteral("NetworkMountsManager.mounts"), QJsonObject());
+    service->setValue(QStringLiteral("FuseMountsManager.mounts"), QJsonObject());
 }
 
 void ExampleMountTest::cleanup()
@@ -87,7 +93,9 @@ void ExampleMountTest::asksOnceForWhatTheJobAsksTwice()
 
     QCOMPARE(example->output().count("Password: "), 2);
     QCOMPARE(example->output().count("The login was refused."), 1);
-    QVERIFY2(example->output().endsWith("SFTP/anna@host/first\n"), example->output().constData());
+    QVERIFY2(
+        example->output().endsWith("SFTP/anna@host/letters/first\n"),
+        example->output().constData());
     QVERIFY(!example->output().contains("wrong") && !example->output().contains("right"));
     QCOMPARE(tool->input(1), QByteArray("\n"));
     QCOMPARE(tool->input(2), QByteArray("wrong\n"));
@@ -105,6 +113,70 @@ void ExampleMountTest::takesWhatIsMounted()
     const auto example = run(QStringLiteral("sftp://anna@host/letters"));
     QCOMPARE(example->waitForEnd(), 0);
     QCOMPARE(example->output(), QByteArray("SFTP/anna@host/letters/first\n"));
+}
+
+void ExampleMountTest::showsEachFolderOfAServer()
+{
+    const QByteArray root = "home/.vey-fm-vfs/sftp/bert@host";
+    QVERIFY(scene.makeDir(root) && scene.makeDir(root + "/letters"));
+    QVERIFY(scene.makeFile(root + "/letters/first"));
+    QVERIFY(scene.makeDir(root + "/photos") && scene.makeFile(root + "/photos/second"));
+    QVERIFY(scene.makeDir(root + "~") && scene.makeFile(root + "~/third"));
+    tool->expect({});
+    tool->expect({}); // The home there is a mount of its own.
+
+    const auto output = [this](const char* url) {
+        const auto example = run(QString::fromLatin1(url));
+        return example->waitForEnd() == 0 ? example->output() : "failed: " + example->output();
+    };
+    QCOMPARE(output("sftp://bert@host/letters"), QByteArray("SFTP/bert@host/letters/first\n"));
+    QCOMPARE(output("sftp://bert@host/photos/"), QByteArray("SFTP/bert@host/photos/second\n"));
+    const QByteArray third = scene.bytes(root + "~/third\n");
+    QCOMPARE(output("sftp://bert@host/~/"), third);
+    QCOMPARE(output("sftp://bert@host/~"), third);
+    QCOMPARE(
+        output("sftp://bert@host/"), QByteArray("SFTP/bert@host/letters\nSFTP/bert@host/photos\n"));
+    QCOMPARE(
+        output("sftp://bert@host/missing"),
+        QByteArray("failed: mount-example: the server has no such folder\n"));
+}
+
+void ExampleMountTest::asksForEachHostByItself()
+{
+    const QByteArrayList asksJumpHost = {
+        "echo off", "out jumper@gw's password: ", "read", "echo on"};
+    tool->expect(asksJumpHost + refuses);
+    tool->expect(asksJumpHost + asks);
+    const auto example = run(QStringLiteral("sftp://anna@host/"));
+    QVERIFY2(example->waitFor("User on gw [jumper]: "), example->output().constData());
+    example->type("\n");
+    QVERIFY(example->waitFor("Password: "));
+    example->type("first\n");
+    for (const char* password : {"wrong\n", "right\n"}) {
+        const int times = password[0] == 'w' ? 1 : 2;
+        QVERIFY2(example->waitFor("User on host [anna]: ", times), example->output().constData());
+        example->type("\n");
+        QVERIFY(example->waitFor("Password: ", 1 + times));
+        example->type(password);
+    }
+    QCOMPARE(example->waitForEnd(), 0);
+    QCOMPARE(tool->input(1), QByteArray("first\nwrong\n"));
+    QCOMPARE(tool->input(2), QByteArray("first\nright\n"));
+}
+
+void ExampleMountTest::asksInOtherWords()
+{
+    const QByteArrayList asksCode = {"echo off", "out (anna@host) Code: ", "read", "echo on"};
+    tool->expect(asksCode + refuses.mid(4));
+    tool->expect(asksCode);
+    const auto example = run(QStringLiteral("sftp://anna@host/"));
+    QVERIFY2(example->waitFor("(anna@host) Code: "), example->output().constData());
+    example->type("1\n");
+    QVERIFY2(example->waitFor("(anna@host) Code: ", 2), example->output().constData());
+    example->type("2\n");
+    QCOMPARE(example->waitForEnd(), 0);
+    QVERIFY(!example->output().contains("User on"));
+    QCOMPARE(tool->input(2), QByteArray("2\n"));
 }
 
 void ExampleMountTest::endsWhereTheJobDoesNot_data()

@@ -45,6 +45,26 @@ QString readLine(const QString& prompt)
     return input.readLine();
 }
 
+/// The same for what is a secret.
+QString readSecret(const QString& prompt)
+{
+    const HiddenInput hidden;
+    const QString secret = readLine(prompt);
+    QTextStream(stdout) << '\n';
+    return secret;
+}
+
+/// What a server may have sent; control characters steer terminals.
+QString harmless(const QString& text)
+{
+    QString shown;
+    for (const QChar character : text) {
+        const bool isHarmless = character.isPrint() || character == QLatin1Char('\n');
+        shown += isHarmless ? character : QChar(QLatin1Char(' '));
+    }
+    return shown;
+}
+
 } // namespace
 
 std::optional<Credentials>
@@ -58,24 +78,20 @@ ConsoleAuthenticator::ask(const QString& server, const QString& user, bool wasRe
     if (credentials.user.isEmpty()) {
         return std::nullopt;
     }
-    {
-        const HiddenInput hidden;
-        credentials.password = readLine(QStringLiteral("Password: "));
-    }
-    QTextStream(stdout) << '\n';
+    credentials.password = readSecret(QStringLiteral("Password: "));
     if (credentials.password.isNull()) {
         return std::nullopt;
     }
     return credentials;
 }
 
+std::optional<QString> ConsoleAuthenticator::askOther(const QString& text)
+{
+    const QString answer = readSecret(harmless(text));
+    return answer.isNull() ? std::nullopt : std::make_optional(answer);
+}
+
 bool ConsoleAuthenticator::confirm(const QString& text)
 {
-    // It may hold what a server sent, and control characters steer terminals.
-    QString shown;
-    for (const QChar character : text) {
-        const bool isHarmless = character.isPrint() || character == QLatin1Char('\n');
-        shown += isHarmless ? character : QChar(QLatin1Char(' '));
-    }
-    return readLine(shown + QLatin1Char(' ')) == QLatin1String("yes");
+    return readLine(harmless(text) + QLatin1Char(' ')) == QLatin1String("yes");
 }

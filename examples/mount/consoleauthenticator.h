@@ -12,6 +12,7 @@ class ConsoleAuthenticator : public RememberingAuthenticator
 protected:
     std::optional<Credentials>
     ask(const QString& server, const QString& user, bool wasRejected) override;
+    std::optional<QString> askOther(const QString& text) override;
     bool confirm(const QString& text) override;
 };
 

@@ -1,18 +1,21 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-// Mounts a URL of a network resource and lists what is there:
+// Mounts the server of an ftp or sftp URL and lists what is at the URL:
 //
 //     mount-example sftp://anna@host/~/Documents
 
 #include "consoleauthenticator.h"
 
 #include <VeyFM/MountFuseEntryJob>
+#include <VeyFM/MountPaths>
+#include <VeyFM/NetworkMountsManagerProxy>
 #include <VeyFM/VFS>
 
 #include <QCoreApplication>
 #include <QTextStream>
 #include <QTimer>
+#include <QUrl>
 
 #include <chrono>
 
@@ -35,6 +38,22 @@ int list(const VeyFM::Entry& directory)
     return 0;
 }
 
+bool isOfOneServer(const QString& url, const QString& other)
+{
+    // The user may be another one than the URL began with.
+    return QUrl(url).adjusted(QUrl::RemoveUserInfo) == QUrl(other).adjusted(QUrl::RemoveUserInfo);
+}
+
+VeyFM::Entry entryBelow(const VeyFM::Entry& mount, const QString& relativePath)
+{
+    VeyFM::VFS* const vfs = VeyFM::VFS::ptr();
+    // A server has one place, also where both its root and the user's home there are mounted. It
+    // stands for the one that was first.
+    const bool isPlace = vfs->entry(mount.path()).localPath() == mount.localPath();
+    const QString root = isPlace ? mount.path() : mount.localPath();
+    return vfs->entry(root + QLatin1Char('/') + relativePath);
+}
+
 } // namespace
 
 int main(int argc, char** argv)
@@ -47,27 +66,33 @@ int main(int argc, char** argv)
     }
     VeyFM::VFS::initialize();
 
+    // The root, of which all folders of the server are part. A job for the URL of one folder makes
+    // a place of it, and a job for the next folder finds that.
+    const QUrl url(app.arguments().at(1));
+    const QString rootUrl = VeyFM::MountPaths::mountRootUrl(url);
+
     // One authenticator a job: a job sets the resource that its questions are about.
     const auto authenticator = QSharedPointer<ConsoleAuthenticator>::create();
-    VeyFM::MountFuseEntryJob job(authenticator, app.arguments().at(1));
+    VeyFM::MountFuseEntryJob job(authenticator, rootUrl);
     job.setDeleteOnFinish(false);
 
     // The job may end inside start(), where exit() of the loop would come too early.
     QObject::connect(&job, &VeyFM::Job::finished, &app, &QCoreApplication::quit);
     bool finished = false;
     QObject::connect(&job, &VeyFM::Job::finished, &app, [&finished] { finished = true; });
-    // A new mount gets a place that stands for the whole URL. For a mount that was there already
-    // nothing is announced, and path() leads on from its place.
+    // What is mounted newly is announced under the user that was taken in the end.
     VeyFM::VFS* const vfs = VeyFM::VFS::ptr();
-    VeyFM::Entry made;
+    QString mountedUrl = rootUrl;
     QObject::connect(
-        vfs, &VeyFM::VFS::fuseMountAdded, &app,
-        [&made](const QString&, const VeyFM::Entry& entry) { made = entry; });
+        vfs, &VeyFM::VFS::fuseMountAdded, &app, [&mountedUrl, &rootUrl](const QString& added) {
+            if (isOfOneServer(added, rootUrl)) {
+                mountedUrl = added;
+            }
+        });
     job.start();
 
     if (!finished) {
-        const bool isSftp = app.arguments().at(1).startsWith(QLatin1String("sftp:"));
-        if (isSftp && authenticator->isAnswerOpen()) {
+        if (url.scheme() == QLatin1String("sftp") && authenticator->isAnswerOpen()) {
             return fail(QStringLiteral("the login was given up or failed"));
         }
         // Else a tool works, or the service has the word: neither has a bound of its own. A tool
@@ -81,5 +106,7 @@ int main(int argc, char** argv)
     if (job.error() != 0) {
         return fail(job.errorString());
     }
-    return list(made.isNull() ? vfs->entry(job.path()) : made);
+    const VeyFM::Entry mount = vfs->networkMountsManager()->mounts().value(mountedUrl);
+    const VeyFM::Entry entry = entryBelow(mount, VeyFM::MountPaths::mountRootRelativePath(url));
+    return entry.exists() ? list(entry) : fail(QStringLiteral("the server has no such folder"));
 }

@@ -3,34 +3,55 @@
 
 #include "rememberingauthenticator.h"
 
-// The texts that come in are left out: the FTP and SFTP jobs speak of denied access at their very
+#include <VeyFM/MountSFtpURLJob>
+
+#include <utility>
+
+// The texts for a password are left out: the FTP and SFTP jobs speak of denied access at their very
 // first question. What has been refused is known here.
 QString RememberingAuthenticator::requestPassword(
-    bool /*isRetry*/, const QString& /*title*/, const QString& /*message*/, QString& user,
+    bool /*isRetry*/, const QString& /*title*/, const QString& message, QString& user,
     bool* userChanged, bool* cancelled)
 {
     m_isAnswerOpen = true;
-    if (!m_answer && !m_hasGivenUp) {
-        m_answer = ask(server(), user, m_wasRejected);
-        m_hasGivenUp = !m_answer;
+    if (std::exchange(m_isNextDropped, false)) {
+        return QString();
     }
+    m_isOwnWords = protocol() == QLatin1String("sftp") &&
+                   message != VeyFM::MountSFtpURLJob::tr("Enter host password for user:");
     if (m_hasGivenUp) {
         *cancelled = true;
         return QString();
     }
-    if (m_answer->user != user) {
+    if (m_isOwnWords) {
+        const std::optional<QString> answer = askOther(message);
+        m_hasGivenUp = !answer;
+        *cancelled = m_hasGivenUp;
+        return answer.value_or(QString());
+    }
+    Known& known = m_known[server()];
+    if (!known.answer) {
+        known.answer = ask(server(), user, known.wasRejected);
+    }
+    if (!known.answer) {
+        m_hasGivenUp = true;
+        *cancelled = true;
+        return QString();
+    }
+    if (known.answer->user != user) {
         // The job starts again as this user, and asks again.
-        user = m_answer->user;
+        user = known.answer->user;
         *userChanged = true;
         m_isAnswerOpen = false;
     }
-    return m_answer->password;
+    return known.answer->password;
 }
 
 void RememberingAuthenticator::credentialsRejected(const QString& /*user*/)
 {
-    m_answer.reset();
-    m_wasRejected = true;
+    m_known[server()] = {std::nullopt, true};
+    // What was asked in other words is asked in them again, when the tool has started again.
+    m_isNextDropped = m_isOwnWords;
 }
 
 void RememberingAuthenticator::credentialsAccepted()

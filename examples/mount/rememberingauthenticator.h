@@ -6,6 +6,8 @@
 
 #include <VeyFM/Authenticator>
 
+#include <QHash>
+
 #include <optional>
 
 struct Credentials
@@ -19,8 +21,10 @@ struct Credentials
  *
  * After a refused login, and after the person changed the user name, the FTP and SFTP jobs ask
  * once for their own use and once more when the tool has started again. The second time they get
- * the same answer from here, until the server has refused it. A person who has given up is not
- * asked again either, though the Samba job would.
+ * the same answer from here, until the server has refused it; each server its own, since a jump
+ * host may stand before the one of the URL. A person who has given up is not asked again either,
+ * though the Samba job would. What SSH asks in other words than for a password, such as a one-time
+ * code, is not remembered.
  */
 class RememberingAuthenticator : public VeyFM::Authenticator
 {
@@ -45,13 +49,24 @@ protected:
     virtual std::optional<Credentials>
     ask(const QString& server, const QString& user, bool wasRejected) = 0;
 
+    /// Asks for what the text, which is SSH's or the server's, says. Nothing when the person gives
+    /// up.
+    virtual std::optional<QString> askOther(const QString& text) = 0;
+
     /// Asks for a yes or a no.
     virtual bool confirm(const QString& text) = 0;
 
 private:
-    std::optional<Credentials> m_answer;
+    struct Known
+    {
+        std::optional<Credentials> answer;
+        bool wasRejected = false;
+    };
+
+    QHash<QString, Known> m_known; ///< By server.
     bool m_hasGivenUp = false;
-    bool m_wasRejected = false;
+    bool m_isOwnWords = false;    ///< The last question.
+    bool m_isNextDropped = false; ///< What the job gets for its next question is of no use to it.
     bool m_isAnswerOpen = false;
 };
 
