@@ -27,10 +27,14 @@ void registerForBus(const char* name)
 
 void registerMetaTypes()
 {
-    // Signals and slots within the namespace spell these names bare.
+    // Signals and slots within the namespace spell these names bare, and a queued connection that
+    // is made by their text finds a type by nothing else.
     qRegisterMetaType<Entry>("Entry");
     qRegisterMetaType<EntryList>("EntryList");
     qRegisterMetaType<StringMap>("StringMap");
+    qRegisterMetaType<FavouritePlace>("FavouritePlace");
+    qRegisterMetaType<NetworkPlace>("NetworkPlace");
+    qRegisterMetaType<StoragePlace>("StoragePlace");
 
     // A record comes before the list of it, whose signature is made from that of the record.
     registerForBus<Entry>("VeyFM::Entry");

@@ -4,6 +4,7 @@
 #include "vfs/vfs.h"
 
 #include "core/metatypes.h"
+#include "jobs/job.h"
 #include "vfs/vfs_p.h"
 
 #include <QCoreApplication>
@@ -27,6 +28,7 @@ void VFS::initialize()
         QCoreApplication::installTranslator(translator);
     }
     registerMetaTypes();
+    qRegisterMetaType<Job*>("Job*"); // As its signal spells it.
     initialized = true;
 }
 
