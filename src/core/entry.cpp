@@ -4,6 +4,7 @@
 #include "core/entry.h"
 
 #include "core/accountnames.h"
+#include "core/copied.h"
 #include "core/localbytes.h"
 #include "vfs/vfs.h"
 
@@ -74,8 +75,9 @@ bool Entry::isNull() const
     return m_path.isEmpty();
 }
 
-bool Entry::isSimilar(const Entry& other) const
+bool Entry::isSimilar(const Entry& given) const
 {
+    const Entry other = copied(given);
     const QString own = localPath();
     return !own.isEmpty() && own == other.localPath();
 }
@@ -225,10 +227,11 @@ bool Entry::isWritable() const
 
 bool Entry::isExecutable() const
 {
-    if (isPurePlace() || (isImplicitDirPlace() && localPath().isEmpty())) {
+    const Entry self = copied(*this);
+    if (self.isPurePlace() || (self.isImplicitDirPlace() && self.localPath().isEmpty())) {
         return true;
     }
-    return QFileInfo(localPath()).isExecutable();
+    return QFileInfo(self.localPath()).isExecutable();
 }
 
 qint64 Entry::lastModified() const

@@ -3,6 +3,7 @@
 
 #include "core/entrylist.h"
 
+#include "core/copied.h"
 #include "core/pathorder.h"
 #include "core/pathset.h"
 
@@ -15,8 +16,9 @@ namespace VeyFM {
 namespace {
 
 template <typename Predicate>
-bool anyOf(const EntryList& entries, Predicate predicate)
+bool anyOf(const EntryList& given, Predicate predicate)
 {
+    const EntryList entries = copied(given);
     return std::any_of(entries.begin(), entries.end(), predicate);
 }
 
@@ -82,7 +84,8 @@ bool EntryList::hasChildOfType(int mask) const
 
 bool EntryList::containsSimilar(const Entry& entry) const
 {
-    return anyOf(*this, [&entry](const Entry& element) { return element.isSimilar(entry); });
+    return anyOf(
+        *this, [entry = copied(entry)](const Entry& element) { return element.isSimilar(entry); });
 }
 
 EntryList EntryList::files() const
@@ -117,9 +120,10 @@ QStringList EntryList::paths() const
 
 QStringList EntryList::localPaths() const
 {
+    const EntryList entries = copied(*this);
     QStringList result;
-    result.reserve(size());
-    for (const Entry& entry : *this) {
+    result.reserve(entries.size());
+    for (const Entry& entry : entries) {
         result.append(entry.localPath());
     }
     return result;
@@ -127,8 +131,9 @@ QStringList EntryList::localPaths() const
 
 QStringList EntryList::localPathsWithScheme() const
 {
+    const EntryList entries = copied(*this);
     QStringList result;
-    for (const Entry& entry : *this) {
+    for (const Entry& entry : entries) {
         const QString path = entry.localPathWithScheme();
         if (!path.isEmpty()) {
             result.append(path);

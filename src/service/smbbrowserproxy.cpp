@@ -3,6 +3,7 @@
 
 #include "service/smbbrowserproxy.h"
 
+#include "core/copied.h"
 #include "service/servicecall.h"
 #include "service/servicesignals.h"
 #include "service/smbleveldelta.h"
@@ -57,7 +58,7 @@ void SmbBrowserProxy::rescan()
 
 void SmbBrowserProxy::rescanWorkgroup(const QString& given)
 {
-    const QString workgroup = given; // A slot of the host may change what was given.
+    const QString workgroup = copied(given);
     // Makes an unknown workgroup known.
     if (!m_workgroupMap[workgroup].hostsLoaded) {
         const QStringList known = hosts(workgroup);
@@ -70,8 +71,8 @@ void SmbBrowserProxy::rescanWorkgroup(const QString& given)
 
 void SmbBrowserProxy::rescanHost(const QString& givenHost, const QString& givenWorkgroup)
 {
-    const QString host = givenHost;
-    const QString workgroup = givenWorkgroup;
+    const QString host = copied(givenHost);
+    const QString workgroup = copied(givenWorkgroup);
     // Makes an unknown host, and its workgroup, known.
     if (!m_workgroupMap[workgroup].hostMap[host].sharesLoaded) {
         const StringMap known = shares(host, workgroup);

@@ -63,9 +63,10 @@ QString joinedAscii(const QString& prefix, const char* name, int length)
 
 } // namespace
 
-EntryList VFS::childs(const Entry& entry, EntryChildFilters filter) const
+EntryList VFS::childs(const Entry& given, EntryChildFilters filter) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     EntryList children;
     if (entry.isPlace() && d->placeBase.hasPlace(entry)) {
         children += d->placeBase.childEntries(entry);
@@ -172,9 +173,10 @@ void VFS::stopGettingChilds()
     d->stopFlag.fetchAndStoreOrdered(1);
 }
 
-bool VFS::containsDirsOrPlaces(const Entry& entry) const
+bool VFS::containsDirsOrPlaces(const Entry& given) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     if (entry.isPlace() && d->placeBase.hasChilds(entry)) {
         return true;
     }
@@ -195,9 +197,10 @@ bool VFS::containsDirsOrPlaces(const Entry& entry) const
     return false;
 }
 
-bool VFS::hasChilds(const Entry& entry) const
+bool VFS::hasChilds(const Entry& given) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     if (entry.isPlace() && d->placeBase.hasChilds(entry)) {
         return true;
     }

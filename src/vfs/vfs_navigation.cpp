@@ -16,9 +16,10 @@ const QLatin1Char slash('/');
 
 } // namespace
 
-bool VFS::isEntryExists(const Entry& entry) const
+bool VFS::isEntryExists(const Entry& given) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     if (entry.isPlace()) {
         return d->placeBase.hasPlace(entry);
     }
@@ -26,14 +27,17 @@ bool VFS::isEntryExists(const Entry& entry) const
            entry.m_path.startsWith(QLatin1String("vey-fm:"));
 }
 
-Entry VFS::child(const Entry& entry, const QString& name) const
+Entry VFS::child(const Entry& givenEntry, const QString& givenName) const
 {
+    const Entry entry = copied(givenEntry);
+    const QString name = copied(givenName);
     return this->entry(d_func()->resolveChildPath(entry, name));
 }
 
-Entry VFS::parent(const Entry& entry, const Entry& root) const
+Entry VFS::parent(const Entry& given, const Entry& root) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     const Entry parentPlace = d->placeBase.checkAndGetParentPlace(entry, root);
     if (!parentPlace.isNull()) {
         return parentPlace;
@@ -77,8 +81,9 @@ bool VFS::hasParent(const Entry& entry) const
     return !parent(entry).isNull();
 }
 
-EntryList VFS::pathEntryList(const Entry& entry, const Entry& root) const
+EntryList VFS::pathEntryList(const Entry& entry, const Entry& givenRoot) const
 {
+    const Entry root = copied(givenRoot);
     EntryList chain;
     for (Entry current = entry; !current.isNull(); current = parent(current, root)) {
         chain.append(current);
@@ -119,8 +124,9 @@ QStringList VFS::exploreParentPlacesHistory(const QString& path) const
     return exploreParentPlacesHistory(path, d_func()->rootEntry);
 }
 
-Entry VFS::symLinkTargetEntry(const Entry& entry) const
+Entry VFS::symLinkTargetEntry(const Entry& given) const
 {
+    const Entry entry = copied(given);
     QString target = entry.symLinkTarget();
     if (!target.startsWith(slash)) {
         target = entry.localPath() + slash + target;
@@ -129,9 +135,10 @@ Entry VFS::symLinkTargetEntry(const Entry& entry) const
     return isPlaceRelativeEntry(entry) ? placeRelatedEntry(result) : result;
 }
 
-Entry VFS::placeRelatedEntry(const Entry& entry) const
+Entry VFS::placeRelatedEntry(const Entry& given) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     const QString local = entry.isPlace() ? QString() : entry.localPath();
     if (local.isEmpty()) {
         return entry;
@@ -160,8 +167,9 @@ bool VFS::isStoragePlaceRelativeEntry(const Entry& entry) const
     return false;
 }
 
-bool VFS::hasStoragePlaceRelativeEntries(const EntryList& entries) const
+bool VFS::hasStoragePlaceRelativeEntries(const EntryList& given) const
 {
+    const EntryList entries = copied(given);
     return std::any_of(entries.begin(), entries.end(), [this](const Entry& entry) {
         return isStoragePlaceRelativeEntry(entry);
     });

@@ -4,6 +4,7 @@
 #ifndef VEYFM_VFS_P_H
 #define VEYFM_VFS_P_H
 
+#include "core/copied.h"
 #include "core/entrylist.h"
 #include "core/newsqueue.h"
 #include "service/favouriteplacesmanagerproxy.h"

@@ -110,9 +110,10 @@ QString linkedDirectory(const QString& link)
 
 } // namespace
 
-Entry VFS::entry(const QString& path) const
+Entry VFS::entry(const QString& given) const
 {
     Q_D(const VFS);
+    const QString path = copied(given);
     // The usual path, which every rule below would leave as it is.
     if (isNormalAbsolute(path)) {
         return d->entryFromNormalPath(path);
@@ -201,9 +202,10 @@ Entry VFSPrivate::entryFromNormalPath(const QString& path) const
     return Entry(path, local, typeOnDisk(local));
 }
 
-QString VFS::normalizePath(const QString& path) const
+QString VFS::normalizePath(const QString& given) const
 {
     Q_D(const VFS);
+    const QString path = copied(given);
     if (hasScheme(path) || path == slash) {
         return path;
     }
@@ -330,9 +332,10 @@ QString VFS::localPath(const QString& path) const
     return d->localPathOf(entry(path));
 }
 
-QString VFS::localPath(const Entry& entry) const
+QString VFS::localPath(const Entry& given) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     const QString scheme = UrlParsing::scheme(entry.m_path);
     if (!scheme.isEmpty()) {
         return scheme == QLatin1String("file") ? pathOfFileUrl(entry.m_path) : QString();

@@ -22,9 +22,10 @@ Record firstOf(const QList<Record>& records, Predicate fits)
 
 } // namespace
 
-StoragePlace VFS::storagePlace(const Entry& entry) const
+StoragePlace VFS::storagePlace(const Entry& given) const
 {
     Q_D(const VFS);
+    const Entry entry = copied(given);
     // May open Storage devices, and thus read the list from the service.
     if (!d->placeBase.hasPlace(entry.m_path)) {
         return StoragePlace();

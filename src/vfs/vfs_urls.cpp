@@ -80,8 +80,9 @@ QString VFSPrivate::bookmarkUrl(const QString& relativePath) const
     return q->networkPlace(place).url() + slash + rest;
 }
 
-QList<QUrl> VFS::urlsFromEntries(const EntryList& entries) const
+QList<QUrl> VFS::urlsFromEntries(const EntryList& given) const
 {
+    const EntryList entries = copied(given);
     QList<QUrl> urls;
     if (entries.isEmpty()) {
         return urls;
@@ -103,8 +104,9 @@ QList<QUrl> VFS::urlsFromEntries(const EntryList& entries) const
     return urls;
 }
 
-EntryList VFS::entriesFromUrls(const QList<QUrl>& urls) const
+EntryList VFS::entriesFromUrls(const QList<QUrl>& given) const
 {
+    const QList<QUrl> urls = copied(given);
     EntryList entries;
     for (const QUrl& url : urls) {
         // Null entries too: one element for each URL.

@@ -18,7 +18,7 @@ void VFS::notifyWatchers(const EntryList& entries)
 void VFS::directNotifyWatchers(const EntryList& given, bool anyWay)
 {
     Q_D(VFS);
-    const EntryList entries = given;
+    const EntryList entries = copied(given);
     for (const Entry& entry : entries) {
         d->entryWatcher.entryChangedNotify(entry, anyWay);
     }

@@ -3,6 +3,7 @@
 
 #include "vfs/vfsplacebase.h"
 
+#include "core/copied.h"
 #include "vfs/vfsplacebase_p.h"
 
 #include <QObject>
@@ -241,8 +242,9 @@ void VFSPlaceBase::setPlaceLocalPath(const Entry& place, const QString& localPat
     }
 }
 
-Entry VFSPlaceBase::placeEntry(const QString& path) const
+Entry VFSPlaceBase::placeEntry(const QString& given) const
 {
+    const QString path = copied(given);
     const PlaceLocker locker(d->placeLock);
     if (const Node node = d->node(path)) {
         return node->entry;
@@ -256,8 +258,9 @@ Entry VFSPlaceBase::placeEntry(const QString& path) const
     return node ? node->entry : Entry();
 }
 
-bool VFSPlaceBase::hasPlace(const QString& path) const
+bool VFSPlaceBase::hasPlace(const QString& given) const
 {
+    const QString path = copied(given);
     // Without placeLock: a view that asks must not wait for a fill in another thread.
     const QStringView parent = parentPath(path);
     if (!parent.isNull()) {
@@ -296,8 +299,9 @@ bool VFSPlaceBase::hasChilds(const Entry& place) const
     return node && (!node->children.empty() || d->isPending(place.path()));
 }
 
-bool VFSPlaceBase::placeHasChildEntry(const Entry& place, const Entry& child) const
+bool VFSPlaceBase::placeHasChildEntry(const Entry& place, const Entry& givenChild) const
 {
+    const Entry child = copied(givenChild);
     const PlaceLocker locker(d->placeLock);
     if (!d->node(place)) {
         return false;

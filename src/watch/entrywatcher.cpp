@@ -3,6 +3,7 @@
 
 #include "watch/entrywatcher.h"
 
+#include "core/copied.h"
 #include "core/newsqueue.h"
 #include "vfs/vfs.h"
 #include "watch/inotifywatcher.h"
@@ -56,7 +57,7 @@ EntryWatcher::~EntryWatcher() = default;
 
 void EntryWatcher::addEntry(const Entry& given)
 {
-    const Entry entry = given; // A slot of the host may run in here and change what was given.
+    const Entry entry = copied(given);
     const QString local = entry.localPath();
     if (!isRefreshable(local)) {
         return;
@@ -85,7 +86,7 @@ void EntryWatcher::addEntry(const Entry& given)
 
 void EntryWatcher::removeEntry(const Entry& given)
 {
-    const Entry entry = given;
+    const Entry entry = copied(given);
     const QString local = entry.localPath();
     const auto entries = d->watchedEntries.find(local);
     if (entries == d->watchedEntries.end()) {

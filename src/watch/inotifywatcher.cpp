@@ -3,6 +3,7 @@
 
 #include "watch/inotifywatcher.h"
 
+#include "core/copied.h"
 #include "core/localbytes.h"
 #include "watch/eventqueue.h"
 #include "watch/kernelwatches.h"
@@ -251,8 +252,9 @@ bool InotifyWatcher::isSymlinkRegistered(const QString& path) const
 }
 
 void InotifyWatcher::notifySymlinks(
-    const char* signal, const QString& path, const QString& fileName)
+    const char* signal, const QString& path, const QString& givenName)
 {
+    const QString fileName = copied(givenName);
     const QSet<QString> links = d->links.links(path);
     const QPointer<InotifyWatcher> alive(links.isEmpty() ? nullptr : this);
     for (const QString& link : links) {
