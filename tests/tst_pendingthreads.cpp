@@ -6,7 +6,7 @@
 #include <QThread>
 
 #include <atomic>
-#include <memory>
+#include <thread>
 #include <vector>
 
 using namespace VeyFM;
@@ -59,12 +59,10 @@ void PendingThreadsTest::pendingPlacesAreFilledLater()
 {
     EntryList first;
     bool pendingBefore = false;
-    const std::unique_ptr<QThread> thread(QThread::create([&] {
+    std::thread([&] {
         pendingBefore = vfs->hasChilds(vfs->sambaNetworkEntry());
         first = vfs->childs(vfs->sambaNetworkEntry());
-    }));
-    thread->start();
-    QVERIFY(thread->wait());
+    }).join();
     // The fill waits in the queue of this thread.
     QVERIFY(pendingBefore);
     QVERIFY(first.isEmpty());
@@ -78,10 +76,10 @@ void PendingThreadsTest::manyThreadsWhileNewsCome()
 {
     std::atomic<int> good{0};
     std::atomic<int> running{4};
-    std::vector<std::unique_ptr<QThread>> threads;
+    std::vector<std::thread> threads;
     const int total = running;
     for (int i = 0; i < total; ++i) {
-        threads.emplace_back(QThread::create([&good, &running, i] {
+        threads.emplace_back([&good, &running, i] {
             const QString workgroup = i % 2 ? u"Samba/A"_s : u"Samba/B"_s;
             bool ok = waitForChildren(workgroup, 3);
             for (const QString& host : {u"/h1"_s, u"/h2"_s, u"/h3"_s}) {
@@ -95,10 +93,7 @@ void PendingThreadsTest::manyThreadsWhileNewsCome()
             ok = ok && vfs->smbHost(share) == u"h2"_s;
             good += ok;
             --running;
-        }));
-    }
-    for (const auto& thread : threads) {
-        thread->start();
+        });
     }
     // Meanwhile the tree changes here.
     for (int i = 0; running > 0; ++i) {
@@ -109,8 +104,8 @@ void PendingThreadsTest::manyThreadsWhileNewsCome()
             arguments(favourite));
         QCoreApplication::processEvents(QEventLoop::AllEvents, 10);
     }
-    for (const auto& thread : threads) {
-        QVERIFY(thread->wait());
+    for (std::thread& thread : threads) {
+        thread.join();
     }
     QCOMPARE(int(good), total);
     log->takeAll(service);

@@ -3,13 +3,13 @@
 
 #include "support/readdirhook.h"
 #include "support/vfsscene.h"
+#include "support/worker.h"
 #include "vfs/vfs.h"
 #include "vfs/vfsplacebase.h"
 
 #include <QAtomicInt>
 #include <QElapsedTimer>
 #include <QTest>
-#include <QThread>
 
 #include <memory>
 #include <vector>
@@ -197,9 +197,9 @@ void TestVfsStop::abandonedStream()
 
 void TestVfsStop::fromAnotherThread()
 {
-    const std::unique_ptr<QThread> thread(QThread::create([] { VFS::ptr()->stopGettingChilds(); }));
-    thread->start();
-    QVERIFY(thread->wait(30000));
+    Worker worker([] { VFS::ptr()->stopGettingChilds(); });
+    worker.start();
+    QVERIFY(worker.wait(30000));
     QVERIFY(isStopPending());
 }
 
@@ -209,9 +209,9 @@ void TestVfsStop::oneStopOneReader()
     QAtomicInt cancelled;
     QAtomicInt whole;
     VFS::ptr()->stopGettingChilds();
-    std::vector<std::unique_ptr<QThread>> readers;
+    std::vector<std::unique_ptr<Worker>> readers;
     for (int i = 0; i < 4; ++i) {
-        readers.emplace_back(QThread::create([&] {
+        readers.push_back(std::make_unique<Worker>([&] {
             const int size = VFS::ptr()->childs(big).size();
             cancelled.fetchAndAddRelaxed(size == 0 ? 1 : 0);
             whole.fetchAndAddRelaxed(size == 2000 ? 1 : 0);
@@ -232,16 +232,15 @@ void TestVfsStop::whileMainThreadWorks()
     QAtomicInt records;
     ReaddirHook::set([&records](dirent*) { records.fetchAndAddRelaxed(1); }, ReaddirHook::Endless);
     QAtomicInt size(-1);
-    const std::unique_ptr<QThread> worker(
-        QThread::create([&] { size.storeRelease(VFS::ptr()->childs(big).size()); }));
-    worker->start();
+    Worker worker([&] { size.storeRelease(VFS::ptr()->childs(big).size()); });
+    worker.start();
     QTRY_VERIFY_WITH_TIMEOUT(records.loadRelaxed() > 5000, 30000);
     QCOMPARE(size.loadAcquire(), -1);
     // Walks in this thread do not wait for it.
     QCOMPARE(VFS::ptr()->parent(VFS::ptr()->homeEntry()), VFS::ptr()->computerEntry());
     QCOMPARE(VFS::ptr()->entry(text("Home/..")), VFS::ptr()->computerEntry());
     VFS::ptr()->stopGettingChilds();
-    QVERIFY(worker->wait(30000));
+    QVERIFY(worker.wait(30000));
     QCOMPARE(size.loadAcquire(), 0);
 }
 
