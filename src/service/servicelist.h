@@ -53,10 +53,21 @@ public:
     template <typename Patch>
     void patch(Patch patch)
     {
-        if (m_loaded) {
-            const std::lock_guard<std::mutex> locker(m_lock);
-            patch(m_records);
+        if (!m_loaded) {
+            return;
         }
+        QList<Record> records;
+        const std::lock_guard<std::mutex> locker(m_lock);
+        if (m_isShared) {
+            // What other threads were given is never changed in place: Qt finds out that it is
+            // shared no longer in a way that does not order their last look before the change.
+            records = QList<Record>(m_records.cbegin(), m_records.cend());
+            m_isShared = false;
+        } else {
+            records.swap(m_records);
+        }
+        patch(records);
+        records.swap(m_records);
     }
 
 private:
@@ -65,6 +76,7 @@ private:
         {
             const std::lock_guard<std::mutex> locker(m_lock);
             if (m_loaded || m_asked) {
+                m_isShared = true;
                 return m_records;
             }
             m_asked = true;
@@ -79,6 +91,7 @@ private:
     QList<Record> m_records;
     bool m_loaded = false;
     bool m_asked = false;
+    bool m_isShared = false; // with other threads
 };
 
 } // namespace VeyFM

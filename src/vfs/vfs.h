@@ -51,8 +51,18 @@ class VFSSettings;
  *
  * Nothing here throws. What means nothing yields a null Entry, false, or an empty text or list.
  *
- * Threads: resolution and navigation may run in any thread. From a thread other than that of the
- * object a place that is filled on first need is filled later, and the caller sees it empty.
+ * Threads: resolution, navigation, the mapping of URLs, the look-ups of records and the fixed
+ * entries may be used in any thread, while news change what they look at. What comes from the
+ * service on first need (the children of a place, the list of devices) is read in the thread of
+ * the object alone: a caller in another thread sees it empty, and it is there some time later. The
+ * operations that ask the service each time (storageDeviceInfo(), addFavouritePlace(),
+ * removeFavouritePlace()) block the thread that calls them. The watchers, the jobs and the
+ * settings are for the thread of the object.
+ *
+ * Slots: signals are emitted synchronously, in the thread of the object. A slot may change or
+ * destroy what its host has just handed over by reference, and may run an event loop. News of the
+ * service that arrive in there are not held back: what is left of the news that the slot was told
+ * of is done first.
  */
 class VEYFMVFS_EXPORT VFS : public QObject
 {
@@ -73,7 +83,13 @@ public:
      */
     static void initialize();
 
-    /// The one object; the first call constructs it, and may block on the session bus.
+    /**
+     * The one object; the first call constructs it, and may block on the session bus. Any thread
+     * may call it afterwards.
+     *
+     * Not to be called from the destructor of a static object: this object is one itself, and may
+     * be gone by then. The same goes for everything that calls it, Entry::localPath() for one.
+     */
     static VFS* ptr();
 
     ~VFS() override;
@@ -318,8 +334,14 @@ Q_SIGNALS:
     /// A process of the session has mounted a URL. The entry is null where that makes no place.
     void fuseMountAdded(QString url, Entry entry);
 
-    /// Brackets the blocking fill of a place on first need. The end may fail to come when the
-    /// place went away meanwhile. @{
+    /**
+     * Brackets the blocking fill of a place on first need. The end may fail to come when the
+     * place went away meanwhile.
+     *
+     * As a rule both run with the lock of the tree held, by the operation that looked at the place:
+     * a slot may use this object, but must not wait for another thread that does.
+     * @{
+     */
     void longTimeOperationStarted();
     void longTimeOperationFinished();
     /// @}

@@ -35,7 +35,9 @@ class VFSPlaceBasePrivate;
  * Where an operation takes the entry of a place, only its path() counts. Unknown places are
  * normal, and answered with a null Entry, false, 0 or an empty list.
  *
- * Operations may be called from any thread, and wait for one another; hasPlace() never waits.
+ * Operations may be called from any thread, and wait for one another; hasPlace() never waits. The
+ * slot that fills a place runs while all others wait, so it must not wait for another thread that
+ * uses this object.
  */
 class VEYFMVFS_EXPORT VFSPlaceBase
 {

@@ -26,7 +26,8 @@ class EntryWatcherPrivate;
  * kernel's queue had no room for is lost.
  *
  * To be used in the thread of VFS, where the signals are emitted too. A slot may add and remove
- * entries.
+ * entries, and run an event loop: newer news of the kernel that arrive in there come behind all
+ * that is left of the older ones. A slot may delete a watcher that its host has made.
  */
 class VEYFMVFS_EXPORT EntryWatcher : public QObject
 {
