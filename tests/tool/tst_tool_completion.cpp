@@ -10,6 +10,8 @@
 #include <QTemporaryDir>
 #include <QTest>
 
+#include <unistd.h>
+
 namespace {
 
 QByteArrayList complete(const QStringList& words, const QString& directory = QString())
@@ -46,6 +48,8 @@ private Q_SLOTS:
     void optionValues();
     void places();
     void files();
+    void namesLikeOptions();
+    void invalidNames();
     void hiddenFiles();
     void tilde();
     void scriptsParse_data();
@@ -145,6 +149,32 @@ void ToolCompletionTest::files()
         QByteArrayList({"line\nbreak"}));
 }
 
+void ToolCompletionTest::namesLikeOptions()
+{
+    QTemporaryDir directory;
+    QVERIFY(createFile(directory.path(), "-x"));
+    const QString info = QStringLiteral("info");
+    QVERIFY(complete({info, QString()}, directory.path()).contains("./-x"));
+    QVERIFY(!complete({info, QString()}, directory.path()).contains("-x"));
+    QVERIFY(!complete({info, QStringLiteral("-")}, directory.path()).contains("-x"));
+    QCOMPARE(
+        complete({info, QStringLiteral("--"), QStringLiteral("-")}, directory.path()),
+        QByteArrayList({"-x"}));
+}
+
+void ToolCompletionTest::invalidNames()
+{
+    QTemporaryDir directory;
+    const QByteArray link = QFile::encodeName(directory.path()) + "/in\377valid";
+    QCOMPARE(::symlink("target", link.constData()), 0);
+    const QString info = QStringLiteral("info");
+    QCOMPARE(complete({info, QStringLiteral("in")}, directory.path()), QByteArrayList());
+    QVERIFY(createFile(directory.path(), "in\357\277\275valid"));
+    QCOMPARE(
+        complete({info, QStringLiteral("in")}, directory.path()),
+        QByteArrayList({"in\357\277\275valid"}));
+}
+
 void ToolCompletionTest::hiddenFiles()
 {
     QTemporaryDir directory;
@@ -185,40 +215,56 @@ void ToolCompletionTest::scriptsParse()
 
 void ToolCompletionTest::bashFunction_data()
 {
-    QTest::addColumn<QString>("words"); // As bash cuts the line, for an array.
+    QTest::addColumn<QString>("line");
+    QTest::addColumn<int>("type"); // The key of the completion, as bash has it.
     QTest::addColumn<QByteArray>("replies");
-    QTest::newRow("verb") << QStringLiteral("li") << QByteArray("list\n");
-    QTest::newRow("option") << QStringLiteral("list --no") << QByteArray("--no-links\n");
-    QTest::newRow("value") << QStringLiteral("list --color = al") << QByteArray("always\n");
-    QTest::newRow("values") << QStringLiteral("list --color =")
-                            << QByteArray("auto\nalways\nnever\n");
-    QTest::newRow("value apart") << QStringLiteral("list --sort ti") << QByteArray("time\n");
-    QTest::newRow("place") << QStringLiteral("list Hom") << QByteArray("Home/\n");
-    QTest::newRow("escaped") << QStringLiteral("list 'File\\ Sys'") << QByteArray("File System/\n");
-    QTest::newRow("quoted") << QStringLiteral("list '\"File Sys'") << QByteArray("File System/\n");
-    QTest::newRow("none") << QStringLiteral("list nothing/of/that") << QByteArray();
+    const int tab = '\t';
+    const int list = '?';
+    const int menu = '%';
+    const auto row = [](const char* name, const char* line, int type, const char* replies) {
+        QTest::newRow(name) << QString::fromLatin1(line) << type << QByteArray(replies);
+    };
+    row("verb", "li", tab, "list\n");
+    row("option", "list --no", tab, "--no-links\n");
+    // From where bash replaces.
+    row("value", "list --color=al", tab, "always\n");
+    row("value apart", "list --sort ti", tab, "time\n");
+    row("place", "list Hom", tab, "Home/\n");
+    row("escaped", "list File\\ Sys", tab, "File\\ System/\n");
+    // The second keeps bash from closing the quote.
+    row("quoted", "list \"File Sys", tab, "File System/\nFile System/ \n");
+    row("none", "list nothing/of/that", tab, "");
+    // Of several nothing goes in but what they have in common.
+    row("several", "list --color=", tab, "--color=auto\n--color=always\n--color=never\n \n");
+    row("several in common", "list --color=a", list, "--color=auto\n--color=always\n");
+    row("list", "list --color=", list, "--color=auto\n--color=always\n--color=never\n");
+    row("menu", "list --color=a", menu, "auto\nalways\n");
+    row("list of quoted", "list \"File Sys", list, "File System/\n");
 }
 
 void ToolCompletionTest::bashFunction()
 {
-    QFETCH(const QString, words);
+    QFETCH(const QString, line);
+    QFETCH(const int, type);
     QFETCH(const QByteArray, replies);
     if (shell(QStringLiteral("bash")).isEmpty()) {
         QSKIP("bash is not installed");
     }
     QTemporaryDir directory;
-    // compopt works during a completion only; the test on a terminal has the real one.
+    // compopt works during a completion only; the tests on a terminal have the real one.
     const QString script =
         QStringLiteral("source \"$0\"\ncompopt() { :; }\n"
-                       "COMP_WORDS=(veyfm-vfs %1)\n"
-                       "COMP_CWORD=$((${#COMP_WORDS[@]} - 1))\n"
-                       "_veyfm_vfs\n"
+                       "COMP_LINE=\"veyfm-vfs $1\"\n"
+                       "COMP_POINT=${#COMP_LINE}\n"
+                       "COMP_TYPE=$2\n"
+                       "COMP_WORDBREAKS=$' \\t\\n\"\\'@><=;|&(:'\n"
+                       "_veyfm_vfs veyfm-vfs\n"
                        "((${#COMPREPLY[@]})) && printf '%s\\n' \"${COMPREPLY[@]}\"\n"
-                       "exit 0")
-            .arg(words);
+                       "exit 0");
     const ToolResult result = runProgram(
         QStringLiteral("bash"),
-        {QStringLiteral("-c"), script, toolSource(QStringLiteral("completion/veyfm-vfs.bash"))},
+        {QStringLiteral("-c"), script, toolSource(QStringLiteral("completion/veyfm-vfs.bash")),
+         line, QString::number(type)},
         directory.path(), environmentWithTool());
     QCOMPARE(result.err, QByteArray());
     QCOMPARE(result.exitCode, 0);

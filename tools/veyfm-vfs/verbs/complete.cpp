@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "commandline.h"
+#include "completion/shellline.h"
+#include "completion/shellreply.h"
 #include "describe.h"
 #include "devices.h"
 #include "locate.h"
@@ -11,10 +13,14 @@
 
 #include <QDir>
 
+#include <sys/stat.h>
+
 namespace VeyFM {
 namespace Tool {
 
 namespace {
+
+const QLatin1Char dash('-');
 
 /// The fixed places, so far as they exist: the first sections of paths through places.
 EntryList fixedPlaces()
@@ -35,6 +41,14 @@ EntryList fixedPlaces()
     return places;
 }
 
+/// Whether the name is that of a link that can't be written in the encoding of the locale.
+bool isGarbled(const QString& name, const Entry& entry)
+{
+    struct stat status = {};
+    return name.contains(QChar(QChar::ReplacementCharacter)) &&
+           ::lstat(entry.localPath().toLocal8Bit().constData(), &status) != 0;
+}
+
 /// Texts behind @p typed that name one of the entries. The slash invites the next section.
 void addEntries(
     QStringList& candidates, const EntryList& entries, const QString& typed, const QString& start)
@@ -48,8 +62,15 @@ void addEntries(
         if (hidden && !start.startsWith(QLatin1Char('.'))) {
             continue;
         }
+        if (isGarbled(name, entry)) {
+            continue;
+        }
+        // Not an option, for one who has typed nothing yet.
+        const bool isLikeOption = typed.isEmpty() && start.isEmpty() && name.startsWith(dash);
         const bool leadsOn = entry.isPlace() || entry.isDir();
-        candidates.append(typed + name + (leadsOn ? QStringLiteral("/") : QString()));
+        candidates.append(
+            (isLikeOption ? QStringLiteral("./") : typed) + name +
+            (leadsOn ? QStringLiteral("/") : QString()));
     }
 }
 
@@ -170,18 +191,19 @@ const Option* optionWaiting(const QVector<Option>& options, const QString& befor
     return nullptr;
 }
 
+/// What may stand for the last of the words behind the program's name.
 QStringList candidatesFor(QStringList words)
 {
     const QString word = words.isEmpty() ? QString() : words.constLast();
     if (words.size() < 2) {
-        if (!word.startsWith(QLatin1Char('-'))) {
+        if (!word.startsWith(dash)) {
             return verbCandidates(word, verbs());
         }
         return QStringList({QStringLiteral("--help"), QStringLiteral("--version")}).filter(word);
     }
     const Verb* verb = findVerb(words.constFirst());
     if (verb && !verb->verbs.isEmpty()) {
-        if (words.size() == 2 && !word.startsWith(QLatin1Char('-'))) {
+        if (words.size() == 2 && !word.startsWith(dash)) {
             return verbCandidates(word, verb->verbs);
         }
         if (words.size() > 2) {
@@ -210,7 +232,7 @@ QStringList candidatesFor(QStringList words)
             return values;
         }
     }
-    if (!optionsEnded && word.startsWith(QLatin1Char('-'))) {
+    if (!optionsEnded && word.startsWith(dash)) {
         return optionCandidates(options, word);
     }
     if (verb->operandKind == OperandKind::Verbs && !before.isEmpty()) {
@@ -222,12 +244,68 @@ QStringList candidatesFor(QStringList words)
     return operandCandidates(verb->operandKind, word);
 }
 
+/// What may stand for the last word of a line as the shell reads it.
+QStringList candidatesFor(const ShellLine& line)
+{
+    QStringList words = line.words();
+    const QString typed = words.constLast();
+    // The line knows where home is. A tilde that is left is one of a name.
+    const QString here = typed.startsWith(QLatin1Char('~')) ? QStringLiteral("./") : QString();
+    words.last().prepend(here);
+    QStringList candidates;
+    const QStringList found = candidatesFor(words);
+    for (const QString& candidate : found) {
+        const QString value = candidate.mid(here.size());
+        if (value.startsWith(typed)) {
+            candidates.append(value);
+        }
+    }
+    return candidates;
+}
+
+/// What the scripts of the shells ask for, in bash's own variables, with the line up to the cursor;
+/// and for zsh the quote behind the cursor.
+ShellReply replyFor(const QString& shell)
+{
+    const QByteArray bytes = qgetenv("COMP_LINE");
+    const QString text = QString::fromLocal8Bit(bytes);
+    const ShellLine line(text, QString::fromLocal8Bit(qgetenv("COMP_WORDBREAKS")));
+    if (!line.isReadable() || text.toLocal8Bit() != bytes) {
+        return {};
+    }
+    QStringList candidates = candidatesFor(line);
+    candidates.removeDuplicates();
+    if (shell == QLatin1String("zsh")) {
+        return replyForZsh(line, candidates, !qEnvironmentVariableIsEmpty("COMP_CLOSING"));
+    }
+    return replyForBash(line, candidates, qEnvironmentVariableIntValue("COMP_TYPE"));
+}
+
+void write(Output& output, const QString& record)
+{
+    output.write(record.toLocal8Bit() + '\0');
+}
+
 int run(Invocation& invocation)
 {
+    Output& output = invocation.output();
+    const QString shell = invocation.value(QStringLiteral("shell"));
+    if (!shell.isEmpty()) {
+        const ShellReply reply = replyFor(shell);
+        write(output, reply.endsWord ? QStringLiteral("space") : QStringLiteral("nospace"));
+        for (int i = 0; i < reply.texts.size(); ++i) {
+            write(output, reply.texts.at(i));
+            if (shell == QLatin1String("zsh")) {
+                write(output, reply.shown.at(i));
+            }
+        }
+        return Done;
+    }
+
     QStringList candidates = candidatesFor(invocation.operands());
     candidates.removeDuplicates();
     for (const QString& candidate : qAsConst(candidates)) {
-        invocation.output().write(candidate.toLocal8Bit() + '\0');
+        write(output, candidate);
     }
     return Done;
 }
@@ -244,6 +322,11 @@ Verb completeVerb()
     verb.needs = Needs::Nothing;
     verb.printsData = false;
     verb.hidden = true;
+    verb.options = {
+        {{QStringLiteral("shell")},
+         QStringLiteral("Read the line from COMP_LINE, and print what goes into it"),
+         QStringLiteral("SHELL"),
+         {QStringLiteral("bash"), QStringLiteral("zsh")}}};
     verb.run = run;
     return verb;
 }
