@@ -3,9 +3,11 @@
 
 #include "describe.h"
 
+#include "shown.h"
 #include "vfs/vfs.h"
 
 #include <QDateTime>
+#include <QUrl>
 
 #include <algorithm>
 
@@ -59,6 +61,17 @@ constexpr TypeName typeNames[] = {
     {TypeFuseUrl, "fuse-url"},
 };
 
+bool isUrl(const Entry& entry)
+{
+    return entry.isCustomUrl() || entry.isFuseUrl();
+}
+
+/// What the library makes of a URL, be it a broken one, it makes of one without the password too.
+Entry withoutPassword(const Entry& entry)
+{
+    return isUrl(entry) ? VFS::ptr()->entry(shownLocation(entry.path())) : entry;
+}
+
 } // namespace
 
 QString typeName(int type)
@@ -70,16 +83,21 @@ QString typeName(int type)
     return QLatin1String(found == std::end(typeNames) ? "unknown" : found->name);
 }
 
+QString shownPath(const Entry& entry)
+{
+    return isUrl(entry) ? shownLocation(entry.path()) : entry.path();
+}
+
 QString shownName(const Entry& entry)
 {
-    return entry.lastPathSection();
+    return isUrl(entry) ? shownPath(entry).section(QLatin1Char('/'), -1) : entry.lastPathSection();
 }
 
 QJsonObject toJson(const Entry& entry)
 {
     return {
         {QStringLiteral("name"), shownName(entry)},
-        {QStringLiteral("path"), entry.path()},
+        {QStringLiteral("path"), shownPath(entry)},
         {QStringLiteral("localPath"), textOrNull(entry.localPath())},
         {QStringLiteral("type"), entry.type()},
         {QStringLiteral("typeName"), typeName(entry.type())},
@@ -95,10 +113,16 @@ QString isoTime(qint64 seconds)
     return local.toOffsetFromUtc(local.offsetFromUtc()).toString(Qt::ISODate);
 }
 
-QUrl urlOf(const Entry& entry)
+QString urlOf(const Entry& entry)
 {
-    const QList<QUrl> urls = VFS::ptr()->urlsFromEntries(entry);
-    return urls.isEmpty() ? QUrl() : urls.constFirst();
+    const QList<QUrl> urls = VFS::ptr()->urlsFromEntries(withoutPassword(entry));
+    return urls.isEmpty() ? QString()
+                          : shownLocation(urls.constFirst().toString(QUrl::FullyEncoded));
+}
+
+QString networkUrlOf(const Entry& entry)
+{
+    return shownLocation(VFS::ptr()->getUrlForEntry(withoutPassword(entry)));
 }
 
 QJsonValue textOrNull(const QString& text)

@@ -8,7 +8,6 @@
 
 #include <QJsonObject>
 #include <QString>
-#include <QUrl>
 
 namespace VeyFM {
 namespace Tool {
@@ -16,7 +15,10 @@ namespace Tool {
 /// A word for a type number, such as "directory" or "samba-share"; "unknown" for what has none.
 QString typeName(int type);
 
-/// The last section of the path: what a listing shows.
+/// The path, without the password of one that is a URL.
+QString shownPath(const Entry& entry);
+
+/// The last section of that: what a listing shows.
 QString shownName(const Entry& entry);
 
 /// What the entry itself holds: name, path, localPath, type, typeName. No look at the disk.
@@ -25,8 +27,11 @@ QJsonObject toJson(const Entry& entry);
 /// Seconds since the epoch as local time with its offset in ISO 8601; empty for -1.
 QString isoTime(qint64 seconds);
 
-/// The URL that leads back to the entry; empty when its directory has gone.
-QUrl urlOf(const Entry& entry);
+/// The URL that leads back to the entry; empty when its directory has gone. Without a password.
+QString urlOf(const Entry& entry);
+
+/// The URL of what is mounted there, or empty. Without a password.
+QString networkUrlOf(const Entry& entry);
 
 /// The text, or null for an empty one.
 QJsonValue textOrNull(const QString& text);

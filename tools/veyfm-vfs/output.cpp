@@ -4,10 +4,9 @@
 #include "output.h"
 
 #include "report.h"
+#include "shown.h"
 #include "spinner.h"
 #include "terminal.h"
-
-#include <QJsonDocument>
 
 #include <cerrno>
 #include <unistd.h>
@@ -98,7 +97,8 @@ void Output::writeRecord(const QByteArray& bytes)
 
 QByteArray Output::name(const QString& name) const
 {
-    return (m_terminal && !m_null ? escaped(name) : name).toLocal8Bit();
+    const QString shown = shownText(name);
+    return (m_terminal && !m_null ? escaped(shown) : shown).toLocal8Bit();
 }
 
 QByteArray Output::name(const QString& text, const Entry& entry) const
@@ -108,7 +108,7 @@ QByteArray Output::name(const QString& text, const Entry& entry) const
 
 QByteArray Output::label(const QString& text, const Entry& entry) const
 {
-    const QByteArray bytes = escaped(text).toLocal8Bit();
+    const QByteArray bytes = escaped(shownText(text)).toLocal8Bit();
     return m_colour ? coloured(bytes, colourOf(entry)) : bytes;
 }
 
@@ -130,7 +130,7 @@ JsonArray::JsonArray(Output& output)
 void JsonArray::append(const QJsonObject& object)
 {
     m_output.write(m_empty ? QByteArrayLiteral("[\n") : QByteArrayLiteral(",\n"));
-    m_output.write(QJsonDocument(object).toJson(QJsonDocument::Compact));
+    m_output.write(shownJson(object));
     m_empty = false;
 }
 

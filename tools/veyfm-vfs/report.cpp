@@ -3,6 +3,7 @@
 
 #include "report.h"
 
+#include "shown.h"
 #include "spinner.h"
 #include "terminal.h"
 
@@ -39,7 +40,9 @@ void writeError(const QByteArray& bytes)
 
 QByteArray reportLine(const QString& what, const QString& why)
 {
-    return QStringLiteral("veyfm-vfs: %1: %2\n").arg(escaped(what), escaped(why)).toLocal8Bit();
+    return QStringLiteral("veyfm-vfs: %1: %2\n")
+        .arg(escaped(shownLocation(what)), escaped(shownText(why)))
+        .toLocal8Bit();
 }
 
 void report(const QString& what, const QString& why)

@@ -9,7 +9,8 @@
 namespace VeyFM {
 namespace Tool {
 
-/// Prints "veyfm-vfs: <what>: <why>" to standard error, control characters escaped.
+/// Prints "veyfm-vfs: <what>: <why>" to standard error, control characters escaped and
+/// passwords in URLs left out.
 void report(const QString& what, const QString& why);
 
 /// Prints a line to standard error as it is.

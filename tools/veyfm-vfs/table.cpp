@@ -4,6 +4,7 @@
 #include "table.h"
 
 #include "output.h"
+#include "shown.h"
 #include "terminal.h"
 
 #include <algorithm>
@@ -23,7 +24,7 @@ void Table::add(const QStringList& cells)
 {
     QStringList row;
     for (const QString& cell : cells) {
-        row.append(cell.isEmpty() ? QStringLiteral("-") : escaped(cell));
+        row.append(cell.isEmpty() ? QStringLiteral("-") : escaped(shownText(cell)));
     }
     m_rows.append(row);
 }

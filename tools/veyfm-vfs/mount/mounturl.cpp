@@ -390,8 +390,12 @@ QString shownUrl(const QString& url)
     static const QRegularExpression port(QStringLiteral("^[0-9]*$"));
     // An encoded colon ends a user as well, for curlftpfs.
     static const QRegularExpression colon(QStringLiteral(":|%3[Aa]"));
+    static const QRegularExpression address(QStringLiteral("^\\[[^\\]@]*\\](?::[0-9]*)?$"));
     const int start = scheme.match(url).capturedLength();
     const int end = authorityEnd(url, start);
+    if (address.match(url.mid(start, end - start)).hasMatch()) {
+        return url;
+    }
     const QRegularExpressionMatch match = colon.match(url.left(end), start);
     if (!match.hasMatch()) {
         return url;

@@ -8,10 +8,13 @@
 #include "devices.h"
 #include "locate.h"
 #include "service/networkplacesmanagerproxy.h"
+#include "shown.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 
 #include <QDir>
+
+#include <algorithm>
 
 #include <sys/stat.h>
 
@@ -244,8 +247,21 @@ QStringList candidatesFor(QStringList words)
     return operandCandidates(verb->operandKind, word);
 }
 
+/// The same each once, and none that would show a password.
+QStringList offered(const QStringList& words)
+{
+    QStringList candidates = candidatesFor(words);
+    candidates.removeDuplicates();
+    const auto isSecret = [](const QString& candidate) {
+        return shownText(candidate) != candidate;
+    };
+    candidates.erase(
+        std::remove_if(candidates.begin(), candidates.end(), isSecret), candidates.end());
+    return candidates;
+}
+
 /// What may stand for the last word of a line as the shell reads it.
-QStringList candidatesFor(const ShellLine& line)
+QStringList offered(const ShellLine& line)
 {
     QStringList words = line.words();
     const QString typed = words.constLast();
@@ -253,7 +269,7 @@ QStringList candidatesFor(const ShellLine& line)
     const QString here = typed.startsWith(QLatin1Char('~')) ? QStringLiteral("./") : QString();
     words.last().prepend(here);
     QStringList candidates;
-    const QStringList found = candidatesFor(words);
+    const QStringList found = offered(words);
     for (const QString& candidate : found) {
         const QString value = candidate.mid(here.size());
         if (value.startsWith(typed)) {
@@ -273,8 +289,7 @@ ShellReply replyFor(const QString& shell)
     if (!line.isReadable() || text.toLocal8Bit() != bytes) {
         return {};
     }
-    QStringList candidates = candidatesFor(line);
-    candidates.removeDuplicates();
+    const QStringList candidates = offered(line);
     if (shell == QLatin1String("zsh")) {
         return replyForZsh(line, candidates, !qEnvironmentVariableIsEmpty("COMP_CLOSING"));
     }
@@ -302,9 +317,8 @@ int run(Invocation& invocation)
         return Done;
     }
 
-    QStringList candidates = candidatesFor(invocation.operands());
-    candidates.removeDuplicates();
-    for (const QString& candidate : qAsConst(candidates)) {
+    const QStringList candidates = offered(invocation.operands());
+    for (const QString& candidate : candidates) {
         write(output, candidate);
     }
     return Done;

@@ -69,8 +69,8 @@ QString account(const QString& name, uint id)
 QJsonObject describe(const Entry& entry)
 {
     QJsonObject object = toJson(entry);
-    object.insert(QStringLiteral("url"), textOrNull(urlOf(entry).toString(QUrl::FullyEncoded)));
-    object.insert(QStringLiteral("networkUrl"), textOrNull(VFS::ptr()->getUrlForEntry(entry)));
+    object.insert(QStringLiteral("url"), textOrNull(urlOf(entry)));
+    object.insert(QStringLiteral("networkUrl"), textOrNull(networkUrlOf(entry)));
     if (isOnDisk(entry)) {
         object.insert(QStringLiteral("size"), entry.fileSize());
         object.insert(QStringLiteral("modified"), isoTime(entry.lastModified()));
@@ -87,7 +87,7 @@ QJsonObject describe(const Entry& entry)
     QJsonArray chain;
     const EntryList parents = chainOf(entry);
     for (const Entry& parent : parents) {
-        chain.append(parent.path());
+        chain.append(shownPath(parent));
     }
     object.insert(QStringLiteral("parents"), chain);
     object.insert(QStringLiteral("flags"), QJsonArray::fromStringList(flagsOf(entry)));
@@ -104,11 +104,11 @@ void print(Output& output, const Entry& entry)
     const auto yesNo = [](bool yes) {
         return yes ? QStringLiteral("yes") : QStringLiteral("no");
     };
-    output.write("path: " + output.label(entry.path(), entry) + '\n');
+    output.write("path: " + output.label(shownPath(entry), entry) + '\n');
     line("local path", entry.localPath());
     line("type", QStringLiteral("%1 (%2)").arg(typeName(entry.type())).arg(entry.type()));
-    line("URL", urlOf(entry).toString(QUrl::FullyEncoded));
-    line("network URL", VFS::ptr()->getUrlForEntry(entry));
+    line("URL", urlOf(entry));
+    line("network URL", networkUrlOf(entry));
     if (isOnDisk(entry)) {
         line("size", QString::number(entry.fileSize()));
         line("modified", isoTime(entry.lastModified()));
@@ -124,7 +124,7 @@ void print(Output& output, const Entry& entry)
     const EntryList chain = chainOf(entry);
     for (const Entry& parent : chain) {
         if (parent != VFS::ptr()->rootEntry()) {
-            parents.append(parent.path());
+            parents.append(shownPath(parent));
         }
     }
     line("parents", parents.join(QLatin1String(" > ")));

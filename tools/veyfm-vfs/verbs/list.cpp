@@ -33,7 +33,7 @@ public:
 
     QString operator()(const Entry& entry) const
     {
-        return m_whole ? entry.path() : shownName(entry);
+        return m_whole ? shownPath(entry) : shownName(entry);
     }
 
 private:
@@ -153,7 +153,7 @@ void printTitle(Invocation& invocation, const Entry& entry, bool first)
     if (!first) {
         output.write(QByteArrayLiteral("\n"));
     }
-    output.write(output.name(entry.path(), entry) + ":\n");
+    output.write(output.name(shownPath(entry), entry) + ":\n");
 }
 
 int run(Invocation& invocation)

@@ -7,13 +7,13 @@
 #include "locate.h"
 #include "report.h"
 #include "service.h"
+#include "shown.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 #include "vfs/vfsplacebase.h"
 #include "watch/entrywatcher.h"
 
 #include <QCoreApplication>
-#include <QJsonDocument>
 #include <QSet>
 
 #include <cerrno>
@@ -155,7 +155,7 @@ private:
         QObject::connect(
             vfs, &VFS::fuseMountAdded, vfs, [this](const QString& url, const Entry& entry) {
                 // One that makes no place has its URL alone.
-                const QString path = entry.isNull() ? url : entry.path();
+                const QString path = entry.isNull() ? shownLocation(url) : entry.path();
                 if (m_mounts || wasAskedFor(path)) {
                     write(QLatin1String("mounted"), entry, path, entry.localPath());
                 }
@@ -200,7 +200,7 @@ private:
             object.insert(QStringLiteral("path"), path);
             object.insert(QStringLiteral("localPath"), textOrNull(localPath));
             object.insert(QStringLiteral("event"), event);
-            output.write(QJsonDocument(object).toJson(QJsonDocument::Compact) + '\n');
+            output.write(shownJson(object) + '\n');
         } else {
             const QByteArray word = QString(event).leftJustified(10).toLocal8Bit();
             output.writeRecord(word + "  " + output.name(path, entry));

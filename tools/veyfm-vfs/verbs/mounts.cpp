@@ -4,13 +4,13 @@
 #include "commandline.h"
 #include "describe.h"
 #include "mount/mountinfo.h"
-#include "mount/mounturl.h"
 #include "mount/networkmounts.h"
 #include "report.h"
 #include "service.h"
 #include "service/fusemountsmanagerproxy.h"
 #include "service/networkmountsmanagerproxy.h"
 #include "session.h"
+#include "shown.h"
 #include "spinner.h"
 #include "table.h"
 #include "verbs/verbs.h"
@@ -34,7 +34,7 @@ int print(Invocation& invocation, const RegisteredMounts& registered)
     JsonArray json(output);
     Table table;
     for (const NetworkMount& mount : mounts) {
-        const QString url = shownUrl(mount.url);
+        const QString url = shownLocation(mount.url);
         if (invocation.json()) {
             json.append(
                 {{QStringLiteral("url"), textOrNull(url)},

@@ -9,6 +9,7 @@
 #include "service.h"
 #include "service/networkplacesmanagerproxy.h"
 #include "session.h"
+#include "shown.h"
 #include "spinner.h"
 #include "table.h"
 #include "verbs/browse.h"
@@ -54,7 +55,7 @@ int runList(Invocation& invocation)
                 {{QStringLiteral("name"), place.name()},
                  {QStringLiteral("path"),
                   textOrNull(pathBelow(VFS::ptr()->networkEntry(), place.name()))},
-                 {QStringLiteral("url"), place.url()},
+                 {QStringLiteral("url"), shownLocation(place.url())},
                  {QStringLiteral("localPath"), textOrNull(place.localPath())}});
         }
         json.end();
@@ -62,7 +63,7 @@ int runList(Invocation& invocation)
     }
     Table table;
     for (const NetworkPlace& place : places) {
-        table.add({place.name(), place.url(), place.localPath()});
+        table.add({place.name(), shownLocation(place.url()), place.localPath()});
     }
     table.write(output);
     return Done;

@@ -51,12 +51,12 @@ int run(Invocation& invocation)
             }
             // The top of the tree has a name that is not meant to be seen.
             else if (entry != vfs.rootEntry() || chain.size() == 1) {
-                output.writeRecord(output.name(entry.path(), entry));
+                output.writeRecord(output.name(shownPath(entry), entry));
             }
         }
         if (invocation.json()) {
             json.append(
-                {{QStringLiteral("path"), located.entry.path()},
+                {{QStringLiteral("path"), shownPath(located.entry)},
                  {QStringLiteral("chain"), elements}});
         }
     }

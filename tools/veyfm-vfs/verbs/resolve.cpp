@@ -4,9 +4,9 @@
 #include "commandline.h"
 #include "describe.h"
 #include "locate.h"
+#include "shown.h"
 #include "verbs/describeeach.h"
 #include "verbs/verbs.h"
-#include "vfs/vfs.h"
 
 namespace VeyFM {
 namespace Tool {
@@ -23,21 +23,21 @@ void print(Output& output, const QString& text, const Entry& entry)
             line(label, output.label(value, Entry()));
         }
     };
-    textLine("text", text);
-    line("path", output.label(entry.path(), entry));
+    textLine("text", shownLocation(text));
+    line("path", output.label(shownPath(entry), entry));
     textLine("local path", entry.localPath());
     textLine("type", QStringLiteral("%1 (%2)").arg(typeName(entry.type())).arg(entry.type()));
-    textLine("URL", urlOf(entry).toString(QUrl::FullyEncoded));
-    textLine("network URL", VFS::ptr()->getUrlForEntry(entry));
+    textLine("URL", urlOf(entry));
+    textLine("network URL", networkUrlOf(entry));
     textLine("exists", entry.isExists() ? QStringLiteral("yes") : QStringLiteral("no"));
 }
 
 QJsonObject describe(const QString& text, const Entry& entry)
 {
     QJsonObject object = toJson(entry);
-    object.insert(QStringLiteral("text"), text);
-    object.insert(QStringLiteral("url"), textOrNull(urlOf(entry).toString(QUrl::FullyEncoded)));
-    object.insert(QStringLiteral("networkUrl"), textOrNull(VFS::ptr()->getUrlForEntry(entry)));
+    object.insert(QStringLiteral("text"), shownLocation(text));
+    object.insert(QStringLiteral("url"), textOrNull(urlOf(entry)));
+    object.insert(QStringLiteral("networkUrl"), textOrNull(networkUrlOf(entry)));
     object.insert(QStringLiteral("exists"), entry.isExists());
     return object;
 }

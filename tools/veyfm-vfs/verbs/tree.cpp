@@ -76,7 +76,7 @@ private:
         const QString why = whyUnreadable(entry);
         // The directories of places, such as Trash, are made when they are needed.
         if (!why.isEmpty() && !(entry.isPlace() && why == systemReason(ENOENT))) {
-            report(entry.path(), why);
+            report(shownPath(entry), why);
             m_failed = true;
         }
         EntryList children;
@@ -117,7 +117,7 @@ public:
     /// The operand, under its whole path.
     void addTop(const Node& node)
     {
-        addLine(QString(), node.entry.path(), node);
+        addLine(QString(), shownPath(node.entry), node);
         addChildren(QString(), node);
     }
 
