@@ -3,9 +3,13 @@
 
 #include "spinner.h"
 
+#include "shown.h"
+#include "terminal.h"
+
 #include <QByteArray>
 #include <QString>
 
+#include <algorithm>
 #include <chrono>
 #include <condition_variable>
 #include <mutex>
@@ -48,7 +52,7 @@ public:
         }
     }
 
-    void begin(const QByteArray& text)
+    void begin(const QString& text)
     {
         const std::lock_guard<std::mutex> lock(m_mutex);
         if (m_waiting) {
@@ -105,28 +109,40 @@ private:
     {
         const auto seconds = std::chrono::duration_cast<std::chrono::seconds>(elapsed).count();
         m_frame = (m_frame + 1) % sizeof frames;
-        writeToTerminal(
-            QByteArray("\r") + frames[m_frame] + ' ' + m_text + " (" +
-            QByteArray::number(qlonglong(seconds)) + " s)\033[K");
-        m_shown = true;
+        const QString frame = QLatin1Char(frames[m_frame]) + QString(QLatin1Char(' '));
+        const QString time = QStringLiteral(" (%1 s)").arg(seconds);
+        // The last column stays free: behind it some terminals begin a new line.
+        const int columns = terminalWidth(STDERR_FILENO) - 1;
+        const QString text = cutToWidth(m_text, columns - frame.size() - time.size());
+        const QString line = cutToWidth(frame + text + time, columns);
+        const QByteArray old = toItsStart();
+        m_width = displayWidth(line);
+        writeToTerminal(old + line.toLocal8Bit() + "\033[K");
     }
 
     void erase()
     {
-        if (m_shown) {
-            writeToTerminal("\r\033[K");
+        if (m_width > 0) {
+            writeToTerminal(toItsStart() + "\033[K");
         }
-        m_shown = false;
+        m_width = 0;
+    }
+
+    /// To the start of the line that is shown, which a terminal that became narrower has broken.
+    QByteArray toItsStart() const
+    {
+        const int rows = std::max(m_width - 1, 0) / std::max(terminalWidth(STDERR_FILENO), 1);
+        return rows > 0 ? "\r\033[" + QByteArray::number(rows) + "A\033[J" : QByteArray("\r");
     }
 
     std::mutex m_mutex;
     std::condition_variable m_changed;
     std::thread m_thread;
-    QByteArray m_text;
+    QString m_text;
     Clock::time_point m_start;
     size_t m_frame = 0;
     bool m_waiting = false;
-    bool m_shown = false;
+    int m_width = 0; // Of the line that is shown; 0 for none.
     bool m_quit = false;
 };
 
@@ -148,7 +164,7 @@ Drawer* drawer()
 void Spinner::begin(const QString& text)
 {
     if (Drawer* const line = drawer()) {
-        line->begin(text.toLocal8Bit());
+        line->begin(escaped(shownText(text)));
     }
 }
 

@@ -83,6 +83,21 @@ int displayWidth(const QString& text)
     return width;
 }
 
+QString cutToWidth(const QString& text, int columns)
+{
+    const QVector<uint> characters = text.toUcs4();
+    int width = 0;
+    int count = 0;
+    for (; count < characters.size(); ++count) {
+        const uint character = characters.at(count);
+        width += displayWidth(QString::fromUcs4(&character, 1));
+        if (width > columns) {
+            break;
+        }
+    }
+    return QString::fromUcs4(characters.constData(), count);
+}
+
 int terminalWidth()
 {
     bool ok = false;
@@ -90,11 +105,13 @@ int terminalWidth()
     if (ok && columns > 0) {
         return columns;
     }
+    return terminalWidth(STDOUT_FILENO);
+}
+
+int terminalWidth(int descriptor)
+{
     winsize size = {};
-    if (::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0) {
-        return size.ws_col;
-    }
-    return 80;
+    return ::ioctl(descriptor, TIOCGWINSZ, &size) == 0 && size.ws_col > 0 ? size.ws_col : 80;
 }
 
 bool isUtf8Locale()

@@ -21,8 +21,14 @@ QString escaped(const QString& text);
 /// Columns that the text takes on a terminal. Without control characters.
 int displayWidth(const QString& text);
 
-/// Columns of the terminal: the variable COLUMNS, the terminal itself, or 80.
+/// The text as far as so many columns hold it.
+QString cutToWidth(const QString& text, int columns);
+
+/// Columns of the terminal: the variable COLUMNS, the terminal of standard output, or 80.
 int terminalWidth();
+
+/// Columns of the terminal that a descriptor stands for as they are now, or 80.
+int terminalWidth(int descriptor);
 
 /// Whether the encoding of the locale is UTF-8.
 bool isUtf8Locale();
