@@ -29,6 +29,7 @@ private Q_SLOTS:
     void init();
     void cleanup();
     void asksOnceForWhatTheJobAsksTwice();
+    void interruptBringsTheEchoBack();
     void takesWhatIsMounted();
     void showsEachFolderOfAServer();
     void asksForEachHostByItself();
@@ -103,6 +104,20 @@ void ExampleMountTest::asksOnceForWhatTheJobAsksTwice()
 }
 
 // The place of the mount above, as another process finds it.
+void ExampleMountTest::interruptBringsTheEchoBack()
+{
+    tool->expect(asks);
+    const auto example = run(QStringLiteral("sftp://host/letters"));
+    QVERIFY2(example->waitFor("User on host []: "), example->output().constData());
+    QVERIFY(example->hasEcho());
+    example->type("anna\n");
+    QVERIFY(example->waitFor("Password: "));
+    QTRY_VERIFY(!example->hasEcho());
+    example->type("\003");
+    QCOMPARE(example->waitForEnd(), -1); // By the signal.
+    QVERIFY(example->hasEcho());
+}
+
 void ExampleMountTest::takesWhatIsMounted()
 {
     service->setValue(

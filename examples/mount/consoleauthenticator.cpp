@@ -5,28 +5,56 @@
 
 #include <QTextStream>
 
+#include <iterator>
+
+#include <signal.h>
 #include <termios.h>
 #include <unistd.h>
 
 namespace {
 
-/// What is typed does not show as long as this lives.
+constexpr int endingSignals[] = {SIGINT, SIGQUIT, SIGTERM, SIGHUP};
+
+termios before = {}; // Of the terminal. Not of the object below: the handler reads it.
+
+/// Puts the terminal back. The signal comes again behind this, and then has its usual effect.
+void endBySignal(int number)
+{
+    ::tcsetattr(STDIN_FILENO, TCSANOW, &before);
+    ::raise(number);
+}
+
+/// What is typed does not show as long as this lives, nor longer where Ctrl-C ends the program.
 class HiddenInput
 {
 public:
     HiddenInput()
     {
-        m_isTerminal = ::tcgetattr(STDIN_FILENO, &m_before) == 0;
-        termios hidden = m_before;
-        hidden.c_lflag &= ~tcflag_t(ECHO);
-        if (m_isTerminal) {
-            ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &hidden);
+        m_isTerminal = ::tcgetattr(STDIN_FILENO, &before) == 0;
+        if (!m_isTerminal) {
+            return;
         }
+        struct sigaction ending = {};
+        ending.sa_handler = endBySignal;
+        ending.sa_flags = int(SA_RESETHAND);
+        for (size_t i = 0; i < std::size(endingSignals); ++i) {
+            ::sigaction(endingSignals[i], &ending, &m_actions[i]);
+            if (m_actions[i].sa_handler == SIG_IGN) {
+                ::sigaction(endingSignals[i], &m_actions[i], nullptr);
+            }
+        }
+        termios hidden = before;
+        hidden.c_lflag &= ~tcflag_t(ECHO);
+        ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &hidden);
     }
     ~HiddenInput()
     {
-        if (m_isTerminal) {
-            ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &m_before);
+        if (!m_isTerminal) {
+            return;
+        }
+        ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &before);
+        for (size_t i = 0; i < std::size(endingSignals); ++i) {
+            ::sigaction(endingSignals[i], &m_actions[i], nullptr);
         }
     }
 
@@ -34,7 +62,7 @@ private:
     Q_DISABLE_COPY(HiddenInput)
 
     bool m_isTerminal = false;
-    termios m_before = {};
+    struct sigaction m_actions[std::size(endingSignals)] = {};
 };
 
 /// A line; null at the end of the input.
