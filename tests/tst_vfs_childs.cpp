@@ -413,8 +413,8 @@ void TestVfsChilds::invalidLinks()
     QCOMPARE(VFS::ptr()->childs(dir("aliased")).size(), 2);
 }
 
-// At the head of a text the decoder takes these three bytes for a mark and drops them, so a name
-// that begins with them is not valid. Within a whole local path they are a character.
+// At the head of a text the decoder takes these three bytes for a mark and drops them. Within a
+// path, which is where a name stands, they are a character.
 void TestVfsChilds::byteOrderMarks()
 {
     QVERIFY(m_scene.makeDir("marks"));
@@ -424,11 +424,18 @@ void TestVfsChilds::byteOrderMarks()
     QVERIFY(m_scene.makeLink(
         "..", "marks/\xef\xbb\xbf"
               "link"));
-    const EntryList children = VFS::ptr()->childs(dir("marks"));
-    QCOMPARE(children.size(), 1);
-    QCOMPARE(children[0].path(), m_scene.path("marks/link"));
-    QCOMPARE(children[0].localPath(), m_scene.path("marks/\xef\xbb\xbflink"));
-    QCOMPARE(children[0].type(), int(TypeDirLink));
+    EntryList children = VFS::ptr()->childs(dir("marks"));
+    children.sort(true);
+    QCOMPARE(children.size(), 3);
+    const QString names[] = {
+        QStringLiteral("\ufeffdir"), QStringLiteral("\ufeffile"), QStringLiteral("\ufefflink")};
+    const int types[] = {TypeDir, TypeFile, TypeDirLink};
+    for (int i = 0; i < 3; ++i) {
+        QCOMPARE(children[i].path(), m_scene.path("marks/") + names[i]);
+        QCOMPARE(children[i].localPath(), children[i].path());
+        QCOMPARE(children[i].type(), types[i]);
+        QVERIFY(children[i].isExists());
+    }
 }
 
 void TestVfsChilds::longNames()

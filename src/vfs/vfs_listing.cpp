@@ -128,8 +128,12 @@ bool VFSPrivate::appendDirectory(
         if (!path.isNull()) {
             local = samePrefix ? path : joinedAscii(localPrefix, name, length);
         } else {
-            const QString decoded = QString::fromLocal8Bit(name, length);
-            isValidName = decoded.toLocal8Bit() == QByteArray::fromRawData(name, length);
+            // Behind a slash: the decoder drops a byte order mark from the head of a text, and as
+            // part of a path, which a name always is, the mark is a character like others.
+            const QByteArray bytes = '/' + QByteArray::fromRawData(name, length);
+            const QString withSlash = QString::fromLocal8Bit(bytes);
+            const QString decoded = withSlash.mid(1);
+            isValidName = withSlash.toLocal8Bit() == bytes;
             if (!isValidName && kind != DT_LNK) {
                 continue;
             }
@@ -137,8 +141,7 @@ bool VFSPrivate::appendDirectory(
             if (isValidName) {
                 local = samePrefix ? path : localPrefix + decoded;
             } else {
-                // Decoded as a whole: a byte order mark, which the decoder drops from the head
-                // of a name, is a character within a path, and a link of that name is found.
+                // Decoded as a whole, as whoever is handed the path will do.
                 local = QString::fromLocal8Bit(directory + name);
             }
         }

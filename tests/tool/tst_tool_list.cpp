@@ -58,6 +58,7 @@ private Q_SLOTS:
     void rawNamesInPipes();
     void nullEndsRecords();
     void invalidNames();
+    void namesWithByteOrderMarks();
     void plainLocale();
     void colourOnRequest();
 
@@ -335,9 +336,22 @@ void ToolListTest::invalidNames()
     QVERIFY(createFile(m_directory->path(), "bad\377file"));
     const QByteArray link = path(QStringLiteral("bad")).toLocal8Bit() + "\377link";
     QCOMPARE(::symlink("target", link.constData()), 0);
+    QVERIFY(createFile(m_directory->path(), ".bad\n\377"));
     const ToolResult json = list({QStringLiteral("--json")});
-    QCOMPARE(json.exitCode, 0);
+    QCOMPARE(json.exitCode, 1);
     QCOMPARE(names(json.json()), QStringList(QStringLiteral("bad\ufffdlink")));
+    const QByteArray why = ": left out, not a valid name in the encoding of the locale\n";
+    const QByteArray start = "veyfm-vfs: " + m_directory->path().toLocal8Bit();
+    QCOMPARE(json.err, start + "/bad\\377file" + why);
+    const ToolResult all = list({QStringLiteral("--all")});
+    QCOMPARE(all.exitCode, 1);
+    QVERIFY2(all.err.contains(start + "/.bad\\n\\377" + why), all.err.constData());
+    QCOMPARE(all.err.count('\n'), 2);
+    const ToolResult tree =
+        runTool({QStringLiteral("tree"), QStringLiteral(".")}, m_directory->path());
+    QCOMPARE(tree.exitCode, 1);
+    QCOMPARE(tree.err, json.err);
+    QCOMPARE(::unlink((m_directory->path().toLocal8Bit() + "/.bad\n\377").constData()), 0);
 
     // An operand of that kind has no entry. The shell passes the byte on.
     const ToolResult operand = runProgram(
@@ -351,6 +365,23 @@ void ToolListTest::invalidNames()
         operand.err.constData());
     QCOMPARE(::unlink((m_directory->path().toLocal8Bit() + "/bad\377file").constData()), 0);
     QCOMPARE(::unlink(link.constData()), 0);
+}
+
+void ToolListTest::namesWithByteOrderMarks()
+{
+    QVERIFY(createFile(m_directory->path(), "\357\273\277file"));
+    QVERIFY(createFile(m_directory->path(), "\357\273\277"));
+    QVERIFY(QDir(m_directory->path()).mkdir(QStringLiteral("\ufeffdir")));
+    const ToolResult result = list({});
+    QCOMPARE(result.err, QByteArray());
+    QCOMPARE(result.exitCode, 0);
+    QCOMPARE(result.out, QByteArray("\357\273\277\n\357\273\277dir\n\357\273\277file\n"));
+    // As an operand too.
+    const QStringList operands = {QStringLiteral("\ufeffdir"), QStringLiteral("\ufefffile")};
+    const ToolResult info =
+        runTool(QStringList(QStringLiteral("info")) + operands, m_directory->path());
+    QCOMPARE(info.err, QByteArray());
+    QCOMPARE(info.exitCode, 0);
 }
 
 void ToolListTest::plainLocale()

@@ -245,6 +245,15 @@ QString verbHelp(const Verb& verb)
     return text;
 }
 
+QStringList wordsOf(const char* const* arguments)
+{
+    QStringList words;
+    for (; *arguments; ++arguments) {
+        words.append(QString::fromLocal8Bit(QByteArray("/") + *arguments).mid(1));
+    }
+    return words;
+}
+
 int runCommandLine(const QStringList& words)
 {
     if (words.isEmpty()) {

@@ -47,6 +47,9 @@ QVector<Option> allOptions(const Verb& verb);
 QString generalHelp();
 QString verbHelp(const Verb& verb);
 
+/// The arguments as texts. QCoreApplication drops a byte order mark at the head of one.
+QStringList wordsOf(const char* const* arguments);
+
 /// Runs the command line @p words, which begins behind the name of the program.
 int runCommandLine(const QStringList& words);
 

@@ -3,8 +3,12 @@
 
 #include "listing.h"
 
+#include "describe.h"
+#include "report.h"
+
 #include <algorithm>
 
+#include <dirent.h>
 #include <sys/stat.h>
 
 namespace VeyFM {
@@ -29,6 +33,15 @@ void sortByFacts(QVector<Item>::iterator begin, QVector<Item>::iterator end, Sor
     std::stable_sort(begin, end, [sortBy](const Item& left, const Item& right) {
         return sortBy == SortBy::Size ? left.size > right.size : left.modified > right.modified;
     });
+}
+
+bool isText(const QByteArray& name)
+{
+    const bool isAscii =
+        std::all_of(name.begin(), name.end(), [](char c) { return uchar(c) < 0x80; });
+    // Behind a slash, since a byte order mark at the head of a text is no part of it.
+    const QByteArray path = '/' + name;
+    return isAscii || QString::fromLocal8Bit(path).toLocal8Bit() == path;
 }
 
 } // namespace
@@ -68,6 +81,31 @@ QVector<Item> listing(const Entry& entry, const ListingOptions& options)
         std::reverse(items.begin() + places.size(), items.end());
     }
     return items;
+}
+
+bool reportLeftOut(const Entry& entry, const ListingOptions& options)
+{
+    const QByteArray local = entry.localPath().toLocal8Bit();
+    if (local.isEmpty() || local.contains('\0') || !hasDirectory(entry)) {
+        return false;
+    }
+    bool wereAny = false;
+    DIR* const stream = ::opendir(local.constData());
+    while (const dirent* record = stream ? ::readdir(stream) : nullptr) {
+        const QByteArray name = record->d_name;
+        // Links of such names are listed.
+        const bool isShown = record->d_type == DT_LNK || isText(name);
+        if (!isShown && (options.hidden || !name.startsWith('.'))) {
+            reportBytes(
+                shownPath(entry) + QLatin1Char('/'), name,
+                QStringLiteral("left out, not a valid name in the encoding of the locale"));
+            wereAny = true;
+        }
+    }
+    if (stream) {
+        ::closedir(stream);
+    }
+    return wereAny;
 }
 
 } // namespace Tool

@@ -37,6 +37,12 @@ struct ListingOptions
  */
 QVector<Item> listing(const Entry& entry, const ListingOptions& options);
 
+/**
+ * Reports what listing() would show of the entry's directory, if the library did not leave it out:
+ * names that the encoding of the locale has no text for. Whether there were any.
+ */
+bool reportLeftOut(const Entry& entry, const ListingOptions& options);
+
 } // namespace Tool
 } // namespace VeyFM
 

@@ -17,5 +17,5 @@ int main(int argc, char* argv[])
     VeyFM::Tool::installLogging();
     QCoreApplication application(argc, argv);
     QCoreApplication::setApplicationName(QStringLiteral("veyfm-vfs"));
-    return VeyFM::Tool::runCommandLine(QCoreApplication::arguments().mid(1));
+    return VeyFM::Tool::runCommandLine(VeyFM::Tool::wordsOf(argv + 1));
 }

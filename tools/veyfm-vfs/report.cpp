@@ -50,6 +50,17 @@ void report(const QString& what, const QString& why)
     writeError(reportLine(what, why));
 }
 
+void reportBytes(const QString& before, const QByteArray& name, const QString& why)
+{
+    QString shown = escaped(shownLocation(before));
+    for (const char byte : name) {
+        shown += uchar(byte) < 0x80
+                     ? escaped(QString(QLatin1Char(byte)))
+                     : QStringLiteral("\\%1").arg(uint(uchar(byte)), 3, 8, QLatin1Char('0'));
+    }
+    writeError(QStringLiteral("veyfm-vfs: %1: %2\n").arg(shown, why).toLocal8Bit());
+}
+
 void say(const QString& line)
 {
     writeError((line + QLatin1Char('\n')).toLocal8Bit());

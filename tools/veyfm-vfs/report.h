@@ -13,6 +13,9 @@ namespace Tool {
 /// passwords in URLs left out.
 void report(const QString& what, const QString& why);
 
+/// report() of a name that is no text, by the numbers of its bytes where they are no ASCII.
+void reportBytes(const QString& before, const QByteArray& name, const QString& why);
+
 /// Prints a line to standard error as it is.
 void say(const QString& line);
 

@@ -189,6 +189,10 @@ int run(Invocation& invocation)
             }
             print(invocation, json, items);
             first = false;
+            output.flush();
+            if (reportLeftOut(located.entry, options)) {
+                exitCode = Failed;
+            }
         }
         // What is done stays done when a later operand is cut off.
         output.flush();

@@ -84,6 +84,9 @@ private:
         for (const Item& item : items) {
             children.append(item.entry);
         }
+        if (reportLeftOut(entry, m_options)) {
+            m_failed = true;
+        }
         return children;
     }
 
