@@ -307,7 +307,12 @@ int runCommandLine(const QStringList& words)
     }
     setVerbose(invocation.isSet(QStringLiteral("verbose")));
     VFS::initialize();
-    return output.finish(runVerb(invocation));
+    const int exitCode = runVerb(invocation);
+    // A verb that failed before it had anything to print.
+    if (invocation.json() && !verb->jsonLines && !output.wasUsed()) {
+        JsonArray(output).end();
+    }
+    return output.finish(exitCode);
 }
 
 } // namespace Tool

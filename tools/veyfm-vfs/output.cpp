@@ -59,6 +59,7 @@ bool Output::hasColour() const
 
 void Output::write(const QByteArray& bytes)
 {
+    m_wasUsed = m_wasUsed || !bytes.isEmpty();
     m_buffer += bytes;
     if (m_buffer.size() >= bufferSize) {
         flush();
@@ -68,6 +69,11 @@ void Output::write(const QByteArray& bytes)
 void Output::write(const QString& text)
 {
     write(text.toLocal8Bit());
+}
+
+bool Output::wasUsed() const
+{
+    return m_wasUsed;
 }
 
 void Output::flush()
@@ -127,6 +133,13 @@ JsonArray::JsonArray(Output& output)
 {
 }
 
+JsonArray::~JsonArray()
+{
+    if (!m_empty && !m_ended) {
+        end();
+    }
+}
+
 void JsonArray::append(const QJsonObject& object)
 {
     m_output.write(m_empty ? QByteArrayLiteral("[\n") : QByteArrayLiteral(",\n"));
@@ -137,6 +150,7 @@ void JsonArray::append(const QJsonObject& object)
 void JsonArray::end()
 {
     m_output.write(m_empty ? QByteArrayLiteral("[]\n") : QByteArrayLiteral("\n]\n"));
+    m_ended = true;
 }
 
 } // namespace Tool

@@ -37,6 +37,9 @@ public:
     void write(const QString& text);
     void flush();
 
+    /// Whether anything was written.
+    bool wasUsed() const;
+
     /// The bytes, and the end of a record.
     void writeRecord(const QByteArray& bytes);
 
@@ -56,6 +59,7 @@ private:
     QByteArray m_buffer;
     bool m_terminal;
     bool m_null = false;
+    bool m_wasUsed = false;
     bool m_colour = false;
     int m_error = 0;
 };
@@ -68,12 +72,17 @@ class JsonArray
 {
 public:
     explicit JsonArray(Output& output);
+    /// Ends an array that was begun.
+    ~JsonArray();
     void append(const QJsonObject& object);
     void end();
 
 private:
+    Q_DISABLE_COPY(JsonArray)
+
     Output& m_output;
     bool m_empty = true;
+    bool m_ended = false;
 };
 
 } // namespace Tool

@@ -66,6 +66,8 @@ struct Verb
     Needs needs = Needs::Tree;
     bool printsData = true; ///< Whether it knows --json.
     bool hidden = false;    ///< Whether help and completion pass over it.
+    QString otherName = {}; ///< A second word for it, which help and completion do not offer.
+    bool jsonLines = false; ///< Whether --json prints an object a line, and not one array.
     QVector<Option> options = {};
     /// What is wrong with a command line beyond what the description tells; empty for nothing.
     QString (*whyWrong)(const Invocation& invocation) = nullptr;

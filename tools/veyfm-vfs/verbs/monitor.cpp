@@ -257,6 +257,7 @@ Verb monitorVerb()
         "unmountable as well, shares and network bookmarks updated. Storage devices and the\n"
         "places of Samba are opened first. With --json each line is an object.");
     verb.leastOperands = 1;
+    verb.jsonLines = true;
     verb.options = {nullOption(), colorOption()};
     verb.run = run;
     return verb;
