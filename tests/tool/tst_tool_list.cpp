@@ -59,6 +59,9 @@ private Q_SLOTS:
     void nullEndsRecords();
     void invalidNames();
     void namesWithByteOrderMarks();
+    void sizesForPeople_data();
+    void sizesForPeople();
+    void otherName();
     void plainLocale();
     void colourOnRequest();
 
@@ -382,6 +385,68 @@ void ToolListTest::namesWithByteOrderMarks()
         runTool(QStringList(QStringLiteral("info")) + operands, m_directory->path());
     QCOMPARE(info.err, QByteArray());
     QCOMPARE(info.exitCode, 0);
+}
+
+void ToolListTest::sizesForPeople_data()
+{
+    QTest::addColumn<qint64>("size");
+    QTest::addColumn<QByteArray>("text");
+    const auto row = [](qint64 size, const char* text) {
+        QTest::newRow(text) << size << QByteArray(text);
+    };
+    row(0, "0");
+    row(1023, "1023");
+    row(1024, "1.0K");
+    row(1025, "1.1K");
+    row(10189, "10K");
+    row(10240, "10K");
+    row(10241, "11K");
+    row(1023 * 1024, "1023K");
+    row(1023 * 1024 + 1, "1.0M");
+    row(1024 * 1024 * 3 / 2, "1.5M");
+    row(qint64(1) << 40, "1.0T");
+    row((qint64(1) << 43) - 1, "8.0T");
+}
+
+void ToolListTest::sizesForPeople()
+{
+    QFETCH(const qint64, size);
+    QFETCH(const QByteArray, text);
+    QVERIFY(createFile(m_directory->path(), "file"));
+    QCOMPARE(::truncate(path(QStringLiteral("file")).toLocal8Bit().constData(), size), 0);
+    const QStringList options[] = {
+        {QStringLiteral("-h")},
+        {QStringLiteral("-lh")},
+        {QStringLiteral("--human-readable"), QStringLiteral("--long")}};
+    for (const QStringList& option : options) {
+        const ToolResult result = list(option);
+        QCOMPARE(result.exitCode, 0);
+        QVERIFY2(result.out.startsWith("file  " + text + "  "), result.out.constData());
+    }
+    // ls is the model.
+    const ToolResult model =
+        runProgram(QStringLiteral("ls"), {QStringLiteral("-lh"), path(QStringLiteral("file"))});
+    QVERIFY2(model.out.contains(' ' + text + ' '), model.out.constData());
+    const ToolResult json = list({QStringLiteral("-h"), QStringLiteral("--json")});
+    QCOMPARE(json.json().at(0)[QLatin1String("size")].toDouble(), double(size));
+}
+
+void ToolListTest::otherName()
+{
+    QVERIFY(createFile(m_directory->path(), "file"));
+    const QString ls = QStringLiteral("ls");
+    const ToolResult result = runTool({ls, QStringLiteral("-a")}, m_directory->path());
+    QCOMPARE(result.exitCode, 0);
+    QCOMPARE(result.out, QByteArray("file\n"));
+    QCOMPARE(
+        runTool({QStringLiteral("help"), ls}).out,
+        runTool({QStringLiteral("list"), QStringLiteral("--help")}).out);
+    QCOMPARE(
+        runTool(
+            {QStringLiteral("complete"), QStringLiteral("--"), ls, QStringLiteral("fi")},
+            m_directory->path())
+            .out,
+        QByteArray("file\0", 5));
 }
 
 void ToolListTest::plainLocale()

@@ -9,6 +9,8 @@
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 
+#include <algorithm>
+
 namespace VeyFM {
 namespace Tool {
 
@@ -111,8 +113,14 @@ QVector<Option> allOptions(const Verb& verb)
     }
     options.append(
         {{QStringLiteral("verbose")}, QStringLiteral("Show what the library logs, too")});
-    options.append(
-        {{QStringLiteral("h"), QStringLiteral("help")}, QStringLiteral("Show this help")});
+    QStringList help = {QStringLiteral("h"), QStringLiteral("help")};
+    const bool isTaken = std::any_of(options.begin(), options.end(), [&help](const Option& option) {
+        return option.names.contains(help.constFirst());
+    });
+    if (isTaken) {
+        help.removeFirst();
+    }
+    options.append({help, QStringLiteral("Show this help")});
     options.append({{QStringLiteral("version")}, QStringLiteral("Show the version")});
     return options;
 }
@@ -273,13 +281,15 @@ int runCommandLine(const QStringList& words)
             QString(), QStringLiteral("%1: %2").arg(
                            word, word.startsWith(QLatin1Char('-'))
                                      ? QStringLiteral("an option needs a command before it")
-                                     : QStringLiteral("no such command")));
+                                     : whyNoVerb(word)));
     }
     int used = 1;
     if (!verb->verbs.isEmpty() && words.size() > 1 && !words.at(1).startsWith(QLatin1Char('-'))) {
         const Verb* inner = findVerb(words.at(1), verb->verbs);
         if (!inner) {
-            return wrongUsage(verb->name, words.at(1) + QStringLiteral(": no such command"));
+            return wrongUsage(
+                verb->name,
+                QStringLiteral("%1: %2").arg(words.at(1), whyNoVerb(words.at(1), verb->verbs)));
         }
         verb = inner;
         ++used;

@@ -29,7 +29,7 @@ int run(Invocation& invocation)
         if (verb) {
             invocation.output().write(verbHelp(*verb));
         } else {
-            report(name, QStringLiteral("no such command"));
+            report(name, whyNoVerb(name));
             exitCode = Failed;
         }
     }

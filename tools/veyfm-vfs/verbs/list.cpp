@@ -14,6 +14,7 @@
 #include <QDateTime>
 
 #include <algorithm>
+#include <cmath>
 
 #include <signal.h>
 
@@ -21,6 +22,12 @@ namespace VeyFM {
 namespace Tool {
 
 namespace {
+
+bool wantsFacts(const Invocation& invocation)
+{
+    return invocation.isSet(QStringLiteral("long")) ||
+           invocation.isSet(QStringLiteral("human-readable"));
+}
 
 /// What stands for an entry: its name, or with --paths its path.
 class Label
@@ -62,20 +69,48 @@ void printLines(Invocation& invocation, const QVector<Item>& items)
     }
 }
 
+/// As ls -h has them: rounded up, to a tenth where one digit stands before it.
+QString sizeForPeople(qint64 size)
+{
+    constexpr qint64 step = 1024;
+    if (size < step) {
+        return QString::number(size);
+    }
+    const QString units = QStringLiteral("KMGTPE");
+    int unit = 0;
+    qint64 one = step;
+    const auto rounded = [size, &one](qint64 parts) {
+        // In parts of the unit; the product may be too great for an integer.
+        return qint64(std::ceil((long double)(size)*parts / one));
+    };
+    while (unit + 1 < units.size() && rounded(1) >= step) {
+        one *= step;
+        ++unit;
+    }
+    const qint64 tenths = rounded(10);
+    const QString number = tenths < 100 ? QStringLiteral("%1.%2").arg(tenths / 10).arg(tenths % 10)
+                                        : QString::number(rounded(1));
+    return number + units.at(unit);
+}
+
 void printLong(Invocation& invocation, const QVector<Item>& items)
 {
     Output& output = invocation.output();
     const Label label(invocation);
+    const bool isForPeople = invocation.isSet(QStringLiteral("human-readable"));
+    const auto sizeText = [isForPeople](qint64 size) {
+        return isForPeople ? sizeForPeople(size) : QString::number(size);
+    };
     int typeWidth = 0;
     int sizeWidth = 1;
     for (const Item& item : items) {
         typeWidth = std::max(typeWidth, int(typeName(item.entry.type()).size()));
-        sizeWidth = std::max(sizeWidth, int(QString::number(item.size).size()));
+        sizeWidth = std::max(sizeWidth, int(sizeText(item.size).size()));
     }
     const QString none = QStringLiteral("-");
     const QString timeFormat = QStringLiteral("yyyy-MM-dd HH:mm");
     for (const Item& item : items) {
-        const QString size = item.onDisk ? QString::number(item.size) : none;
+        const QString size = item.onDisk ? sizeText(item.size) : none;
         const QString time =
             item.onDisk
                 ? QDateTime::fromMSecsSinceEpoch(item.modified / 1000000).toString(timeFormat)
@@ -94,7 +129,7 @@ void printLong(Invocation& invocation, const QVector<Item>& items)
 
 void printJson(Invocation& invocation, JsonArray& json, const QVector<Item>& items)
 {
-    const bool isLong = invocation.isSet(QStringLiteral("long"));
+    const bool isLong = wantsFacts(invocation);
     for (const Item& item : items) {
         QJsonObject object = toJson(item.entry);
         if (isLong) {
@@ -114,7 +149,7 @@ void print(Invocation& invocation, JsonArray& json, const QVector<Item>& items)
 {
     if (invocation.json()) {
         printJson(invocation, json, items);
-    } else if (invocation.isSet(QStringLiteral("long"))) {
+    } else if (wantsFacts(invocation)) {
         printLong(invocation, items);
     } else if (invocation.output().isTerminal() && !invocation.null()) {
         printColumns(invocation, items);
@@ -127,7 +162,7 @@ ListingOptions listingOptions(const Invocation& invocation)
 {
     ListingOptions options;
     options.hidden = invocation.isSet(QStringLiteral("all"));
-    options.facts = invocation.isSet(QStringLiteral("long"));
+    options.facts = wantsFacts(invocation);
     options.reverse = invocation.isSet(QStringLiteral("reverse"));
     if (invocation.isSet(QStringLiteral("no-links"))) {
         options.filters = VFS::SkipSymLinks;
@@ -218,10 +253,13 @@ Verb listVerb()
     verb.summary = QStringLiteral("List the children of places and directories");
     verb.details = QStringLiteral(
         "Without an operand it lists the working directory. Places come first, in the order of\n"
-        "the tree. Ctrl-C ends a long listing.");
+        "the tree. Ctrl-C ends a long listing. Another name of the command is ls.");
+    verb.otherName = QStringLiteral("ls");
     verb.options = {
         {{QStringLiteral("l"), QStringLiteral("long")},
          QStringLiteral("Show type, size, time and the target of links, too")},
+        {{QStringLiteral("h"), QStringLiteral("human-readable")},
+         QStringLiteral("As --long, with sizes such as 1.5K and 12M")},
         allOption(),
         {{QStringLiteral("p"), QStringLiteral("paths")},
          QStringLiteral("Show whole paths, not names")},

@@ -12,6 +12,9 @@ namespace Tool {
 /// All verbs, in the order of the help.
 const QVector<Verb>& verbs();
 
+/// That there is no verb of this name, and which one may have been meant.
+QString whyNoVerb(const QString& word, const QVector<Verb>& verbs = verbs());
+
 /// The verb among @p verbs that the word names, or null.
 const Verb* findVerb(const QString& word, const QVector<Verb>& verbs = verbs());
 
