@@ -121,7 +121,7 @@ ShellLine::ShellLine(const QString& line, const QString& breaks)
     }
     const Word& last = m_words.constLast();
     const bool isActiveBefore = m_lastActive >= last.start && m_lastActive < replacedFrom().inLine;
-    if (m_words.size() < 2 || !last.isKnown || last.isTarget || isActiveBefore) {
+    if (words().isEmpty() || !last.isKnown || last.isTarget || isActiveBefore) {
         m_isReadable = false;
     }
 }
