@@ -83,6 +83,11 @@ void MountJobLifetimeTest::jobIsDeletedDuringAQuestion_data()
                                  << Plays{ftpRefuses} << 0;
     QTest::newRow("sftp prompt") << QByteArray("sshfs") << u"sftp://bob@host"_s << Plays{sftpWaits}
                                  << 0;
+    QTest::newRow("sftp, other words") << QByteArray("sshfs") << u"sftp://bob@host"_s
+                                       << Plays{{"out \r(bob@host) Code: ", "hang"}} << 0;
+    QTest::newRow("sftp jump host")
+        << QByteArray("sshfs") << u"sftp://bob@host"_s
+        << Plays{{"echo off", "out \rbob@gw.test's password: ", "hang"}} << 0;
     QTest::newRow("sftp host key")
         << QByteArray("sshfs") << u"sftp://bob@host"_s << Plays{keyWaits} << 0;
     QTest::newRow("sftp refusal") << QByteArray("sshfs") << u"sftp://bob@host"_s << Plays{resets}

@@ -42,6 +42,8 @@ private Q_SLOTS:
     void conversation();
     void changedUserOfAJumpHost_data();
     void changedUserOfAJumpHost();
+    void changedUserOfTheHostByAnotherName_data();
+    void changedUserOfTheHostByAnotherName();
     void givenUp_data();
     void givenUp();
     void uncertainHost_data();
@@ -193,6 +195,30 @@ void MountSFtpURLJobPromptsTest::changedUserOfAJumpHost()
     QCOMPARE(tool->input(1), input);
     QVERIFY(!isMountDir(u"/sftp/bob@host"_s));
     QCOMPARE(recordedMounts(), QStringList());
+}
+
+void MountSFtpURLJobPromptsTest::changedUserOfTheHostByAnotherName_data()
+{
+    QTest::addColumn<QString>("url");
+    QTest::newRow("user of the URL") << u"sftp://bob@work/"_s;
+    QTest::newRow("nobody in the URL") << u"sftp://work/"_s;
+}
+
+// The configuration of ssh has "HostName" for it.
+void MountSFtpURLJobPromptsTest::changedUserOfTheHostByAnotherName()
+{
+    QFETCH(QString, url);
+    tool->expect(asks("\rbob@host.test's password: ") + QByteArrayList({"exit 1"}));
+    tool->expect(asks("\rann@host.test's password: "));
+    auth->answers = {Auth::changeUser(u"ann"_s), Auth::password(u"x"_s)};
+    const auto job = makeJob<MountSFtpURLJob>(url);
+    startToEnd(job.get());
+    QCOMPARE(job->error(), 0);
+    QCOMPARE(job->url(), u"sftp://ann@work/"_s);
+    QCOMPARE(
+        auth->calls,
+        QStringList(
+            {asked(u"host.test"_s, u"bob"_s), asked(u"host.test"_s, u"ann"_s), u"accepted"_s}));
 }
 
 void MountSFtpURLJobPromptsTest::givenUp_data()

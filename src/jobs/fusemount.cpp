@@ -123,7 +123,9 @@ FuseMount::Answer FuseMount::requestPassword(
     if (cancelled) {
         return Cancelled;
     }
-    if (userChanged && m_other) {
+    // The configuration of ssh may have another name for the URL's host, but not another user than
+    // the URL: that one is somebody's on the way.
+    if (userChanged && m_other && !user().isEmpty() && m_other->user != user()) {
         return OtherUserChanged;
     }
     if (userChanged) {

@@ -55,7 +55,7 @@ public:
     enum Answer {
         Answered,
         UserChanged,      ///< In the URL.
-        OtherUserChanged, ///< That of another host, whom nobody can tell the tool.
+        OtherUserChanged, ///< That of a host on the way, whom nobody can tell the tool.
         Cancelled,
         JobDeleted,
     };

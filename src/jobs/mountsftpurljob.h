@@ -29,7 +29,7 @@ class MountSFtpURLJobPrivate;
  * begins with "/~" means the user's home directory on the host, and is a mount of its own.
  *
  * Ends with code 5 for another scheme, for a host or user that no tool may be given, when the tool
- * fails, when it can't be told which host a prompt is from, and when the user of another host is
+ * fails, when it can't be told which host a prompt is from, and when the user of a jump host is
  * changed, which nobody can tell the tool; with code 2 when the user gives up after a refusal. A
  * user who gives up at a password prompt, or refuses the key of a host, leaves the job unfinished:
  * start() returns and finished() never comes. So does a login that is refused in the run in which
