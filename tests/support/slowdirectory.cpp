@@ -96,6 +96,7 @@ int SlowDirectory::progress() const
 
 void SlowDirectory::release()
 {
+    m_released = true;
     const quint64 id = m_waiting.exchange(0);
     if (id != 0) {
         answer(id, EIO, nullptr, 0);
@@ -183,7 +184,9 @@ void SlowDirectory::serve()
             break;
         }
         case FUSE_READDIR:
-            if (m_kind == Stalled) {
+            if (m_kind == Stalled && m_released) {
+                answer(header->unique, EIO, nullptr, 0);
+            } else if (m_kind == Stalled) {
                 m_waiting = header->unique;
                 ++m_progress;
             } else {

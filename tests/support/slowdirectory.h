@@ -31,7 +31,7 @@ public:
     /// How many names readers have got, and for a stalled directory how many wait for one.
     int progress() const;
 
-    /// Lets the readers of a stalled directory go, with an error.
+    /// Lets the readers of a stalled directory go, with an error. Later ones don't wait.
     void release();
 
 private:
@@ -50,6 +50,7 @@ private:
     bool m_mounted = false;
     std::atomic<int> m_progress{0};
     std::atomic<quint64> m_waiting{0};
+    std::atomic<bool> m_released{false};
     std::thread m_thread;
 };
 

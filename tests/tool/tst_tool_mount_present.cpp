@@ -132,7 +132,7 @@ void ToolMountPresentTest::pathIsMissing()
     const SlowDirectory mounted(SlowDirectory::Endless, directory);
     const ToolResult result = scene.run("mount --json sftp://me@host/b/c");
     QCOMPARE(result.exitCode, 1);
-    QCOMPARE(result.out, QByteArray());
+    QCOMPARE(result.out, QByteArray("[]\n"));
     QCOMPARE(
         result.err,
         failure(
