@@ -8,6 +8,9 @@
 #include <QSignalSpy>
 #include <QTest>
 
+#include <algorithm>
+#include <random>
+
 using namespace VeyFM;
 
 namespace {
@@ -25,6 +28,24 @@ struct ReservedText
     }
 };
 template struct ReservedText<&StoragePlace::m_reservedText>;
+
+// The same for what else the service alone sets.
+QString& udi(StoragePlace& place);
+QString& placeName(StoragePlace& place);
+
+template <auto Udi, auto PlaceName>
+struct Names
+{
+    friend QString& udi(StoragePlace& place)
+    {
+        return place.*Udi;
+    }
+    friend QString& placeName(StoragePlace& place)
+    {
+        return place.*PlaceName;
+    }
+};
+template struct Names<&StoragePlace::m_udi, &StoragePlace::m_placeName>;
 
 QStringList udis(const QList<StoragePlace>& places)
 {
@@ -59,6 +80,7 @@ private Q_SLOTS:
     void updateOfAnUnknownDevice();
     void updatePatchesTheFirstMatch();
     void reservedTextGoesAlong();
+    void findsTheFirst();
     void deviceInfoIsAskedEachTime();
     void jobsAreNotStarted();
     void cleanupTestCase();
@@ -243,6 +265,70 @@ void StorageProxyTest::reservedTextGoesAlong()
     QCOMPARE(reservedText(old), u"first"_s);
     cached = proxy.availableStoragePlaces().first();
     QCOMPARE(reservedText(cached), u"second"_s);
+}
+
+// Whatever comes, goes and changes: the look-ups find the first record of the list.
+void StorageProxyTest::findsTheFirst()
+{
+    std::mt19937 random(1);
+    const auto below = [&random](int count) {
+        return int(random() % uint(count));
+    };
+    const auto first = [](const QList<StoragePlace>& places, auto fits) {
+        const auto found = std::find_if(places.begin(), places.end(), fits);
+        return found == places.end() ? StoragePlace() : *found;
+    };
+    const auto text = [](StoragePlace place) {
+        return udi(place) + u' ' + placeName(place) + u' ' + reservedText(place);
+    };
+    m_service->setValue(list, QJsonArray());
+    StoragePlacesManagerProxy proxy(m_interface);
+    QList<StoragePlace> expected = proxy.availableStoragePlaces();
+    QVERIFY(expected.isEmpty());
+    int most = 0;
+    for (int i = 0; i < 2000; ++i) {
+        StoragePlace place;
+        udi(place) = QString::number(below(8));
+        placeName(place) = u"n%1"_s.arg(below(8));
+        reservedText(place) = QString::number(i);
+        const int found = expected.indexOf(place);
+        const char* slot = "slotStoragePlaceAdded";
+        switch (below(5)) {
+        case 0:
+            slot = "slotStoragePlaceRemoved";
+            expected.removeAll(place);
+            break;
+        case 1:
+        case 2:
+            slot = "slotStoragePlaceUpdated";
+            if (found >= 0) {
+                expected[found] = place;
+            }
+            break;
+        default:
+            expected.append(place);
+        }
+        QVERIFY(QMetaObject::invokeMethod(&proxy, slot, Q_ARG(VeyFM::StoragePlace, place)));
+        most = std::max(most, int(expected.size()));
+
+        const QString sought = placeName(place);
+        QCOMPARE(
+            text(proxy.storagePlaceByPlaceName(sought)),
+            text(first(
+                expected, [&sought](StoragePlace other) { return placeName(other) == sought; })));
+        QCOMPARE(
+            text(proxy.storagePlaceByUdi(place.udi())),
+            text(first(expected, [&place](const StoragePlace& other) { return other == place; })));
+        if (i % 20 == 0) {
+            const QList<StoragePlace> listed = proxy.availableStoragePlaces();
+            QCOMPARE(listed.size(), expected.size());
+            for (int j = 0; j < listed.size(); ++j) {
+                QCOMPARE(text(listed.at(j)), text(expected.at(j)));
+            }
+        }
+    }
+    QVERIFY(most > 10);
+    QVERIFY(!proxy.storagePlaceByUdi(u"none"_s).isValid());
 }
 
 void StorageProxyTest::deviceInfoIsAskedEachTime()

@@ -89,6 +89,7 @@ public:
     const QDBusArgument& fromDBusArgument(const QDBusArgument& argument);
 
 private:
+    friend class DeviceTable;
     friend class VFS;
     friend class VFSPrivate;
 

@@ -4,6 +4,7 @@
 #include "service/storageplacesmanagerproxy.h"
 
 #include "jobs/storageplacejob.h"
+#include "service/devicetable.h"
 #include "service/servicecall.h"
 #include "service/servicelist.h"
 #include "service/servicesignals.h"
@@ -19,8 +20,14 @@ public:
     {
     }
 
+    QList<StoragePlace> read() const
+    {
+        return readFromService<QList<StoragePlace>>(
+            interface, QStringLiteral("availableStoragePlaces"));
+    }
+
     const QWeakPointer<QDBusInterface> interface;
-    ServiceList<StoragePlace> storagePlaces;
+    ServiceList<StoragePlace, DeviceTable> storagePlaces;
 };
 
 StoragePlacesManagerProxy::StoragePlacesManagerProxy(
@@ -45,10 +52,21 @@ StoragePlacesManagerProxy::~StoragePlacesManagerProxy() = default;
 
 QList<StoragePlace> StoragePlacesManagerProxy::availableStoragePlaces()
 {
-    return d->storagePlaces.get([this] {
-        return readFromService<QList<StoragePlace>>(
-            d->interface, QStringLiteral("availableStoragePlaces"));
-    });
+    return d->storagePlaces.get([this] { return d->read(); });
+}
+
+StoragePlace StoragePlacesManagerProxy::storagePlaceByUdi(const QString& udi)
+{
+    return d->storagePlaces.find(
+        [this] { return d->read(); },
+        [&udi](const DeviceTable& places) { return places.withUdi(udi); });
+}
+
+StoragePlace StoragePlacesManagerProxy::storagePlaceByPlaceName(const QString& placeName)
+{
+    return d->storagePlaces.find(
+        [this] { return d->read(); },
+        [&placeName](const DeviceTable& places) { return places.withPlaceName(placeName); });
 }
 
 void StoragePlacesManagerProxy::slotRead()
@@ -82,25 +100,20 @@ void StoragePlacesManagerProxy::slotStoragePlaceUpdated(const StoragePlace& plac
     // The old state is known only here: a device that is not in the list gets a default record,
     // and receivers compare with that.
     StoragePlace previous;
-    d->storagePlaces.patch([&place, &previous](auto& places) {
-        const int index = places.indexOf(place);
-        if (index >= 0) {
-            previous = places.at(index);
-            places[index] = place;
-        }
-    });
+    d->storagePlaces.patch(
+        [&place, &previous](DeviceTable& places) { previous = places.replace(place); });
     Q_EMIT storagePlaceUpdated(place, previous);
 }
 
 void StoragePlacesManagerProxy::slotStoragePlaceAdded(const StoragePlace& place)
 {
-    d->storagePlaces.patch([&place](auto& places) { places.append(place); });
+    d->storagePlaces.patch([&place](DeviceTable& places) { places.append(place); });
     Q_EMIT storagePlaceAdded(place);
 }
 
 void StoragePlacesManagerProxy::slotStoragePlaceRemoved(const StoragePlace& place)
 {
-    d->storagePlaces.patch([&place](auto& places) { places.removeAll(place); });
+    d->storagePlaces.patch([&place](DeviceTable& places) { places.removeAll(place.udi()); });
     Q_EMIT storagePlaceRemoved(place);
 }
 

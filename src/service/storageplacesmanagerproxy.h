@@ -28,9 +28,10 @@ class StoragePlacesManagerProxyPrivate;
  * patch it, and nothing else does. A first read that failed stays as an empty list, to which
  * only signals add.
  *
- * Any thread may call availableStoragePlaces(). From a thread other than that of the object it
- * takes what is there: a list that was not read yet is empty, and is read by the event loop of the
- * object later. Everything else is for the thread of the object. Calls that ask the service block
+ * Any thread may call availableStoragePlaces(), storagePlaceByUdi() and
+ * storagePlaceByPlaceName(). From a thread other than that of the object they take what is there:
+ * a list that was not read yet is empty, and is read by the event loop of the object later.
+ * Everything else is for the thread of the object. Calls that ask the service block
  * for one exchange with it.
  */
 class VEYFMVFS_EXPORT StoragePlacesManagerProxy : public QObject
@@ -45,6 +46,14 @@ public:
 
     /// All devices, in the service's order.
     QList<StoragePlace> availableStoragePlaces();
+
+    /**
+     * The first device with this identifier, or with this name below VFS::storageDevicesEntry(),
+     * or a default record. The list is read as by availableStoragePlaces(), and not walked. @{
+     */
+    StoragePlace storagePlaceByUdi(const QString& udi);
+    StoragePlace storagePlaceByPlaceName(const QString& placeName);
+    /// @}
 
     /// Asks for the details of a device, at each call; a default record where there are none.
     StorageDeviceInfo storageDeviceInfo(const StoragePlace& place) const;

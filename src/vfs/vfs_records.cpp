@@ -31,22 +31,17 @@ StoragePlace VFS::storagePlace(const Entry& given) const
         return StoragePlace();
     }
     // The path of a record without asking VFS::ptr() for the place above it, since this may run
-    // while that is being constructed. And one text for all records.
+    // while that is being constructed.
     const QString parent = d->storageDevicesEntry.m_path + QLatin1Char('/');
     if (!entry.m_path.startsWith(parent)) {
         return StoragePlace();
     }
-    const QStringRef name = entry.m_path.midRef(parent.size());
-    return firstOf(
-        d->storagePlacesManager->availableStoragePlaces(),
-        [&name](const StoragePlace& place) { return place.m_placeName == name; });
+    return d->storagePlacesManager->storagePlaceByPlaceName(entry.m_path.mid(parent.size()));
 }
 
 StoragePlace VFS::freshStoragePlace(const StoragePlace& place) const
 {
-    return firstOf(
-        d_func()->storagePlacesManager->availableStoragePlaces(),
-        [&place](const StoragePlace& current) { return current == place; });
+    return d_func()->storagePlacesManager->storagePlaceByUdi(place.udi());
 }
 
 QList<StoragePlace> VFS::storagePlacesByType(StoragePlace::Type type) const
