@@ -31,6 +31,27 @@ void runRow(
     service.check();
 }
 
+// What one device costs among many, beside what it costs among a tenth of them.
+void runGrowthRow(
+    benchmark::State& state, const LiveService& service, const std::string& job, int count)
+{
+    service.use();
+    const auto costOf = [&service, job](int devices) {
+        return [&service, job, devices] {
+            service.control().setValue(
+                u"StoragePlacesManager.availableStoragePlaces"_s, manyDevices(devices));
+            service.control().setRules(
+                u"SmbBrowser.smbNetworkLocalPath"_s,
+                {QJsonObject{{u"signals"_s, manyRemovals(devices)}, {u"keep"_s, true}}});
+            return figureOf(VEYFM_SERVICE_VFS, job, devices) / devices;
+        };
+    };
+    Contest contest(costOf(count));
+    contest.floor("a tenth of them", 2, costOf(count / 10));
+    contest.run(state);
+    service.check();
+}
+
 void setBurst(const LiveService& service, int count, int devices)
 {
     service.control().setValue(
@@ -60,7 +81,13 @@ void registerRows(const Options& options)
     addRow("memory, a storage device", options.rounds(5), [=](benchmark::State& state) {
         runRow(state, *service, "device-bytes", count, "the list", 2.75, 850);
     });
-    // Each update looks for its device in the list, which shows where there are many of them.
+    addRow(
+        "isDirPlace(), " + std::to_string(count) + " devices", options.rounds(9),
+        [=](benchmark::State& state) { runGrowthRow(state, *service, "device-dirs", count); });
+    addRow(
+        "storagePlaceRemoved, " + std::to_string(count) + " devices", options.rounds(9),
+        [=](benchmark::State& state) { runGrowthRow(state, *service, "removals", count); });
+    // Each update looks for its device, wherever there are many of them.
     const std::pair<int, double> bursts[] = {{10, 1.5}, {count, 5}};
     for (const auto& [devices, bound] : bursts) {
         const std::string name = "storagePlaceUpdated, " + std::to_string(devices) + " devices";

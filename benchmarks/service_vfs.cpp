@@ -8,6 +8,8 @@
 //   bench_service_vfs mark FAVOURITES    the same, and a call of GetId when the tree stands
 //   bench_service_vfs shares COUNT       opening a host
 //   bench_service_vfs burst COUNT        the news of a service that changes devices
+//   bench_service_vfs removals COUNT     the news of a service that takes devices out
+//   bench_service_vfs device-dirs COUNT  asking each device whether it is mounted
 //   bench_service_vfs share-bytes COUNT  memory of the shares of a host
 //   bench_service_vfs device-bytes COUNT memory of the storage devices
 
@@ -79,6 +81,34 @@ int burst(int count)
     return figure(first.localPath().startsWith(u'/'), cost);
 }
 
+int removals(int count)
+{
+    VFS* const vfs = VFS::ptr();
+    vfs->childs(vfs->storageDevicesEntry());
+    int gone = 0;
+    QObject::connect(vfs->entryWatcher(), &EntryWatcher::entryDeleted, vfs, [&] { ++gone; });
+    const double before = Benchmarks::processCpu();
+    vfs->smbBrowser()->smbNetworkLocalPath();
+    while (gone < count) {
+        QCoreApplication::processEvents(QEventLoop::WaitForMoreEvents);
+    }
+    const double cost = Benchmarks::processCpu() - before;
+    return figure(vfs->childs(vfs->storageDevicesEntry()).isEmpty(), cost);
+}
+
+int deviceDirs(int count)
+{
+    VFS* const vfs = VFS::ptr();
+    const EntryList devices = vfs->childs(vfs->storageDevicesEntry());
+    const double before = Benchmarks::processCpu();
+    int mounted = 0;
+    for (const Entry& device : devices) {
+        mounted += device.isDirPlace() ? 1 : 0;
+    }
+    const double cost = Benchmarks::processCpu() - before;
+    return figure(devices.size() == count && mounted == 0, cost);
+}
+
 int bytesOf(const Entry& parent, int count)
 {
     QCoreApplication::processEvents();
@@ -110,6 +140,12 @@ int main(int argc, char** argv)
     }
     if (job == "burst") {
         return burst(count);
+    }
+    if (job == "removals") {
+        return removals(count);
+    }
+    if (job == "device-dirs") {
+        return deviceDirs(count);
     }
     if (job == "share-bytes") {
         return bytesOf(openedHost(), count);

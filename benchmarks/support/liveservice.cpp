@@ -87,6 +87,17 @@ QJsonArray manyUpdates(int count, int devices)
     return updates;
 }
 
+QJsonArray manyRemovals(int count)
+{
+    QJsonArray removals;
+    for (int i = 0; i < count; ++i) {
+        removals.append(QJsonArray{
+            u"StoragePlacesManager"_s, u"storagePlaceRemoved"_s,
+            arguments(device(u"sd%1"_s.arg(i), u"udi%1"_s.arg(i)))});
+    }
+    return removals;
+}
+
 QJsonObject manyShares(int count)
 {
     QJsonObject shares;

@@ -38,9 +38,11 @@ private:
     std::unique_ptr<FakeServiceControl> m_control;
 };
 
-/// Devices that are there, and the signals by which a number of them is mounted in turn. @{
+/// Devices that are there, and the signals by which a number of them is mounted in turn, or by
+/// which they go. @{
 QJsonArray manyDevices(int count);
 QJsonArray manyUpdates(int count, int devices);
+QJsonArray manyRemovals(int count);
 /// @}
 
 /// Shares by their names, none of which is mounted.
