@@ -4,6 +4,7 @@
 #include "support/entryscene.h"
 #include "support/makeentry.h"
 
+#include <QFile>
 #include <QMetaMethod>
 #include <QSignalSpy>
 #include <QTest>
@@ -68,6 +69,8 @@ private Q_SLOTS:
     void virtualPlacesShareTheEmptyKey();
     void clear();
     void slotsMayChangeTheSet();
+    void slotsMayRunAnEventLoop();
+    void watchedAgainAfterOverflow();
     void signalOrder();
 
 private:
@@ -472,6 +475,54 @@ void TestEntryWatcher::slotsMayChangeTheSet()
     QCOMPARE(scene.processedLog(), lines("created Fav/x", "created Fav2/x", "created ~/dir/x"));
     QVERIFY(scene.tree.makeDir("dir/y"));
     QCOMPARE(scene.processedLog(), lines("created ~/dir/y"));
+}
+
+// What is left of an older batch is told before a newer one that the event loop reads.
+void TestEntryWatcher::slotsMayRunAnEventLoop()
+{
+    EntryScene& scene = *m_scene;
+    QVERIFY(scene.tree.makeDir("dir/x"));
+    scene.watcher.addEntry(scene.plain("dir"));
+    QMetaObject::Connection once;
+    once = connect(&scene.watcher, &EntryWatcher::entryCreated, this, [&] {
+        disconnect(once);
+        scene.tree.makeDir("dir/x");
+        QTRY_COMPARE(scene.log.size(), 3);
+    });
+    QVERIFY(scene.tree.makeDir("dir/a"));
+    QVERIFY(scene.tree.remove("dir/x"));
+    QTRY_VERIFY(!scene.log.isEmpty());
+    QCOMPARE(
+        scene.log,
+        (QStringList{text("created ~/dir/a"), text("deleted ~/dir/x"), text("created ~/dir/x")}));
+}
+
+// The end of the watch was among the events that the kernel had no room for.
+void TestEntryWatcher::watchedAgainAfterOverflow()
+{
+    EntryScene& scene = *m_scene;
+    QFile limit(text("/proc/sys/fs/inotify/max_queued_events"));
+    QVERIFY(limit.open(QIODevice::ReadOnly));
+    const int events = limit.readAll().trimmed().toInt() + 10;
+    QVERIFY(scene.tree.makeDir("noise") && scene.tree.makeDir("noise/a"));
+    QVERIFY(scene.tree.makeDir("noise/b"));
+    const Entry place = scene.place("Fav", "dir");
+    scene.watcher.addEntry(scene.plain("noise"));
+    scene.watcher.addEntry(place);
+    const QByteArray noisy[] = {scene.tree.bytes("noise/a"), scene.tree.bytes("noise/b")};
+    for (int i = 0; i < events; ++i) { // equal events in a row would be merged
+        QCOMPARE(::chmod(noisy[i % 2].constData(), 0700), 0);
+    }
+    QVERIFY(scene.tree.remove("dir"));
+    scene.processedLog();
+    QVERIFY(!scene.isRegistered("dir"));
+    QVERIFY(scene.isRegistered("noise"));
+
+    QVERIFY(scene.tree.makeDir("dir"));
+    scene.watcher.removeEntry(place);
+    scene.watcher.addEntry(place);
+    QVERIFY(scene.tree.makeDir("dir/x"));
+    QCOMPARE(scene.processedLog(), lines("created Fav/x", "created ~/dir/x"));
 }
 
 void TestEntryWatcher::signalOrder()

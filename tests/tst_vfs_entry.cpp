@@ -41,6 +41,7 @@ private Q_SLOTS:
     void placeBeatsFile();
     void placesInPaths();
     void belowPlaces();
+    void directoryCalledLikeAPlace();
     void samba();
     void upFromTopLevel();
     void kinds_data();
@@ -192,6 +193,28 @@ void TestVfsEntry::belowPlaces()
         QVERIFY2(VFS::ptr()->entry(text(path)).isNull(), path);
     }
     QCOMPARE(answerFor("Home/Computer").path, text("Home/Computer"));
+}
+
+// Of two neighbouring places the first is dropped, so what lies below such a directory can't be
+// named through the place above it.
+void TestVfsEntry::directoryCalledLikeAPlace()
+{
+    const VFS* vfs = VFS::ptr();
+    QVERIFY(m_scene.makeDir("home/Trash"));
+    QVERIFY(m_scene.makeFile("home/Trash/x"));
+    QCOMPARE(vfs->entry(text("Home/Trash/x")).path(), text("Trash/x"));
+    QCOMPARE(vfs->localPath(text("Home/Trash/x")), vfs->trashEntry().localPath() + text("/x"));
+    QCOMPARE(vfs->entry(text("Home/Home/y")).path(), text("Home/y"));
+    QCOMPARE(vfs->entry(text("Home/File System/etc")).path(), text("/etc"));
+    QVERIFY(vfs->entry(text("Home/Computer/z")).isNull());
+
+    // The directory alone is found, and its listing knows where its entries are.
+    const Entry directory = vfs->entry(text("Home/Trash"));
+    QCOMPARE(directory.localPath(), m_scene.path("home/Trash"));
+    const EntryList children = vfs->childs(directory);
+    QCOMPARE(children.paths(), QStringList{text("Home/Trash/x")});
+    QCOMPARE(children.first().localPath(), m_scene.path("home/Trash/x"));
+    QVERIFY(QDir(directory.localPath()).removeRecursively());
 }
 
 void TestVfsEntry::samba()
