@@ -4,6 +4,7 @@
 #include "real/sandbox.h"
 
 #include "real/sandboxsystem.h"
+#include "support/reachable.h"
 
 #include <QFile>
 #include <QStringList>
@@ -180,8 +181,8 @@ int Sandbox::runFirstProcess(const std::function<int()>& tests)
     const bool prepared = reason.isEmpty();
     if (prepared) {
         // What stays closed shows in missingAccess().
-        SandboxSystem::makeReachable(QFile::encodeName(programPath()));
-        SandboxSystem::makeReachable(VEYFM_SOURCE_DIR "/");
+        makeReachable(QFile::encodeName(programPath()));
+        makeReachable(VEYFM_SOURCE_DIR "/");
         if (!startServers()) {
             std::fputs(SandboxSystem::logs().constData(), stderr);
             ::_exit(1);

@@ -11,7 +11,6 @@
 #include <cerrno>
 #include <crypt.h>
 #include <cstring>
-#include <dirent.h>
 #include <fcntl.h>
 #include <net/if.h>
 #include <sched.h>
@@ -121,41 +120,6 @@ bool makeAccounts()
            SandboxSystem::replaceFile("/etc/shadow", passwords, 0600);
 }
 
-// The entries of a closed folder in a new, open one in its place.
-bool openDirectory(const QByteArray& path)
-{
-    DIR* const closed = ::opendir(path.constData());
-    if (!closed || !mountMemory(path.constData())) {
-        return false;
-    }
-    const int fd = ::dirfd(closed);
-    bool done = true;
-    while (const dirent* const found = ::readdir(closed)) {
-        const QByteArray name = found->d_name;
-        if (name == "." || name == "..") {
-            continue;
-        }
-        const QByteArray source = "/proc/self/fd/" + QByteArray::number(fd) + '/' + name;
-        const QByteArray target = path + '/' + name;
-        struct stat info = {};
-        if (::fstatat(fd, found->d_name, &info, AT_SYMLINK_NOFOLLOW) != 0) {
-            continue;
-        }
-        if (S_ISLNK(info.st_mode)) {
-            done =
-                QFile::link(
-                    QFile::symLinkTarget(QFile::decodeName(source)), QFile::decodeName(target)) &&
-                done;
-        } else if (S_ISDIR(info.st_mode)) {
-            done = makeDirectory(target) && bind(source, target) && done;
-        } else {
-            done = SandboxSystem::writeFile(target, {}) && bind(source, target) && done;
-        }
-    }
-    ::closedir(closed);
-    return done;
-}
-
 } // namespace
 
 QString SandboxSystem::prepare()
@@ -186,19 +150,6 @@ QString SandboxSystem::prepare()
         return failure("/dev/fuse");
     }
     return QString();
-}
-
-bool SandboxSystem::makeReachable(const QByteArray& path)
-{
-    for (int slash = path.indexOf('/', 1); slash > 0; slash = path.indexOf('/', slash + 1)) {
-        const QByteArray folder = path.left(slash);
-        struct stat info = {};
-        if (::stat(folder.constData(), &info) != 0 ||
-            ((info.st_mode & S_IXOTH) == 0 && !openDirectory(folder))) {
-            return false;
-        }
-    }
-    return true;
 }
 
 bool SandboxSystem::writeFile(const QByteArray& path, const QByteArray& content, unsigned mode)

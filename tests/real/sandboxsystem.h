@@ -16,9 +16,6 @@ constexpr const char* logDirectory = "/run/sandbox/log";
 /// Takes the namespaces but for that of processes, and fills them. What is missing, or nothing.
 QString prepare();
 
-/// Lets every user in to a folder below closed ones, such as the home of root.
-bool makeReachable(const QByteArray& path);
-
 /// Puts a file in the place of an existing one.
 bool replaceFile(const QByteArray& path, const QByteArray& content, unsigned mode = 0644);
 

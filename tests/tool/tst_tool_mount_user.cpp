@@ -3,7 +3,10 @@
 
 #include "support/mountscene.h"
 #include "support/outsidegroup.h"
+#include "support/reachable.h"
 
+#include <cerrno>
+#include <cstring>
 #include <grp.h>
 
 /// "mount" as one who is not root.
@@ -24,6 +27,8 @@ void ToolMountUserTest::initTestCase()
     if (!problem.isEmpty()) {
         QSKIP(qPrintable(problem));
     }
+    QVERIFY2(makeReachable(QFile::encodeName(toolPath())), std::strerror(errno));
+    QVERIFY2(makeReachable(QFile::encodeName(toolSource(QString()))), std::strerror(errno));
 }
 
 void ToolMountUserTest::outsideTheGroup()
