@@ -7,7 +7,6 @@ string(COMPARE EQUAL "${CMAKE_SOURCE_DIR}" "${PROJECT_SOURCE_DIR}" VEYFM_TOP_LEV
 
 option(VEYFM_BUILD_TESTS "Build the tests" ${VEYFM_TOP_LEVEL})
 option(VEYFM_BUILD_TOOLS "Build the command-line tool" ${VEYFM_TOP_LEVEL})
-option(VEYFM_BUILD_DAEMON "Build the file manager service" ${VEYFM_TOP_LEVEL})
 option(VEYFM_BUILD_BENCHMARKS "Build the benchmarks" ${VEYFM_TOP_LEVEL})
 option(VEYFM_BUILD_FUZZERS "Build the fuzz targets with Clang's libFuzzer, and no other test" OFF)
 option(VEYFM_INSTALL_CURLFTPFS_RCLONE "Install a curlftpfs that does its work with rclone" OFF)
