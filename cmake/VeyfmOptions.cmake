@@ -11,12 +11,18 @@ option(VEYFM_BUILD_BENCHMARKS "Build the benchmarks" ${VEYFM_TOP_LEVEL})
 option(VEYFM_BUILD_FUZZERS "Build the fuzz targets with Clang's libFuzzer, and no other test" OFF)
 option(VEYFM_INSTALL_CURLFTPFS_RCLONE "Install a curlftpfs that does its work with rclone" OFF)
 option(VEYFM_SYSTEM_PLATFORM "Link the system's veycore and veysu instead of the stand-ins" OFF)
+option(VEYFM_PRECOMPILE "Precompile what tests, and where it is sanitized the library, include" OFF)
 option(VEYFM_WERROR "Treat compiler warnings as errors" OFF)
 set(VEYFM_SANITIZE "" CACHE STRING "Sanitizers: empty, 'address,undefined' or 'thread'")
 set_property(CACHE VEYFM_SANITIZE PROPERTY STRINGS "" "address,undefined" "thread")
 
 if(VEYFM_TOP_LEVEL AND NOT CMAKE_BUILD_TYPE AND NOT CMAKE_CONFIGURATION_TYPES)
     set(CMAKE_BUILD_TYPE RelWithDebInfo CACHE STRING "Type of build" FORCE)
+endif()
+
+if(CMAKE_CXX_COMPILER_LAUNCHER MATCHES ccache)
+    # It keeps nothing that was compiled with precompiled headers.
+    set(VEYFM_PRECOMPILE OFF)
 endif()
 
 set(CMAKE_CXX_STANDARD 17)
