@@ -88,7 +88,7 @@ void registerRows(const Options& options)
         "storagePlaceRemoved, " + std::to_string(count) + " devices", options.rounds(9),
         [=](benchmark::State& state) { runGrowthRow(state, *service, "removals", count); });
     // Each update looks for its device, wherever there are many of them.
-    const std::pair<int, double> bursts[] = {{10, 1.5}, {count, 5}};
+    const std::pair<int, double> bursts[] = {{10, 1.5}, {count, 2}};
     for (const auto& [devices, bound] : bursts) {
         const std::string name = "storagePlaceUpdated, " + std::to_string(devices) + " devices";
         addRow(name, options.rounds(9), [=, devices = devices, bound = bound](auto& state) {

@@ -7,10 +7,9 @@
 #include "core/storageplace.h"
 
 #include <QList>
-#include <QMultiHash>
 #include <QString>
 
-#include <map>
+#include <vector>
 
 namespace VeyFM {
 
@@ -38,7 +37,7 @@ public:
     StoragePlace withPlaceName(const QString& placeName) const;
     /// @}
 
-    /// All records. What was given is never changed, and so may go to other threads.
+    /// All records. What goes to another thread is never changed.
     QList<StoragePlace> list(bool isForOthers);
 
     template <typename Patch>
@@ -48,19 +47,50 @@ public:
     }
 
 private:
-    // As a rule one record has a key. What many have in common is found by a walk through them.
-    using Index = QMultiHash<QString, quint64>;
-    using Places = std::map<quint64, StoragePlace>;
+    /// Which positions may hold a key: chains of those whose keys fall into one bucket, in a few
+    /// bytes a record.
+    class Index
+    {
+    public:
+        explicit Index(QString StoragePlace::*key)
+            : key(key)
+        {
+        }
 
-    Places::const_iterator first(const Index& index, const QString& key) const;
-    void changed();
+        bool isFull(int count) const
+        {
+            return size_t(count) > m_heads.size();
+        }
 
-    Places m_places; // by a number of their own, which never comes again
-    quint64 m_nextNumber = 0;
-    Index m_byUdi;
-    Index m_byPlaceName;
-    QList<StoragePlace> m_list; // made when asked for
-    bool m_isListed = true;
+        /// Room for positions below @p count.
+        void reset(int count);
+        void add(const QList<StoragePlace>& places, int position);
+        void remove(const QList<StoragePlace>& places, int position);
+
+        /// The positions of a key, in no particular order.
+        std::vector<int> positions(const QList<StoragePlace>& places, const QString& text) const;
+
+        QString StoragePlace::*const key;
+
+    private:
+        size_t bucket(const QString& text) const;
+
+        std::vector<int> m_heads; // -1 ends a chain
+        std::vector<int> m_next;
+    };
+
+    int first(const Index& index, const QString& text) const;
+    StoragePlace placeAt(int position) const;
+    void beforeChange();
+    void compact();
+    void reindex();
+
+    QList<StoragePlace> m_places;
+    std::vector<bool> m_isHole; // what was taken out stays as a hole until the list is asked for
+    int m_holes = 0;
+    Index m_byUdi{&StoragePlace::m_udi};
+    Index m_byPlaceName{&StoragePlace::m_placeName};
+    bool m_isShared = false; // with other threads
 };
 
 } // namespace VeyFM
