@@ -26,10 +26,10 @@ class FavouritePlacesManagerProxyPrivate;
  * nothing else does. A first read that failed stays as an empty list. A change that is asked for
  * here shows in the list only when its signal has come back.
  *
- * Any thread may call favouritePlaces(). From a thread other than that of the object it takes what
- * is there: a list that was not read yet is empty, and is read by the event loop of the object
- * later. Everything else is for the thread of the object. Calls that ask the service block for
- * one exchange with it.
+ * Any thread may call it. From a thread other than that of the object a list that was not read yet
+ * is empty, and is read by the event loop of the object later. What asks the service blocks the
+ * thread that calls it for one exchange. The signals are emitted in the thread of the object,
+ * and in that one alone.
  */
 class VEYFMVFS_EXPORT FavouritePlacesManagerProxy : public QObject
 {

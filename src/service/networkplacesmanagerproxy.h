@@ -23,10 +23,10 @@ class NetworkPlacesManagerProxyPrivate;
  * The network bookmarks as the service holds them: a list that is read once and patched by the
  * service's signals, with the rules of FavouritePlacesManagerProxy.
  *
- * Any thread may call networkPlaces(). From a thread other than that of the object it takes what
- * is there: a list that was not read yet is empty, and is read by the event loop of the object
- * later. Everything else is for the thread of the object. Calls that ask the service block for
- * one exchange with it.
+ * Any thread may call it. From a thread other than that of the object a list that was not read yet
+ * is empty, and is read by the event loop of the object later. What asks the service blocks the
+ * thread that calls it for one exchange. The signals are emitted in the thread of the object,
+ * and in that one alone.
  */
 class VEYFMVFS_EXPORT NetworkPlacesManagerProxy : public QObject
 {

@@ -28,11 +28,10 @@ class StoragePlacesManagerProxyPrivate;
  * patch it, and nothing else does. A first read that failed stays as an empty list, to which
  * only signals add.
  *
- * Any thread may call availableStoragePlaces(), storagePlaceByUdi() and
- * storagePlaceByPlaceName(). From a thread other than that of the object they take what is there:
- * a list that was not read yet is empty, and is read by the event loop of the object later.
- * Everything else is for the thread of the object. Calls that ask the service block
- * for one exchange with it.
+ * Any thread may call it. From a thread other than that of the object a list that was not read yet
+ * is empty, and is read by the event loop of the object later. What asks the service blocks the
+ * thread that calls it for one exchange. Jobs are to be made in the thread of the object, where
+ * the signals are emitted too.
  */
 class VEYFMVFS_EXPORT StoragePlacesManagerProxy : public QObject
 {
