@@ -3,7 +3,6 @@
 
 #include "support/readdirhook.h"
 #include "support/vfsscene.h"
-#include "support/worker.h"
 #include "vfs/vfs.h"
 #include "vfs/vfsplacebase.h"
 
@@ -11,7 +10,7 @@
 #include <QElapsedTimer>
 #include <QTest>
 
-#include <memory>
+#include <thread>
 #include <vector>
 
 using namespace VeyFM;
@@ -197,9 +196,7 @@ void TestVfsStop::abandonedStream()
 
 void TestVfsStop::fromAnotherThread()
 {
-    Worker worker([] { VFS::ptr()->stopGettingChilds(); });
-    worker.start();
-    QVERIFY(worker.wait(30000));
+    std::thread([] { VFS::ptr()->stopGettingChilds(); }).join();
     QVERIFY(isStopPending());
 }
 
@@ -209,17 +206,16 @@ void TestVfsStop::oneStopOneReader()
     QAtomicInt cancelled;
     QAtomicInt whole;
     VFS::ptr()->stopGettingChilds();
-    std::vector<std::unique_ptr<Worker>> readers;
+    std::vector<std::thread> readers;
     for (int i = 0; i < 4; ++i) {
-        readers.push_back(std::make_unique<Worker>([&] {
+        readers.emplace_back([&] {
             const int size = VFS::ptr()->childs(big).size();
             cancelled.fetchAndAddRelaxed(size == 0 ? 1 : 0);
             whole.fetchAndAddRelaxed(size == 2000 ? 1 : 0);
-        }));
-        readers.back()->start();
+        });
     }
-    for (const auto& reader : readers) {
-        QVERIFY(reader->wait(30000));
+    for (std::thread& reader : readers) {
+        reader.join();
     }
     QCOMPARE(cancelled.loadRelaxed(), 1);
     QCOMPARE(whole.loadRelaxed(), 3);
@@ -232,15 +228,14 @@ void TestVfsStop::whileMainThreadWorks()
     QAtomicInt records;
     ReaddirHook::set([&records](dirent*) { records.fetchAndAddRelaxed(1); }, ReaddirHook::Endless);
     QAtomicInt size(-1);
-    Worker worker([&] { size.storeRelease(VFS::ptr()->childs(big).size()); });
-    worker.start();
+    std::thread worker([&] { size.storeRelease(VFS::ptr()->childs(big).size()); });
     QTRY_VERIFY_WITH_TIMEOUT(records.loadRelaxed() > 5000, 30000);
     QCOMPARE(size.loadAcquire(), -1);
     // Walks in this thread do not wait for it.
     QCOMPARE(VFS::ptr()->parent(VFS::ptr()->homeEntry()), VFS::ptr()->computerEntry());
     QCOMPARE(VFS::ptr()->entry(text("Home/..")), VFS::ptr()->computerEntry());
     VFS::ptr()->stopGettingChilds();
-    QVERIFY(worker.wait(30000));
+    worker.join();
     QCOMPARE(size.loadAcquire(), 0);
 }
 
