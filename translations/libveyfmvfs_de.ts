@@ -11,6 +11,10 @@
         <source>can&apos;t connect to DBus service %1, perhaps usage &apos;dbus-launch &lt;program&gt;&apos; can solve this problem</source>
         <translation>Der D-Bus-Dienst %1 ist nicht erreichbar; vielleicht hilft der Aufruf „dbus-launch &lt;Programm&gt;“</translation>
     </message>
+    <message>
+        <source>service %1 does not answer, going on without it</source>
+        <translation>Der Dienst %1 antwortet nicht; es geht ohne ihn weiter</translation>
+    </message>
 </context>
 <context>
     <name>VeyFM::CheckSmbShareAuthJob</name>

@@ -11,6 +11,10 @@
         <source>can&apos;t connect to DBus service %1, perhaps usage &apos;dbus-launch &lt;program&gt;&apos; can solve this problem</source>
         <translation>Не удалось подключиться к службе D-Bus %1; возможно, поможет запуск «dbus-launch &lt;программа&gt;»</translation>
     </message>
+    <message>
+        <source>service %1 does not answer, going on without it</source>
+        <translation>Служба %1 не отвечает; работа продолжается без неё</translation>
+    </message>
 </context>
 <context>
     <name>VeyFM::CheckSmbShareAuthJob</name>

@@ -47,7 +47,7 @@ class VFSSettings;
  * What all processes of a user share (devices, bookmarks, the Samba network, mounts) comes from
  * the file manager service on the session bus. It is looked for once, by the first ptr(), and
  * started if it can be. Where there is none, two lines of the log say so and the tree shows its
- * built-in places.
+ * built-in places. One that hangs is waited for; setServiceProbe() says how long.
  *
  * Nothing here throws. What means nothing yields a null Entry, false, or an empty text or list.
  *
@@ -84,8 +84,25 @@ public:
     static void initialize();
 
     /**
-     * The one object; the first call constructs it, and may block on the session bus. Any thread
-     * may call it afterwards.
+     * Bounds what a file manager service that hangs costs the first ptr(): without it, each of
+     * some fifteen calls waits 25 seconds. To be called before ptr(), from any thread; later it
+     * does nothing. 0, the default, is no bound.
+     *
+     * With a bound the owner of the service's name, if there is one, has so many @p milliseconds
+     * to answer a ping, and a service that has to be started first three times as many to start.
+     * If it does not, one line at critical level says so and this process goes on, for good, as if
+     * no service were installed: the clients of the service have nothing to tell, nothing is sent,
+     * and of a service that awakes later nobody takes note.
+     *
+     * It says nothing about later: a service that hangs then lets each blocking call wait, as ever.
+     * Nor does it bound how long the connection to the bus itself takes.
+     */
+    static void setServiceProbe(int milliseconds);
+
+    /**
+     * The one object; the first call constructs it, and may block on the session bus: for minutes,
+     * where a service hangs and setServiceProbe() was not called. Any thread may call it
+     * afterwards.
      *
      * Not to be called from the destructor of a static object: this object is one itself, and may
      * be gone by then. The same goes for everything that calls it, Entry::localPath() for one.

@@ -1,11 +1,10 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
+#include "vfs/serviceprobe.h"
 #include "vfs/vfs_p.h"
 
 #include <QDBusConnection>
-#include <QDBusConnectionInterface>
-#include <QDBusReply>
 #include <QDebug>
 
 namespace VeyFM {
@@ -33,43 +32,45 @@ constexpr ServiceObject networkPlaces = {
 constexpr ServiceObject fuseMounts = {
     "/FuseMountsManager", "org.veylabs.FileManager.FuseMountsManager"};
 
-// The bus daemon, or null where the session has no bus. QDBusConnection::interface() alone does
-// not tell: it is there without a connection too.
-QDBusConnectionInterface* connectedDaemon()
-{
-    const QDBusConnection bus = QDBusConnection::sessionBus();
-    return bus.isConnected() ? bus.interface() : nullptr;
-}
-
 } // namespace
+
+void VFS::setServiceProbe(int milliseconds)
+{
+    ServiceProbe::setMilliseconds(milliseconds);
+}
 
 void VFSPrivate::initService()
 {
     serviceName = QStringLiteral("org.veylabs.vey-fm.vfs");
 
-    if (QDBusConnectionInterface* const daemon = connectedDaemon()) {
-        const QDBusReply<QStringList> activatable =
-            daemon->call(QDBus::Block, QStringLiteral("ListActivatableNames"));
-        // A running service that can't be activated counts as missing.
-        if (activatable.value().contains(serviceName)) {
-            daemon->startService(serviceName);
-            serviceInterface = std::make_unique<QDBusInterface>(
-                serviceName, QLatin1String(processReference.path),
-                QLatin1String(processReference.interface), QDBusConnection::sessionBus());
-            serviceInterface->call(QDBus::Block, QStringLiteral("incrementProcessRef"));
-        } else {
-            qCritical().noquote() << QObject::tr("service %1 is not installed").arg(serviceName);
-        }
-    } else {
+    bool isSilent = false;
+    // The bus daemon's interface does not tell: it is there without a connection too.
+    if (!QDBusConnection::sessionBus().isConnected()) {
         qCritical().noquote() << QObject::tr(
                                      "can't connect to DBus service %1, perhaps usage 'dbus-launch "
                                      "<program>' can solve this problem")
                                      .arg(serviceName);
+    } else if (!ServiceProbe::activatableNames().contains(serviceName)) {
+        // One that runs all the same counts as missing, and can hang all the same.
+        qCritical().noquote() << QObject::tr("service %1 is not installed").arg(serviceName);
+        isSilent = !ServiceProbe::passes(serviceName);
+    } else if (ServiceProbe::start(serviceName)) {
+        serviceInterface = std::make_unique<QDBusInterface>(
+            serviceName, QLatin1String(processReference.path),
+            QLatin1String(processReference.interface), QDBusConnection::sessionBus());
+        serviceInterface->call(QDBus::Block, QStringLiteral("incrementProcessRef"));
+    } else {
+        qCritical().noquote()
+            << QObject::tr("service %1 does not answer, going on without it").arg(serviceName);
+        isSilent = true;
     }
 
-    // The proxies exist whatever has happened, and have nothing to tell without a service.
-    const auto make = [this](const ServiceObject& object) {
-        return createInterface(QLatin1String(object.path), QLatin1String(object.interface));
+    // The proxies exist whatever has happened, and have nothing to tell without a service. Of one
+    // that does not answer they get no interfaces, since making them would ask it.
+    const auto make = [this, isSilent](const ServiceObject& object) {
+        return isSilent
+                   ? QSharedPointer<QDBusInterface>()
+                   : createInterface(QLatin1String(object.path), QLatin1String(object.interface));
     };
     fileSystemInterface = make(fileSystem);
     storagePlacesManager = std::make_unique<StoragePlacesManagerProxy>(make(storagePlaces), q);

@@ -124,6 +124,11 @@ QString PrivateBus::errorString() const
     return m_error;
 }
 
+qint64 PrivateBus::processId() const
+{
+    return m_daemon.processId();
+}
+
 FakeServiceControl::FakeServiceControl(const QString& address)
     : m_name(QUuid::createUuid().toString())
     , m_bus(QDBusConnection::connectToBus(address, m_name))

@@ -38,6 +38,9 @@ public:
     QString address() const;
     QString errorString() const;
 
+    /// The process of the bus itself.
+    qint64 processId() const;
+
     /// The command that runs the scripted service by hand.
     QStringList fakeServiceCommand(const QJsonObject& script = {}) const;
 

@@ -20,10 +20,10 @@ public:
         }
     }
 
-    /// Starts it and waits until its tree stands.
-    bool start()
+    /// Starts it and waits until its tree stands. Other arguments than none are for main().
+    bool start(const QStringList& arguments = {})
     {
-        process.start(QStringLiteral(VEYFM_VFS_CLIENT), QStringList());
+        process.start(QStringLiteral(VEYFM_VFS_CLIENT), arguments);
         return waitFor(QStringLiteral("ready"));
     }
 

@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-// veyfm-fake-service --contract DIRECTORY [--script FILE] [--die]
+// veyfm-fake-service --contract DIRECTORY [--script FILE] [--die | --hang]
 
 #include "fakeservice.h"
 #include "wire.h"
@@ -21,7 +21,9 @@ int main(int argc, char** argv)
         QStringLiteral("script"), QStringLiteral("Values and rules."), QStringLiteral("file"));
     const QCommandLineOption dieOption(
         QStringLiteral("die"), QStringLiteral("End before the name is owned."));
-    parser.addOptions({contractOption, scriptOption, dieOption});
+    const QCommandLineOption hangOption(
+        QStringLiteral("hang"), QStringLiteral("Never own the name, as long as there is a bus."));
+    parser.addOptions({contractOption, scriptOption, dieOption, hangOption});
     parser.process(app);
     if (parser.isSet(dieOption)) {
         return 3;
@@ -30,6 +32,14 @@ int main(int argc, char** argv)
     Wire::registerTypes();
     const Contract contract(parser.value(contractOption));
     QDBusConnection bus = QDBusConnection::sessionBus();
+    // QtDBus goes on without its bus, and the process would stay when the test is long over.
+    bus.connect(
+        QString(), QStringLiteral("/org/freedesktop/DBus/Local"),
+        QStringLiteral("org.freedesktop.DBus.Local"), QStringLiteral("Disconnected"), &app,
+        SLOT(quit()));
+    if (parser.isSet(hangOption)) {
+        return app.exec();
+    }
     FakeService service(contract, bus);
     if (parser.isSet(scriptOption)) {
         QFile file(parser.value(scriptOption));
@@ -43,10 +53,5 @@ int main(int argc, char** argv)
         !bus.registerService(QStringLiteral("org.veylabs.vey-fm.vfs"))) {
         qFatal("%s", qPrintable(bus.lastError().message()));
     }
-    // QtDBus goes on without its bus, and the process would stay when the test is long over.
-    bus.connect(
-        QString(), QStringLiteral("/org/freedesktop/DBus/Local"),
-        QStringLiteral("org.freedesktop.DBus.Local"), QStringLiteral("Disconnected"), &app,
-        SLOT(quit()));
     return app.exec();
 }

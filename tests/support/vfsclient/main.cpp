@@ -7,7 +7,7 @@
 //   notify PATH   tells all processes of the entry; answers "notified"
 //   childs PATH   answers "childs" and the paths of the children behind blanks
 //   quit          returns from main
-// The end of the input is "quit" as well.
+// The end of the input is "quit" as well. A number as argument is for VFS::setServiceProbe().
 
 #include "vfs/vfs.h"
 #include "watch/entrywatcher.h"
@@ -16,6 +16,7 @@
 #include <QSocketNotifier>
 
 #include <cstdio>
+#include <cstdlib>
 
 #include <unistd.h>
 
@@ -51,6 +52,9 @@ int main(int argc, char** argv)
 {
     QCoreApplication app(argc, argv);
     VFS::initialize();
+    if (argc > 1) {
+        VFS::setServiceProbe(std::atoi(argv[1]));
+    }
     QObject::connect(VFS::ptr()->entryWatcher(), &EntryWatcher::entryReset, [](const Entry& entry) {
         say(QStringLiteral("reset ") + entry.path());
     });
