@@ -64,6 +64,8 @@ private Q_SLOTS:
     void helpOfUnknownVerbFails();
     void dashesEndOptions();
     void outputErrorsAreTold();
+    void closedDescriptorsAreOpened_data();
+    void closedDescriptorsAreOpened();
     void libraryMessagesAreShownOnRequest();
     void manualPageIsClean();
     void manualPageNamesEveryOption();
@@ -220,6 +222,50 @@ void ToolUsageTest::outputErrorsAreTold()
         {QStringLiteral("-c"), QStringLiteral("exec \"$0\" tree >/dev/full"), toolPath()});
     QCOMPARE(result.exitCode, 1);
     QCOMPARE(result.err, QByteArray("veyfm-vfs: standard output: No space left on device\n"));
+}
+
+void ToolUsageTest::closedDescriptorsAreOpened_data()
+{
+    QTest::addColumn<QString>("closed");
+    QTest::addColumn<bool>("prints");
+    QTest::newRow("input") << QStringLiteral("<&-") << true;
+    QTest::newRow("output") << QStringLiteral(">&-") << false;
+    QTest::newRow("errors") << QStringLiteral("2>&-") << true;
+    QTest::newRow("all") << QStringLiteral("<&- >&- 2>&-") << false;
+}
+
+void ToolUsageTest::closedDescriptorsAreOpened()
+{
+    QFETCH(const QString, closed);
+    QFETCH(const bool, prints);
+    const QString resolve = QStringLiteral("exec \"$0\" resolve / ");
+    const ToolResult result =
+        runProgram(QStringLiteral("/bin/sh"), {QStringLiteral("-c"), resolve + closed, toolPath()});
+    QCOMPARE(result.exitCode, 0);
+    QCOMPARE(result.err, QByteArray());
+    QCOMPARE(result.out.contains("path: /"), prints);
+
+    // Nothing else of the program has their numbers.
+    QTemporaryDir directory;
+    QProcess process;
+    process.setProcessChannelMode(QProcess::ForwardedChannels);
+    process.start(
+        QStringLiteral("/bin/sh"),
+        {QStringLiteral("-c"), QStringLiteral("exec \"$0\" monitor \"$1\" ") + closed, toolPath(),
+         directory.path()});
+    const auto target = [&process](const QString& number) {
+        return QFile::symLinkTarget(
+            QStringLiteral("/proc/%1/fd/%2").arg(process.processId()).arg(number));
+    };
+    const QStringList numbers = closed.split(QLatin1Char(' '));
+    for (const QString& redirection : numbers) {
+        const QString number = redirection == QLatin1String("<&-")   ? QStringLiteral("0")
+                               : redirection == QLatin1String(">&-") ? QStringLiteral("1")
+                                                                     : QStringLiteral("2");
+        QTRY_COMPARE(target(number), QStringLiteral("/dev/null"));
+    }
+    process.kill();
+    process.waitForFinished();
 }
 
 void ToolUsageTest::libraryMessagesAreShownOnRequest()

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "commandline.h"
+#include "descriptors.h"
 #include "mount/descendants.h"
 #include "report.h"
 
@@ -11,6 +12,7 @@
 
 int main(int argc, char* argv[])
 {
+    VeyFM::Tool::openStandardDescriptors();
     // Where the caller ignores it, nobody learns how the tools end.
     ::signal(SIGCHLD, SIG_DFL);
     VeyFM::Tool::leaveInheritedChildren();
