@@ -126,7 +126,7 @@ int TerminalSession::waitForEnd()
         return -1;
     }
     m_pid = -1;
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
 }
 
 bool TerminalSession::hasEcho() const

@@ -29,7 +29,8 @@ public:
     /// long.
     bool waitFor(const QByteArray& text, int times = 1);
 
-    /// Reads to the end. The exit code, or -1 for a program that was killed or takes too long.
+    /// Reads to the end. The exit code as a shell has it, 128 and its number for a signal; -1 for a
+    /// program that takes too long.
     int waitForEnd();
 
     /// Whether the terminal shows what is typed.

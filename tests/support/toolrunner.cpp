@@ -62,8 +62,9 @@ ToolResult runProgram(
     process.setStandardInputFile(QProcess::nullDevice());
     process.start(program, arguments);
     ToolResult result;
-    if (process.waitForFinished(60000) && process.exitStatus() == QProcess::NormalExit) {
-        result.exitCode = process.exitCode();
+    if (process.waitForFinished(60000)) {
+        result.exitCode =
+            process.exitCode() + (process.exitStatus() == QProcess::NormalExit ? 0 : 128);
     }
     result.out = process.readAllStandardOutput();
     result.err = process.readAllStandardError();

@@ -13,7 +13,8 @@
 /// What a run of veyfm-vfs left behind.
 struct ToolResult
 {
-    int exitCode = -1; ///< -1 also for a run that crashed or took too long.
+    /// As a shell has it, 128 and its number for a signal; -1 for a run that took too long.
+    int exitCode = -1;
     QByteArray out;
     QByteArray err;
 

@@ -5,6 +5,7 @@
 #include "support/terminalsession.h"
 #include "support/toolrunner.h"
 
+#include <QDir>
 #include <QTemporaryDir>
 #include <QTest>
 
@@ -17,6 +18,25 @@
 namespace {
 
 constexpr int patience = 30000;
+
+/// Whether a child of the process watches something.
+bool watches(pid_t parent)
+{
+    QFile children(QStringLiteral("/proc/%1/task/%1/children").arg(parent));
+    if (!children.open(QIODevice::ReadOnly)) {
+        return false;
+    }
+    const QString child = QString::fromLatin1(children.readAll()).trimmed();
+    const QDir descriptors(QStringLiteral("/proc/%1/fdinfo").arg(child));
+    const QStringList names = descriptors.entryList(QDir::Files);
+    for (const QString& name : names) {
+        QFile file(descriptors.filePath(name));
+        if (file.open(QIODevice::ReadOnly) && file.readAll().contains("inotify wd:")) {
+            return true;
+        }
+    }
+    return false;
+}
 
 } // namespace
 
@@ -31,6 +51,8 @@ private Q_SLOTS:
     void stalledDirectory();
     void stuckOutput();
     void controlC();
+    void loopOfAShellEnds_data();
+    void loopOfAShellEnds();
     void ignoredSignalStaysIgnored();
 };
 
@@ -61,8 +83,8 @@ void ToolInterruptTest::endlessDirectory()
     QTRY_VERIFY_WITH_TIMEOUT(directory.progress() > 20000, patience);
     ::kill(pid_t(process.processId()), SIGINT);
     QVERIFY(process.waitForFinished(patience));
-    QCOMPARE(process.exitStatus(), QProcess::NormalExit);
-    QCOMPARE(process.exitCode(), 1);
+    QCOMPARE(process.exitStatus(), QProcess::CrashExit);
+    QCOMPARE(process.exitCode(), SIGINT);
     QCOMPARE(
         process.readAllStandardError(),
         "veyfm-vfs: " + mountPoint.path().toLocal8Bit() + ": interrupted\n");
@@ -89,8 +111,8 @@ void ToolInterruptTest::stalledDirectory()
     QCOMPARE(errors, "veyfm-vfs: " + mountPoint.path().toLocal8Bit() + ": interrupted\n");
     directory.release();
     QVERIFY(process.waitForFinished(patience));
-    QCOMPARE(process.exitStatus(), QProcess::NormalExit);
-    QCOMPARE(process.exitCode(), 1);
+    QCOMPARE(process.exitStatus(), QProcess::CrashExit);
+    QCOMPARE(process.exitCode(), SIGINT);
 }
 
 void ToolInterruptTest::stuckOutput()
@@ -120,8 +142,8 @@ void ToolInterruptTest::stuckOutput()
     QVERIFY(process.waitForFinished(patience));
     QCOMPARE(waiting(), size);
     ::close(reader);
-    QCOMPARE(process.exitStatus(), QProcess::NormalExit);
-    QCOMPARE(process.exitCode(), 1);
+    QCOMPARE(process.exitStatus(), QProcess::CrashExit);
+    QCOMPARE(process.exitCode(), SIGINT);
     QCOMPARE(
         process.readAllStandardError(),
         "veyfm-vfs: " + directory.path().toLocal8Bit() + ": interrupted\n");
@@ -140,11 +162,47 @@ void ToolInterruptTest::controlC()
         toolEnvironment());
     QTRY_VERIFY_WITH_TIMEOUT(directory.progress() > 20000, patience);
     session.type("\003");
-    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(session.waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session.output().endsWith(
             "veyfm-vfs: " + mountPoint.path().toLocal8Bit() + ": interrupted\n"),
         session.output().constData());
+}
+
+void ToolInterruptTest::loopOfAShellEnds_data()
+{
+    QTest::addColumn<QByteArray>("line");
+    QTest::newRow("list") << QByteArray("list .");
+    QTest::newRow("tree") << QByteArray("tree .");
+    QTest::newRow("monitor") << QByteArray("monitor .");
+}
+
+void ToolInterruptTest::loopOfAShellEnds()
+{
+    QFETCH(const QByteArray, line);
+    QTemporaryDir mountPoint;
+    const SlowDirectory directory(SlowDirectory::Endless, mountPoint.path());
+    if (!directory.problem().isEmpty()) {
+        QSKIP(qPrintable(QStringLiteral("no slow directory here: ") + directory.problem()));
+    }
+
+    const QString loop =
+        QStringLiteral("for i in 1 2 3; do echo begin $i; \"$0\" %1; done; echo on")
+            .arg(QString::fromLatin1(line));
+    TerminalSession session(
+        QStringLiteral("/bin/bash"), {QStringLiteral("-c"), loop, toolPath()}, mountPoint.path(),
+        toolEnvironment());
+    QVERIFY(session.waitFor("begin 1\n"));
+    if (line.startsWith("monitor")) {
+        // It has the signal in hand when it watches.
+        QTRY_VERIFY_WITH_TIMEOUT(watches(session.processId()), patience);
+    } else {
+        QTRY_VERIFY_WITH_TIMEOUT(directory.progress() > 20000, patience);
+    }
+    session.type("\003");
+    QCOMPARE(session.waitForEnd(), 128 + SIGINT);
+    QVERIFY2(!session.output().contains("begin 2"), session.output().constData());
+    QVERIFY2(!session.output().contains("on\n"), session.output().constData());
 }
 
 void ToolInterruptTest::ignoredSignalStaysIgnored()

@@ -8,6 +8,8 @@
 
 #include <QTest>
 
+#include <signal.h>
+
 using namespace VeyFM;
 using namespace VeyFM::Tool;
 
@@ -207,7 +209,7 @@ void ToolMountsTest::stuckService()
         toolPath(), ToolScene::words("mounts"), QDir::tempPath(), scene.environment());
     QVERIFY(session.waitFor(" Reading the mounts ("));
     session.type("\003");
-    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(session.waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session.output().endsWith("\r\033[Kveyfm-vfs: mounts: interrupted\n"),
         session.output().constData());

@@ -7,6 +7,8 @@
 #include <QTemporaryDir>
 #include <QTest>
 
+#include <signal.h>
+
 namespace {
 
 QJsonObject network()
@@ -279,7 +281,7 @@ void ToolRescanTest::interrupted()
         toolPath(), ToolScene::words("network rescan WG"), QDir::tempPath(), scene.environment());
     QVERIFY(session.waitFor(" Scanning the Samba network ("));
     session.type("\003");
-    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(session.waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session.output().endsWith("\r\033[Kveyfm-vfs: network rescan: interrupted\n"),
         session.output().constData());

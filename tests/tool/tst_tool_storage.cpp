@@ -336,7 +336,7 @@ void ToolStorageTest::controlCDuringJob()
         toolPath(), ToolScene::words("storage mount sdb1"), QDir::tempPath(), scene.environment());
     QVERIFY(session.waitFor(" Mounting ("));
     session.type("\003");
-    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(session.waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session.output().endsWith("\r\033[Kveyfm-vfs: storage mount: interrupted\n"),
         session.output().constData());
@@ -354,7 +354,7 @@ void ToolStorageTest::controlCDuringBlockingRead()
         toolPath(), ToolScene::words("storage list"), QDir::tempPath(), scene.environment());
     QVERIFY(session.waitFor(" Reading the storage devices ("));
     session.type("\003");
-    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(session.waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session.output().endsWith("\r\033[Kveyfm-vfs: storage list: interrupted\n"),
         session.output().constData());
@@ -370,7 +370,7 @@ void ToolStorageTest::controlCDuringBlockingRead()
     const int exitCode = stuck.waitForEnd();
     ::kill(service, SIGCONT);
     QVERIFY(shown);
-    QCOMPARE(exitCode, 1);
+    QCOMPARE(exitCode, 128 + SIGINT);
     QVERIFY2(
         stuck.output().endsWith("\r\033[Kveyfm-vfs: bookmark list: interrupted\n"),
         stuck.output().constData());

@@ -5,6 +5,8 @@
 
 #include <QTest>
 
+#include <signal.h>
+
 using namespace UpdateScene;
 
 /// "veyfm-vfs update" that is interrupted, or waits for what never comes.
@@ -51,7 +53,7 @@ void ToolUpdateWatchTest::interrupted()
     const auto session = scene.onTerminal("update " + entry + " Network/files");
     QTRY_VERIFY(MountScene::isRunning(scene.tool.processId(1)));
     session->type("\003");
-    QCOMPARE(session->waitForEnd(), 1);
+    QCOMPARE(session->waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session->output().endsWith("veyfm-vfs: " + entry + ": interrupted\n"),
         session->output().constData());
@@ -89,7 +91,7 @@ void ToolUpdateWatchTest::interruptedScan()
         service.environment(), 200);
     QVERIFY(session->waitFor(" Updating Samba ("));
     session->type("\003");
-    QCOMPARE(session->waitForEnd(), 1);
+    QCOMPARE(session->waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session->output().endsWith("veyfm-vfs: Samba: interrupted\n"),
         session->output().constData());
@@ -105,7 +107,7 @@ void ToolUpdateWatchTest::stuckService()
         toolPath(), ToolScene::words("update Samba/WG"), QDir::tempPath(), service.environment());
     QVERIFY(session.waitFor(" Waiting for the file manager service ("));
     session.type("\003");
-    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(session.waitForEnd(), 128 + SIGINT);
     QVERIFY2(
         session.output().endsWith("\r\033[Kveyfm-vfs: Samba/WG: interrupted\n"),
         session.output().constData());

@@ -3,7 +3,9 @@
 
 #include "interrupt.h"
 
+#include "ending.h"
 #include "spinner.h"
+#include "verb.h"
 
 #include <unistd.h>
 
@@ -17,10 +19,8 @@ constexpr int partingMilliseconds = 2000;
 
 } // namespace
 
-Interrupt::Interrupt(
-    std::initializer_list<int> signalNumbers, int exitCode, std::function<void()> stop)
-    : m_exitCode(exitCode)
-    , m_stop(std::move(stop))
+Interrupt::Interrupt(std::initializer_list<int> signalNumbers, std::function<void()> stop)
+    : m_stop(std::move(stop))
 {
     if (!m_pipe.isOpen()) {
         return; // The signals keep their default effect, which ends the program as well.
@@ -89,7 +89,7 @@ void Interrupt::watch()
     if (::write(STDERR_FILENO, m_message.constData(), size_t(m_message.size())) < 0) {
         // Nobody to tell.
     }
-    ::_exit(m_exitCode);
+    endAtOnce(Failed);
 }
 
 } // namespace Tool

@@ -24,8 +24,9 @@ namespace Tool {
  *
  * On the first signal a thread of this object calls @p stop and gives the work half a second to
  * come to its end by itself. Work that hangs, in the directory of a server that has gone or in
- * a pipe that nobody reads, is cut off then: the program writes the message and exits. A second
- * signal has its default effect. Signals that are ignored when the object is made stay ignored.
+ * a pipe that nobody reads, is cut off then: the program writes the message and ends. It dies of
+ * the signal in any case, see ending.h. A second signal has its default effect. Signals that are
+ * ignored when the object is made stay ignored.
  *
  * The signals are blocked in the thread that makes the object, as long as it lives. A program
  * started meanwhile inherits that.
@@ -33,7 +34,7 @@ namespace Tool {
 class Interrupt
 {
 public:
-    Interrupt(std::initializer_list<int> signalNumbers, int exitCode, std::function<void()> stop);
+    Interrupt(std::initializer_list<int> signalNumbers, std::function<void()> stop);
     ~Interrupt();
 
     /// What goes to standard error when work is cut off.
@@ -52,7 +53,6 @@ private:
 
     sigset_t m_maskBefore = {};
     SignalPipe m_pipe;
-    const int m_exitCode;
     const std::function<void()> m_stop;
     std::atomic<bool> m_requested{false};
     std::atomic<bool> m_workEnded{false};

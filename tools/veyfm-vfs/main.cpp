@@ -3,6 +3,7 @@
 
 #include "commandline.h"
 #include "descriptors.h"
+#include "ending.h"
 #include "mount/descendants.h"
 #include "report.h"
 
@@ -13,6 +14,7 @@
 int main(int argc, char* argv[])
 {
     VeyFM::Tool::openStandardDescriptors();
+    VeyFM::Tool::dieOfCaughtSignals();
     // Where the caller ignores it, nobody learns how the tools end.
     ::signal(SIGCHLD, SIG_DFL);
     VeyFM::Tool::leaveInheritedChildren();

@@ -37,7 +37,7 @@ QString interrupted()
  */
 Interrupt& serviceInterrupt()
 {
-    static Interrupt interrupt({SIGINT}, Failed, [] {
+    static Interrupt interrupt({SIGINT}, [] {
         if (qApp) {
             QMetaObject::invokeMethod(qApp, &QCoreApplication::quit, Qt::QueuedConnection);
         }
@@ -50,7 +50,7 @@ Interrupt& serviceInterrupt()
 bool runInterruptibly(const Invocation& invocation, const std::function<void()>& work)
 {
     // The verbs have interrupts of their own, one at a time.
-    Interrupt interrupt({SIGINT}, Failed, [] {});
+    Interrupt interrupt({SIGINT}, [] {});
     interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
     const Waiting waiting(waitingForService());
     work();

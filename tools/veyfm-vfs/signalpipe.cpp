@@ -3,6 +3,8 @@
 
 #include "signalpipe.h"
 
+#include "ending.h"
+
 #include <atomic>
 #include <cerrno>
 #include <fcntl.h>
@@ -26,9 +28,10 @@ void sendByte(int descriptor, SignalPipe::Byte byte)
     }
 }
 
-void handleSignal(int)
+void handleSignal(int number)
 {
     const int error = errno;
+    noteCaughtSignal(number);
     // Not with the byte: what else got the signal may have an effect before the pipe is read.
     signalCaught = true;
     sendByte(handlerDescriptor, SignalPipe::Signal);

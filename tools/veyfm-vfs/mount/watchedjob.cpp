@@ -4,6 +4,7 @@
 #include "mount/watchedjob.h"
 
 #include "commandline.h"
+#include "ending.h"
 #include "jobs/job.h"
 #include "mount/descendants.h"
 #include "report.h"
@@ -68,7 +69,7 @@ void boundParting()
     // A service that hangs keeps a process at its very end too.
     std::thread([] {
         std::this_thread::sleep_for(parting);
-        ::_exit(Failed);
+        endAtOnce(Failed);
     }).detach();
 }
 
@@ -360,7 +361,7 @@ void JobWatch::cutOff()
         what, isServiceSilent
                   ? whyStopped() + QStringLiteral(": the file manager service does not answer")
                   : whyStopped());
-    ::_exit(Failed);
+    endAtOnce(Failed);
 }
 
 } // namespace Tool

@@ -202,7 +202,7 @@ int run(Invocation& invocation)
     const ListingOptions options = listingOptions(invocation);
     JsonArray json(output);
     VFS* vfs = VFS::ptr();
-    Interrupt interrupt({SIGINT}, Failed, [vfs] { vfs->stopGettingChilds(); });
+    Interrupt interrupt({SIGINT}, [vfs] { vfs->stopGettingChilds(); });
 
     int exitCode = Done;
     bool first = true;

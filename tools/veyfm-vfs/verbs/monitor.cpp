@@ -216,7 +216,7 @@ private:
 
 int run(Invocation& invocation)
 {
-    const Interrupt interrupt({SIGINT, SIGTERM}, Done, [] {
+    const Interrupt interrupt({SIGINT, SIGTERM}, [] {
         QMetaObject::invokeMethod(qApp, &QCoreApplication::quit, Qt::QueuedConnection);
     });
     Monitor monitor(invocation);

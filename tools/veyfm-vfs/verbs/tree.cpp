@@ -213,7 +213,7 @@ int run(Invocation& invocation)
         levels = int(invocation.value(QStringLiteral("depth")).toUInt());
     }
 
-    Interrupt interrupt({SIGINT}, Failed, [vfs] { vfs->stopGettingChilds(); });
+    Interrupt interrupt({SIGINT}, [vfs] { vfs->stopGettingChilds(); });
     Gatherer gatherer(invocation, interrupt);
     JsonArray json(output);
     int exitCode = Done;
