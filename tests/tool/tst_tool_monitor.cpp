@@ -106,6 +106,8 @@ private Q_SLOTS:
     void takesAnyNotation();
     void endsOnSignals_data();
     void endsOnSignals();
+    void endsWithoutAReader();
+    void endsWhereItCannotWrite();
     void tellsWhatItCannotWatch();
     void failingOperandDoesNotStopOthers();
 };
@@ -234,6 +236,42 @@ void ToolMonitorTest::endsOnSignals()
     QVERIFY(monitor.waitForWatches(1));
     QCOMPARE(monitor.end(number), number);
     QCOMPARE(monitor.errors(), QByteArray());
+}
+
+void ToolMonitorTest::endsWithoutAReader()
+{
+    // At once, not with the next event, which may never come.
+    QTemporaryDir directory;
+    const ToolResult result = runProgram(
+        QStringLiteral("/bin/sh"),
+        {QStringLiteral("-c"), QStringLiteral("{ \"$0\" monitor \"$1\"; echo $? >&2; } | :"),
+         toolPath(), directory.path()});
+    QCOMPARE(result.err, QByteArray("141\n")); // SIGPIPE, as a shell has it.
+}
+
+void ToolMonitorTest::endsWhereItCannotWrite()
+{
+    QTemporaryDir directory;
+    const QByteArray start = "veyfm-vfs: standard output: ";
+    const struct
+    {
+        const char* command;
+        QByteArray errors;
+    } cases[] = {
+        {"\"$0\" monitor \"$1\" >/dev/full; echo $? >&2", start + "No space left on device\n1\n"},
+        // Whoever ignores the signal is told.
+        {"trap '' PIPE; { \"$0\" monitor \"$1\"; echo $? >&2; } | :", start + "Broken pipe\n1\n"},
+    };
+    for (const auto& each : cases) {
+        QProcess process;
+        process.setStandardInputFile(QProcess::nullDevice());
+        process.start(
+            QStringLiteral("/bin/sh"), {QStringLiteral("-c"), QString::fromLatin1(each.command),
+                                        toolPath(), directory.path()});
+        QTRY_VERIFY_WITH_TIMEOUT(
+            createFile(directory.path(), "x") && process.state() == QProcess::NotRunning, 20000);
+        QCOMPARE(process.readAllStandardError(), each.errors);
+    }
 }
 
 void ToolMonitorTest::tellsWhatItCannotWatch()

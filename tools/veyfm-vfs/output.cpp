@@ -95,6 +95,16 @@ void Output::flush()
     m_buffer.clear();
 }
 
+void Output::setFailed(int error)
+{
+    m_error = error;
+}
+
+bool Output::hasFailed() const
+{
+    return m_error != 0;
+}
+
 void Output::writeRecord(const QByteArray& bytes)
 {
     write(bytes);

@@ -39,6 +39,10 @@ public:
 
     /// Whether anything was written.
     bool wasUsed() const;
+    /// What can't be written is dropped. An errno value says why. @{
+    void setFailed(int error);
+    bool hasFailed() const;
+    /// @}
 
     /// The bytes, and the end of a record.
     void writeRecord(const QByteArray& bytes);

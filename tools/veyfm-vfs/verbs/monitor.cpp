@@ -15,6 +15,7 @@
 
 #include <QCoreApplication>
 #include <QSet>
+#include <QSocketNotifier>
 
 #include <cerrno>
 #include <signal.h>
@@ -206,6 +207,9 @@ private:
             output.writeRecord(word + "  " + output.name(path, entry));
         }
         output.flush();
+        if (output.hasFailed()) {
+            QCoreApplication::quit();
+        }
     }
 
     Invocation& m_invocation;
@@ -218,6 +222,14 @@ int run(Invocation& invocation)
 {
     const Interrupt interrupt({SIGINT, SIGTERM}, [] {
         QMetaObject::invokeMethod(qApp, &QCoreApplication::quit, Qt::QueuedConnection);
+    });
+    // A pipe without a reader tells so by itself, not only to who writes. The signal is what
+    // writing would lead to.
+    QSocketNotifier reader(STDOUT_FILENO, QSocketNotifier::Exception);
+    QObject::connect(&reader, &QSocketNotifier::activated, &reader, [&invocation] {
+        ::raise(SIGPIPE);
+        invocation.output().setFailed(EPIPE);
+        QCoreApplication::quit();
     });
     Monitor monitor(invocation);
     int watched = 0;
