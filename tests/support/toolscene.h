@@ -29,6 +29,12 @@ public:
         return std::unique_ptr<ToolScene>(new ToolScene({}, Installed, {QStringLiteral("--die")}));
     }
 
+    /// One that never owns its name.
+    static std::unique_ptr<ToolScene> withHangingService()
+    {
+        return std::unique_ptr<ToolScene>(new ToolScene({}, Installed, {QStringLiteral("--hang")}));
+    }
+
     ~ToolScene()
     {
         if (m_control && m_control->isRunning()) {

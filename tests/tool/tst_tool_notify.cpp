@@ -13,6 +13,7 @@ private Q_SLOTS:
     void sendsEntries();
     void failingOperandDoesNotStopOthers();
     void noEcho();
+    void withoutABound();
     void serviceDies();
 };
 
@@ -56,6 +57,17 @@ void ToolNotifyTest::noEcho()
     QCOMPARE(
         result.err,
         QByteArray("veyfm-vfs: /tmp: asked for, but the service told of no change within 1 s\n"));
+}
+
+void ToolNotifyTest::withoutABound()
+{
+    // 0 is as long as it takes, not at once.
+    ToolScene scene(
+        ruleOf(QStringLiteral("FileSystem.notifyWatchers"), {{QStringLiteral("delay"), 500}}));
+    QVERIFY(scene.isReady());
+    const ToolResult result = scene.run("notify --timeout=0 /tmp");
+    QCOMPARE(result.err, QByteArray());
+    QCOMPARE(result.exitCode, 0);
 }
 
 void ToolNotifyTest::serviceDies()

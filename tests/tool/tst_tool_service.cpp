@@ -8,10 +8,10 @@
 namespace {
 
 const QByteArray noBus = "no session bus: start the program under dbus-run-session or in a "
-                         "desktop session\n";
+                         "desktop session; 'veyfm-vfs status' shows how it stands\n";
 const QByteArray notInstalled =
     "the file manager service (org.veylabs.vey-fm.vfs) is not installed on this session bus: "
-    "install the program that provides it\n";
+    "install the program that provides it; 'veyfm-vfs status' shows how it stands\n";
 
 } // namespace
 

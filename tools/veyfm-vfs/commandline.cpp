@@ -4,6 +4,7 @@
 #include "commandline.h"
 
 #include "mount/mounturl.h"
+#include "patience.h"
 #include "report.h"
 #include "session.h"
 #include "verbs/verbs.h"
@@ -99,7 +100,7 @@ Option timeoutOption()
 {
     return {
         {QStringLiteral("timeout")},
-        QStringLiteral("Wait so long for the news of the change (default: 10)"),
+        QStringLiteral("Wait so long for the news of the change (default: 10; 0: no bound)"),
         QStringLiteral("SECONDS"),
         {},
         true};
@@ -317,12 +318,14 @@ int runCommandLine(const QStringList& words)
     }
     setVerbose(invocation.isSet(QStringLiteral("verbose")));
     VFS::initialize();
-    const int exitCode = runVerb(invocation);
+    int exitCode = runVerb(invocation);
     // A verb that failed before it had anything to print.
     if (invocation.json() && !verb->jsonLines && !output.wasUsed()) {
         JsonArray(output).end();
     }
-    return output.finish(exitCode);
+    exitCode = output.finish(exitCode);
+    Patience::boundParting(exitCode);
+    return exitCode;
 }
 
 } // namespace Tool

@@ -6,6 +6,9 @@
 #include "ending.h"
 #include "mount/descendants.h"
 #include "report.h"
+#include "restart.h"
+#include "service.h"
+#include "vfs/vfs.h"
 
 #include <QCoreApplication>
 
@@ -15,11 +18,16 @@ int main(int argc, char* argv[])
 {
     VeyFM::Tool::openStandardDescriptors();
     VeyFM::Tool::dieOfCaughtSignals();
+    VeyFM::Tool::Restart::prepare(argv);
     // Where the caller ignores it, nobody learns how the tools end.
     ::signal(SIGCHLD, SIG_DFL);
     VeyFM::Tool::leaveInheritedChildren();
     VeyFM::Tool::installLogging();
     QCoreApplication application(argc, argv);
     QCoreApplication::setApplicationName(QStringLiteral("veyfm-vfs"));
+    if (VeyFM::Tool::Restart::wasDone()) {
+        VeyFM::Tool::leaveService();
+    }
+    VeyFM::VFS::setServiceProbe(VeyFM::Tool::probeMilliseconds);
     return VeyFM::Tool::runCommandLine(VeyFM::Tool::wordsOf(argv + 1));
 }

@@ -3,6 +3,7 @@
 
 #include "output.h"
 
+#include "patience.h"
 #include "report.h"
 #include "shown.h"
 #include "spinner.h"
@@ -79,6 +80,7 @@ bool Output::wasUsed() const
 void Output::flush()
 {
     if (!m_buffer.isEmpty()) {
+        Patience::notePrinted();
         Spinner::end();
     }
     const char* data = m_buffer.constData();

@@ -3,6 +3,7 @@
 
 #include "report.h"
 
+#include "patience.h"
 #include "shown.h"
 #include "spinner.h"
 #include "terminal.h"
@@ -19,20 +20,21 @@ namespace {
 
 std::atomic<bool> verbose{false};
 
-void handleMessage(QtMsgType type, const QMessageLogContext& context, const QString& message)
-{
-    Q_UNUSED(context)
-    if (verbose || type == QtFatalMsg) {
-        report(QStringLiteral("libveyfmvfs"), message);
-    }
-}
-
 void writeError(const QByteArray& bytes)
 {
     Spinner::end();
     // One call, so that lines of several processes do not mix; nobody to tell of a failure.
     if (::write(STDERR_FILENO, bytes.constData(), size_t(bytes.size())) < 0) {
         return;
+    }
+}
+
+void handleMessage(QtMsgType type, const QMessageLogContext& context, const QString& message)
+{
+    Q_UNUSED(context)
+    if (verbose || type == QtFatalMsg) {
+        // Not by report(): nobody minds a line of the log that comes twice.
+        writeError(reportLine(QStringLiteral("libveyfmvfs"), message));
     }
 }
 
@@ -47,6 +49,7 @@ QByteArray reportLine(const QString& what, const QString& why)
 
 void report(const QString& what, const QString& why)
 {
+    Patience::notePrinted();
     writeError(reportLine(what, why));
 }
 
@@ -63,6 +66,7 @@ void reportBytes(const QString& before, const QByteArray& name, const QString& w
 
 void say(const QString& line)
 {
+    Patience::notePrinted();
     writeError((line + QLatin1Char('\n')).toLocal8Bit());
 }
 

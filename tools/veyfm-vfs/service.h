@@ -4,6 +4,7 @@
 #ifndef VEYFM_TOOL_SERVICE_H
 #define VEYFM_TOOL_SERVICE_H
 
+#include <QDBusMessage>
 #include <QString>
 #include <QVariantList>
 
@@ -13,12 +14,18 @@ namespace Tool {
 /// The bus name of the file manager service.
 QString serviceName();
 
+/// The time that the library gives the service to answer when it makes the tree.
+constexpr int probeMilliseconds = 1000;
+
 /// How the service stands. Looking does not start it.
 struct ServiceState
 {
-    bool bus = false;       ///< Whether there is a session bus.
-    bool installed = false; ///< Whether the bus can start the service.
+    bool bus = false;        ///< Whether there is a session bus.
+    bool busAnswers = false; ///< Whether that tells what it has.
+    bool installed = false;  ///< Whether the bus can start the service.
     bool running = false;
+    bool answers = false; ///< Whether one that runs answers.
+    uint processId = 0;   ///< Of one that runs.
 };
 
 ServiceState serviceState();
@@ -27,8 +34,26 @@ ServiceState serviceState();
 /// that runs but can't be started counts as missing, as it does for the library.
 QString whyNoService(const ServiceState& state);
 
-/// Starts the service where it does not run. Why it did not work, or empty.
-QString startService();
+/// Whether there is a service, and it does not answer.
+bool isServiceSilent();
+
+/// Why the service that stopped answering is of no use any more, and what helps; for a change
+/// that may come about all the same. @{
+QString whySilent();
+QString whySilentToChange();
+/// @}
+
+/// Has the library, and all that asks it, do without the service. Before the tree is made.
+void leaveService();
+
+/// Starts the service where it does not run. Why it did not work in that time, or empty.
+QString startService(int milliseconds = 3000);
+
+/// What the service answers as long as it lives, whatever else it does.
+QDBusMessage pingMessage();
+
+/// Whether somebody has answered, if only with an error.
+bool isAnswer(const QDBusMessage& reply);
 
 /// Both: why there is no service even after it was started, or empty.
 QString whyNoRunningService();

@@ -6,9 +6,9 @@
 #include "commandline.h"
 #include "interrupt.h"
 #include "mount/watchedjob.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
-#include "spinner.h"
 #include "vfs/vfs.h"
 
 #include <QAbstractEventDispatcher>
@@ -18,6 +18,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <optional>
 
 namespace VeyFM {
 namespace Tool {
@@ -52,7 +53,7 @@ bool runInterruptibly(const Invocation& invocation, const std::function<void()>&
     // The verbs have interrupts of their own, one at a time.
     Interrupt interrupt({SIGINT}, [] {});
     interrupt.setMessage(reportLine(invocation.verb().name, interrupted()));
-    const Waiting waiting(waitingForService());
+    const Asking asking(waitingForService());
     work();
     if (!interrupt.wasRequested()) {
         return true;
@@ -62,9 +63,20 @@ bool runInterruptibly(const Invocation& invocation, const std::function<void()>&
     return false;
 }
 
+/// Whether a place was opened that has its content from the service, which did not answer.
+bool hasMissedPlaces = false;
+
 int runWithTree(Invocation& invocation)
 {
-    return runInterruptibly(invocation, openTree) ? invocation.verb().run(invocation) : Failed;
+    if (!runInterruptibly(invocation, openTree)) {
+        return Failed;
+    }
+    const int exitCode = invocation.verb().run(invocation);
+    if (!hasMissedPlaces) {
+        return exitCode;
+    }
+    report(invocation.verb().name, whySilent());
+    return Failed;
 }
 
 int runWithNeeds(Invocation& invocation)
@@ -89,10 +101,15 @@ QString waitingForService()
 
 void openTree()
 {
+    const Patience patience;
     const VFS* vfs = VFS::ptr();
+    static std::optional<Asking> opening;
     QObject::connect(
-        vfs, &VFS::longTimeOperationStarted, vfs, [] { Spinner::begin(waitingForService()); });
-    QObject::connect(vfs, &VFS::longTimeOperationFinished, vfs, [] { Spinner::end(); });
+        vfs, &VFS::longTimeOperationStarted, vfs, [] { opening.emplace(waitingForService()); });
+    QObject::connect(vfs, &VFS::longTimeOperationFinished, vfs, [] {
+        hasMissedPlaces = hasMissedPlaces || isServiceSilent();
+        opening.reset();
+    });
 }
 
 int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))
@@ -104,19 +121,19 @@ int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))
     QString why;
     {
         const Waiting waiting(waitingForService());
-        why = whyNoService(serviceState());
-        if (why.isEmpty()) {
-            why = startService();
-        }
+        why = whyNoRunningService();
         if (why.isEmpty()) {
             openTree();
+        }
+        if (why.isEmpty() && Patience::isOver()) {
+            why = whySilent();
         }
     }
     if (!interrupt.wasRequested()) {
         if (why.isEmpty()) {
             exitCode = run(invocation);
         } else {
-            report(verb.name, why);
+            failWithoutService(invocation, why);
         }
     }
     if (interrupt.wasRequested()) {
@@ -127,8 +144,17 @@ int runWithService(Invocation& invocation, int (*run)(Invocation& invocation))
     return exitCode;
 }
 
+int failWithoutService(const Invocation& invocation, const QString& why)
+{
+    const QString hint = QStringLiteral("'veyfm-vfs status' shows how it stands");
+    report(
+        invocation.verb().name, why.contains(hint) ? why : QStringLiteral("%1; %2").arg(why, hint));
+    return Failed;
+}
+
 int runVerb(Invocation& invocation)
 {
+    Patience::setVerb(invocation.verb().name);
     const int exitCode = runWithNeeds(invocation);
     boundParting();
     return exitCode;
@@ -163,24 +189,30 @@ bool waitUntil(const QString& doing, int seconds, const std::function<bool()>& c
     if (wasInterrupted()) {
         return false;
     }
-    if (changed()) {
-        return true;
+    if (changed() || Patience::isOver()) {
+        return changed();
     }
     const Waiting waiting(doing);
+    const Heartbeat heartbeat;
     QEventLoop loop;
     QObject::connect(
         QAbstractEventDispatcher::instance(), &QAbstractEventDispatcher::aboutToBlock, &loop, [&] {
-            if (changed()) {
+            if (changed() || Patience::isOver()) {
                 loop.quit();
             }
         });
-    QTimer::singleShot(std::chrono::seconds(seconds), &loop, &QEventLoop::quit);
+    if (seconds > 0) {
+        QTimer::singleShot(std::chrono::seconds(seconds), &loop, &QEventLoop::quit);
+    }
     loop.exec();
     return changed();
 }
 
 QString whyNoNews(const QString& news, int seconds)
 {
+    if (Patience::isOver()) {
+        return whySilentToChange();
+    }
     return QStringLiteral("asked for, but the service told of no %1 within %2 s")
         .arg(news)
         .arg(seconds);

@@ -11,6 +11,8 @@
 
 #include <cstdlib>
 
+#include <signal.h>
+
 namespace {
 
 const QString prefix = QStringLiteral("org.veylabs.FileManager.");
@@ -23,6 +25,13 @@ QString compact(const QJsonArray& array)
 QJsonArray parsedArray(const QVariant& text)
 {
     return QJsonDocument::fromJson(text.toString().toUtf8()).array();
+}
+
+void stopIfToldTo(const QJsonObject& rule)
+{
+    if (rule[QStringLiteral("stop")].toBool()) {
+        ::raise(SIGSTOP);
+    }
 }
 
 } // namespace
@@ -50,6 +59,7 @@ void FakeService::load(const QJsonObject& script)
 QString FakeService::introspect(const QString& path) const
 {
     m_introspections.append(path);
+    stopIfToldTo(takeRule(QStringLiteral("Introspect ") + path));
     return m_contract.introspection(path);
 }
 
@@ -83,6 +93,7 @@ bool FakeService::handleMessage(const QDBusMessage& message, const QDBusConnecti
     if (rule.contains(QStringLiteral("exit"))) {
         std::_Exit(rule[QStringLiteral("exit")].toInt());
     }
+    stopIfToldTo(rule);
     const QJsonArray early = rule[QStringLiteral("signals")].toArray();
     for (const QJsonValue& signal : early) {
         emitSignal(signal[0].toString(), signal[1].toString(), signal[2].toArray());
@@ -97,7 +108,7 @@ bool FakeService::handleMessage(const QDBusMessage& message, const QDBusConnecti
     return true;
 }
 
-QJsonObject FakeService::takeRule(const QString& method)
+QJsonObject FakeService::takeRule(const QString& method) const
 {
     QJsonArray rules = m_rules[method].toArray();
     if (rules.isEmpty()) {

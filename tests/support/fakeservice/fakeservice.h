@@ -31,6 +31,8 @@
  *   {"delay": ms}               with any of these, or alone: later
  *   {"signals": [[interface, name, [arguments]], ...]}   emitted before the reply
  *   {"exit": code}              ends the process without a reply
+ *   {"stop": true}              stops the process (SIGSTOP); what is left of the rule follows when
+ *                               it goes on. Introspections take this one too, by "Introspect PATH"
  *   {"keep": true}              the rule is not used up
  *
  * What a service does of its own accord (the echo of notifyWatchers, the signals behind add,
@@ -60,7 +62,7 @@ public:
 
 private:
     bool control(const QDBusMessage& message);
-    QJsonObject takeRule(const QString& method);
+    QJsonObject takeRule(const QString& method) const;
     QJsonValue valueFor(const QString& method, const QJsonArray& arguments) const;
     void answer(const QDBusMessage& message, const QJsonObject& rule, const QJsonArray& arguments);
     void rememberMount(const QString& interface, const QJsonArray& arguments);
@@ -70,7 +72,7 @@ private:
     const Contract& m_contract;
     QDBusConnection m_bus;
     QJsonObject m_values;
-    QJsonObject m_rules;
+    mutable QJsonObject m_rules;
     bool m_echo = true;
     bool m_remember = false;
     QStringList m_calls;

@@ -7,6 +7,7 @@
 #include "ending.h"
 #include "jobs/job.h"
 #include "mount/descendants.h"
+#include "patience.h"
 #include "report.h"
 #include "session.h"
 #include "spinner.h"
@@ -47,7 +48,7 @@ Option jobTimeoutOption()
 {
     return {
         {QStringLiteral("timeout")},
-        QStringLiteral("Give up after so long without progress (default: 60; 0: never)"),
+        QStringLiteral("Give up after so long without progress (default: 60; 0: no bound)"),
         QStringLiteral("SECONDS"),
         {},
         true};
@@ -124,6 +125,7 @@ QString JobWatch::whyStopped() const
 JobResult JobWatch::run(Job& job, const QString& doing)
 {
     job.setDeleteOnFinish(false);
+    Patience::noteAsked();
     m_authenticator->beginJob();
     m_timedOut = false;
     if (wasInterrupted()) {

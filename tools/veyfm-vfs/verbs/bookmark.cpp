@@ -4,10 +4,10 @@
 #include "commandline.h"
 #include "describe.h"
 #include "locate.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
 #include "session.h"
-#include "spinner.h"
 #include "table.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
@@ -42,7 +42,7 @@ QList<Favourite> favourites()
 
 QString whyNoFavourites()
 {
-    const Waiting waiting(QStringLiteral("Reading the favourites"));
+    const Asking asking(QStringLiteral("Reading the favourites"));
     return whyNothing(
         {QStringLiteral("FavouritePlacesManager"), QStringLiteral("favouritePlaces"),
          QStringLiteral("a(ss)")});
@@ -112,7 +112,7 @@ int runAdd(Invocation& invocation)
         }
     }
     {
-        const Waiting waiting(QStringLiteral("Asking for the change"));
+        const AskingForChange asking;
         vfs->addFavouritePlace(place);
     }
     return waitForNews(invocation, name, [vfs, &place] { return vfs->hasFavouritePlace(place); });
@@ -149,7 +149,7 @@ int runRemove(Invocation& invocation)
         }
         const FavouritePlace place(found.name, found.entry.localPath());
         {
-            const Waiting waiting(QStringLiteral("Asking for the change"));
+            const AskingForChange asking;
             vfs->removeFavouritePlace(place);
         }
         const int code = waitForNews(

@@ -6,11 +6,11 @@
 #include "commandline.h"
 #include "describe.h"
 #include "mount/scanjob.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
 #include "service/smbbrowserproxy.h"
 #include "session.h"
-#include "spinner.h"
 #include "table.h"
 #include "vfs/vfs.h"
 
@@ -141,7 +141,7 @@ int print(Invocation& invocation, const Level& level)
 /// The level that the operands name.
 Level namedLevel(const Invocation& invocation)
 {
-    const Waiting waiting(QStringLiteral("Looking at the Samba network"));
+    const Asking asking(QStringLiteral("Looking at the Samba network"));
     const QStringList operands = invocation.operands();
     if (operands.isEmpty()) {
         return workgroups();
@@ -260,7 +260,7 @@ QVector<Verb> browseVerbs()
     rescan.mostOperands = 2;
     rescan.options = {timeoutOption()};
     rescan.options[0].description =
-        QStringLiteral("Wait so long for the end of the scan (default: 60)");
+        QStringLiteral("Wait so long for the end of the scan (default: 60; 0: no bound)");
     rescan.run = runRescan;
 
     return {

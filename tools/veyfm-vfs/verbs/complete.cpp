@@ -7,6 +7,7 @@
 #include "describe.h"
 #include "devices.h"
 #include "locate.h"
+#include "patience.h"
 #include "service/networkplacesmanagerproxy.h"
 #include "shown.h"
 #include "verbs/verbs.h"
@@ -303,6 +304,7 @@ void write(Output& output, const QString& record)
 
 int run(Invocation& invocation)
 {
+    const Patience patience;
     Output& output = invocation.output();
     const QString shell = invocation.value(QStringLiteral("shell"));
     if (!shell.isEmpty()) {

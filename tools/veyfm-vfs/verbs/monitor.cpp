@@ -75,12 +75,12 @@ bool livesFromService(const Entry& entry)
            entry.isSambaWorkgroupPlace() || entry.isSambaServerPlace();
 }
 
-/// Why the service sends no news, or empty. The tree was made and has tried to start it.
+/// Why the service sends no news, or empty. The tree was made and has given it time to start.
 QString whyNoNews()
 {
     const ServiceState state = serviceState();
     const QString why = whyNoService(state);
-    return why.isEmpty() && !state.running ? startService() : why;
+    return why.isEmpty() && !state.running ? startService(probeMilliseconds) : why;
 }
 
 /**

@@ -35,10 +35,9 @@ void print(Output& output, bool asJson, const UrlMount& mount)
 int run(Invocation& invocation)
 {
     const QString url = invocation.operands().constFirst();
-    Login login = readLogin(invocation);
     QString why = whyNotMountable(url);
     if (why.isEmpty()) {
-        why = whyNoUser(schemeOf(url), login.user);
+        why = whyNoUser(schemeOf(url), invocation.value(QStringLiteral("user")));
     }
     const int timeout = jobTimeout(invocation);
     if (why.isEmpty()) {
@@ -46,6 +45,7 @@ int run(Invocation& invocation)
     }
     UrlMount mount;
     if (why.isEmpty()) {
+        Login login = readLogin(invocation);
         if (login.user.isEmpty()) {
             login.user = userOf(url);
         }

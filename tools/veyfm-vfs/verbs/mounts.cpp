@@ -5,13 +5,13 @@
 #include "describe.h"
 #include "mount/mountinfo.h"
 #include "mount/networkmounts.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
 #include "service/fusemountsmanagerproxy.h"
 #include "service/networkmountsmanagerproxy.h"
 #include "session.h"
 #include "shown.h"
-#include "spinner.h"
 #include "table.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
@@ -56,7 +56,7 @@ int print(Invocation& invocation, const RegisteredMounts& registered)
 /// Reads what the service has. What can't be read is reported.
 RegisteredMounts readRegistered()
 {
-    const Waiting waiting(QStringLiteral("Reading the mounts"));
+    const Asking asking(QStringLiteral("Reading the mounts"));
     VFS* vfs = VFS::ptr();
     RegisteredMounts registered;
     registered.isKnown = true;

@@ -5,12 +5,12 @@
 #include "core/smburl.h"
 #include "describe.h"
 #include "mount/mounturl.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
 #include "service/networkplacesmanagerproxy.h"
 #include "session.h"
 #include "shown.h"
-#include "spinner.h"
 #include "table.h"
 #include "verbs/browse.h"
 #include "verbs/verbs.h"
@@ -35,7 +35,7 @@ QString pathBelow(const Entry& place, const QString& name)
 
 QString whyNoBookmarks()
 {
-    const Waiting waiting(QStringLiteral("Reading the network bookmarks"));
+    const Asking asking(QStringLiteral("Reading the network bookmarks"));
     return whyNothing(
         {QStringLiteral("NetworkPlacesManager"), QStringLiteral("networkPlaces"),
          QStringLiteral("a(sss)")});
@@ -119,12 +119,15 @@ int runAdd(Invocation& invocation)
     }
     bool accepted = false;
     {
-        const Waiting waiting(QStringLiteral("Asking for the change"));
+        const AskingForChange asking;
         accepted = manager->addNetworkPlace(place);
     }
     if (!accepted) {
         if (!wasInterrupted()) {
-            report(name, QStringLiteral("the service did not accept the bookmark"));
+            report(
+                name, Patience::isOver()
+                          ? whySilentToChange()
+                          : QStringLiteral("the service did not accept the bookmark"));
         }
         return Failed;
     }
@@ -164,7 +167,7 @@ int runRemove(Invocation& invocation)
             continue;
         }
         {
-            const Waiting waiting(QStringLiteral("Asking for the change"));
+            const AskingForChange asking;
             manager->removeNetworkPlace(place);
         }
         const int code = waitForNews(invocation, operand, [manager, &place] {

@@ -3,6 +3,7 @@
 
 #include "commandline.h"
 #include "devices.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
 #include "service/fusemountsmanagerproxy.h"
@@ -10,7 +11,6 @@
 #include "service/networkplacesmanagerproxy.h"
 #include "service/smbbrowserproxy.h"
 #include "session.h"
-#include "spinner.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
 
@@ -38,7 +38,7 @@ Question question(const char* interface, const char* method, const char* signatu
 QList<Holding> holdings()
 {
     VFS* vfs = VFS::ptr();
-    const Waiting waiting(QStringLiteral("Asking what the service holds"));
+    const Asking asking(QStringLiteral("Asking what the service holds"));
     QList<Holding> all;
     const auto add = [&all](Holding holding) {
         if (wasInterrupted()) {
@@ -78,7 +78,9 @@ int print(Invocation& invocation, const ServiceState& state, const QList<Holding
     QByteArray lines;
     for (const Holding& holding : all) {
         if (!holding.why.isEmpty()) {
-            report(QLatin1String(holding.label), holding.why);
+            if (exitCode == Done || !Patience::isOver()) {
+                report(QLatin1String(holding.label), holding.why);
+            }
             exitCode = Failed;
         }
         counts.insert(
@@ -95,6 +97,9 @@ int print(Invocation& invocation, const ServiceState& state, const QList<Holding
             {QStringLiteral("service"), serviceName()},
             {QStringLiteral("installed"), state.installed},
             {QStringLiteral("running"), state.running}};
+        if (state.running) {
+            object.insert(QStringLiteral("answers"), state.answers);
+        }
         if (!all.isEmpty()) {
             object.insert(QStringLiteral("holds"), counts);
         }
@@ -109,9 +114,14 @@ int print(Invocation& invocation, const ServiceState& state, const QList<Holding
     output.write("service: " + serviceName().toLatin1() + '\n');
     output.write("installed: " + yesNo(state.installed));
     output.write("running: " + yesNo(state.running));
+    if (state.running && !state.answers) {
+        output.write(QByteArrayLiteral("answers: no\n"));
+    }
     output.write(lines);
     return exitCode;
 }
+
+bool hasPrinted = false;
 
 int printWithHoldings(Invocation& invocation)
 {
@@ -119,16 +129,27 @@ int printWithHoldings(Invocation& invocation)
     if (wasInterrupted()) {
         return Failed;
     }
-    return print(invocation, {true, true, true}, all);
+    hasPrinted = true;
+    ServiceState state;
+    state.bus = state.busAnswers = state.installed = state.running = true;
+    state.answers = !Patience::isOver();
+    return print(invocation, state, all);
 }
 
 int run(Invocation& invocation)
 {
-    const ServiceState state = serviceState();
+    ServiceState state = serviceState();
     const QString why = whyNoService(state);
     // Looking is no reason to start it.
     if (why.isEmpty() && state.running) {
-        return runWithService(invocation, printWithHoldings);
+        const int exitCode = runWithService(invocation, printWithHoldings);
+        if (hasPrinted || wasInterrupted()) {
+            return exitCode;
+        }
+        // It has stopped since.
+        state.answers = false;
+        print(invocation, state, {});
+        return Failed;
     }
     print(invocation, state, {});
     if (why.isEmpty()) {

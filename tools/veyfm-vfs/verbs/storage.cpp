@@ -5,10 +5,10 @@
 #include "describe.h"
 #include "devices.h"
 #include "jobs/job.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
 #include "session.h"
-#include "spinner.h"
 #include "table.h"
 #include "verbs/verbs.h"
 #include "vfs/vfs.h"
@@ -20,14 +20,14 @@ namespace {
 
 QList<Device> readDevices()
 {
-    const Waiting waiting(QStringLiteral("Reading the storage devices"));
+    const Asking asking(QStringLiteral("Reading the storage devices"));
     return allDevices();
 }
 
 /// Why the service lists no devices, or empty.
 QString whyNoDevices()
 {
-    const Waiting waiting(QStringLiteral("Reading the storage devices"));
+    const Asking asking(QStringLiteral("Reading the storage devices"));
     return whyNothing(
         {QStringLiteral("StoragePlacesManager"), QStringLiteral("availableStoragePlaces"),
          QStringLiteral("a(sbbbssssi)")});
@@ -188,7 +188,7 @@ int runInfo(Invocation& invocation)
         StorageDeviceInfo info;
         QString why;
         {
-            const Waiting waiting(QStringLiteral("Asking for the details of the device"));
+            const Asking asking(QStringLiteral("Asking for the details of the device"));
             info = VFS::ptr()->storageDeviceInfo(device.place);
             if (isEmpty(info) && !wasInterrupted()) {
                 why = whyNothing(
@@ -239,6 +239,7 @@ int runJobs(Invocation& invocation, MakeJob makeJob, const QString& doing)
         }
         {
             const Waiting waiting(doing);
+            const Heartbeat heartbeat;
             Job* job = (VFS::ptr()->*makeJob)(entry);
             QObject::connect(job, &Job::finished, job, [&finished, &why](Job* ended) {
                 finished = true;
@@ -249,7 +250,14 @@ int runJobs(Invocation& invocation, MakeJob makeJob, const QString& doing)
             });
             job->exec();
         }
-        if (!finished || wasInterrupted()) {
+        if (wasInterrupted()) {
+            return Failed;
+        }
+        if (Patience::isOver()) {
+            report(device.name, whySilentToChange());
+            return Failed;
+        }
+        if (!finished) {
             return Failed;
         }
         if (!why.isEmpty()) {

@@ -12,6 +12,7 @@
 #include "mount/sharejob.h"
 #include "mount/urlmount.h"
 #include "mount/watchedjob.h"
+#include "patience.h"
 #include "report.h"
 #include "service.h"
 #include "session.h"
@@ -181,17 +182,21 @@ int run(Invocation& invocation)
     const int timeout = jobTimeout(invocation);
     QString why;
     const QString stopped = askService(invocation.verb().name, timeout, [&why] {
-        openTree();
         why = whyNoRunningService();
+        if (why.isEmpty()) {
+            openTree();
+        }
+        if (why.isEmpty() && Patience::isOver()) {
+            why = whySilent();
+        }
     });
     if (!stopped.isEmpty()) {
-        why = stopped;
-    }
-    if (!why.isEmpty()) {
-        report(invocation.verb().name, why);
+        report(invocation.verb().name, stopped);
         return Failed;
     }
-    const Login login = readLogin(invocation);
+    if (!why.isEmpty()) {
+        return failWithoutService(invocation, why);
+    }
     Output& output = invocation.output();
     JsonArray json(output);
     int exitCode = Done;
@@ -206,7 +211,7 @@ int run(Invocation& invocation)
             outcome.why = located.why;
         }
         if (outcome.why.isEmpty()) {
-            outcome = Update(shown, login, timeout).run(located.entry);
+            outcome = Update(shown, readLogin(invocation), timeout).run(located.entry);
         }
         if (!outcome.why.isEmpty()) {
             report(shown, outcome.why);
