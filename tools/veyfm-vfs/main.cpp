@@ -11,6 +11,7 @@
 #include "vfs/vfs.h"
 
 #include <QCoreApplication>
+#include <QEvent>
 
 #include <signal.h>
 
@@ -29,5 +30,8 @@ int main(int argc, char* argv[])
         VeyFM::Tool::leaveService();
     }
     VeyFM::VFS::setServiceProbe(VeyFM::Tool::probeMilliseconds);
-    return VeyFM::Tool::runCommandLine(VeyFM::Tool::wordsOf(argv + 1));
+    const int exitCode = VeyFM::Tool::runCommandLine(VeyFM::Tool::wordsOf(argv + 1));
+    // What was left to the event loop to delete, which ran for as long as a verb waited at most.
+    QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+    return exitCode;
 }
