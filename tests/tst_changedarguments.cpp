@@ -4,14 +4,20 @@
 // A slot of the host changes and destroys what the host has just handed over by reference. What
 // was asked is answered as if it had not; AddressSanitizer sees who still looks at what is gone.
 
+#include "jobs/job.h"
+#include "jobs/updatesmbentryjob.h"
 #include "service/smbbrowserproxy.h"
 #include "support/makeentry.h"
+#include "support/scriptedauthenticator.h"
 #include "support/vfstest.h"
 #include "watch/inotifywatcher.h"
 
+#include <QSharedPointer>
+#include <QSignalSpy>
 #include <QTemporaryDir>
 
 #include <functional>
+#include <memory>
 
 using namespace VeyFM;
 
@@ -97,6 +103,8 @@ private Q_SLOTS:
     void whileAWatchBegins();
     void whileLinksAreTold();
     void whileARescanBegins();
+    void whileAJobStarts_data();
+    void whileAJobStarts();
     void cleanupTestCase();
 
 private:
@@ -164,6 +172,7 @@ private:
 };
 
 Q_DECLARE_METATYPE(std::function<QString(bool)>)
+Q_DECLARE_METATYPE(std::function<Job*()>)
 
 void ChangedArgumentsTest::initTestCase()
 {
@@ -386,6 +395,41 @@ void ChangedArgumentsTest::whileARescanBegins()
         service->takeCalls().filter(u"rescan"_s),
         QStringList(
             {u"SmbBrowser.rescanWorkgroup[\"W\"]"_s, u"SmbBrowser.rescanHost[\"h1\",\"W\"]"_s}));
+}
+
+void ChangedArgumentsTest::whileAJobStarts_data()
+{
+    QTest::addColumn<std::function<Job*()>>("make");
+    VFS* const v = vfs;
+    const Entry device = makeEntry("Pending/x", "", TypeUsbDiskStoragePlace);
+    const auto row = [](const char* name, const std::function<Job*()>& make) {
+        QTest::newRow(name) << make;
+    };
+    row("mount", [v, device] { return v->mount(device); });
+    row("unmount", [v, device] { return v->unmount(device); });
+    row("eject", [v, device] { return v->eject(device); });
+    row("update a share", [] {
+        return new UpdateSmbEntryJob(
+            QSharedPointer<ScriptedAuthenticator>::create(),
+            makeEntry("Pending/x", "", TypeSambaSharePlace));
+    });
+}
+
+void ChangedArgumentsTest::whileAJobStarts()
+{
+    QFETCH(std::function<Job*()>, make);
+    arm();
+    std::unique_ptr<Job> job(make());
+    const QSignalSpy finished(job.get(), &Job::finished);
+    m_filler.onFill = [this, &job] {
+        fill();
+        job.reset();
+    };
+    service->takeCalls();
+    job->start();
+    QVERIFY(!job);
+    QCOMPARE(finished.count(), 0);
+    QCOMPARE(service->takeCalls().filter(u"StoragePlace"_s), QStringList());
 }
 
 void ChangedArgumentsTest::cleanupTestCase()

@@ -7,6 +7,8 @@
 #include "service/smbbrowserproxy.h"
 #include "vfs/vfs.h"
 
+#include <QPointer>
+
 namespace VeyFM {
 
 UpdateSmbEntryJob::UpdateSmbEntryJob(
@@ -53,7 +55,13 @@ void UpdateSmbEntryJob::start()
 
 void UpdateSmbEntryJob::updateShare()
 {
-    if (!m_smbEntry.localPath().isEmpty()) {
+    // May open the place of the server, which is told of, and the job be deleted in there.
+    const QPointer<UpdateSmbEntryJob> alive(this);
+    const bool isAttached = !m_smbEntry.localPath().isEmpty();
+    if (!alive) {
+        return;
+    }
+    if (isAttached) {
         finishedOk();
         return;
     }

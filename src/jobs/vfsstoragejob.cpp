@@ -7,6 +7,8 @@
 #include "service/storageplacesmanagerproxy.h"
 #include "vfs/vfs.h"
 
+#include <QPointer>
+
 namespace VeyFM {
 
 VFSStorageJob::VFSStorageJob(
@@ -29,7 +31,12 @@ void VFSStorageJob::run(Factory makeJob, const QString& refusal)
         finishedWithError(1, tr("Can't get service interface"));
         return;
     }
+    // May open Storage devices, which is told of, and the job be deleted in there.
+    const QPointer<VFSStorageJob> alive(this);
     const StoragePlace place = VFS::ptr()->storagePlace(m_entry);
+    if (!alive) {
+        return;
+    }
     Job* const job = (m_storagePlacesManager->*makeJob)(place);
     // Made without a parent; a request that is still under way goes with this job.
     job->setParent(this);
