@@ -26,6 +26,7 @@ private Q_SLOTS:
     void deviceAddedAgainElsewhere();
     void deviceMountedAndUnmounted();
     void deviceUpdatedAndRemoved();
+    void deviceRemovedAndRead();
     void favouriteRemovedAndAddedAgain();
     void favouriteAddedAndRemoved();
     void bookmarkAddedAndRemoved();
@@ -184,6 +185,21 @@ void NestedNewsTest::deviceUpdatedAndRemoved()
             {u"mountState A"_s, u"reset Storage devices/sda"_s, u"removed A"_s,
              u"deleted Storage devices/sda=/media/a"_s}));
     QCOMPARE(childPaths(u"Storage devices"_s), QStringList());
+}
+
+void NestedNewsTest::deviceRemovedAndRead()
+{
+    news(u"StoragePlacesManager"_s, u"storagePlaceAdded"_s, arguments(device(u"sdc"_s, u"C"_s)));
+    // Another process asks for all views to be read again. What they read then is not the past.
+    nest(vfs, &VFS::storagePlaceRemoved, [this] {
+        vfs->notifyAllWatchers(
+            EntryList(QList<Entry>{vfs->storageDevicesEntry(), makeEntry("/x", "/x", TypeDir)}));
+    });
+    QCOMPARE(
+        storageTold(u"Removed"_s, device(u"sdc"_s, u"C"_s)),
+        QStringList(
+            {u"removed C"_s, u"deleted Storage devices/sdc"_s, u"reset Storage devices"_s,
+             u"reset /x=/x"_s}));
 }
 
 void NestedNewsTest::favouriteRemovedAndAddedAgain()

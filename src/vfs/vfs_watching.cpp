@@ -36,7 +36,11 @@ void VFS::notifyAllWatchers(const EntryList& entries)
 
 void VFSPrivate::_q_serviceNotifyWatchers(const EntryList& entries)
 {
-    q->directNotifyWatchers(entries, true);
+    news.tell([this, entries] {
+        for (const Entry& entry : entries) {
+            news.then([this, entry] { entryWatcher.entryChangedNotify(entry, true); });
+        }
+    });
 }
 
 bool VFSPrivate::addEntryToPlace(const Entry& entry, const Entry& place, bool notify)
