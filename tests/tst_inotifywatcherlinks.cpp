@@ -14,6 +14,7 @@ class TestInotifyWatcherLinks : public QObject
 private Q_SLOTS:
     void linkAndTarget();
     void twoLinks();
+    void orderOfLinks();
     void relativeLink();
     void linkOfLink();
     void linkToItself();
@@ -63,6 +64,21 @@ void TestInotifyWatcherLinks::twoLinks()
     QVERIFY(!scene.isLinkRegistered("link1"));
     QVERIFY(scene.removeDir("target/sub"));
     QCOMPARE(scene.processedLog(), lines({"deleted target|sub", "deleted link2|sub"}));
+}
+
+void TestInotifyWatcherLinks::orderOfLinks()
+{
+    WatchScene scene;
+    QVERIFY(scene.makeDir("target"));
+    for (const char* link : {"link1", "link2", "link3"}) {
+        QVERIFY(scene.makeLink("target", link) && scene.add(link));
+    }
+    QVERIFY(scene.makeDir("target/sub"));
+    const QStringList byEvent = scene.processedLog().mid(1);
+    QCOMPARE(byEvent.size(), 3);
+    // Whatever the order is, it is one.
+    scene.watcher->notifySymlinks("pathCreated", scene.path("target"), QStringLiteral("sub"));
+    QCOMPARE(scene.takeLog(), byEvent);
 }
 
 void TestInotifyWatcherLinks::relativeLink()

@@ -34,17 +34,7 @@ constexpr uint32_t WatchMask = IN_ATTRIB | IN_CLOSE_WRITE | IN_MOVED_FROM | IN_M
 
 constexpr int DeletedLinkGraceMs = 500;
 
-struct PathSignal
-{
-    void (InotifyWatcher::*emitter)(const QString&, const QString&);
-    const char* name;
-};
-
-constexpr PathSignal Created{&InotifyWatcher::pathCreated, "pathCreated"};
-constexpr PathSignal Deleted{&InotifyWatcher::pathDeleted, "pathDeleted"};
-constexpr PathSignal Changed{&InotifyWatcher::pathChanged, "pathChanged"};
-constexpr PathSignal AttributesChanged{
-    &InotifyWatcher::pathAttributesChanged, "pathAttributesChanged"};
+using PathSignal = void (InotifyWatcher::*)(const QString&, const QString&);
 
 // Most watched paths are no links, which one readlink() tells more cheaply than any stat.
 bool isSymLink(const QString& path, const LocalBytes& localPath)
@@ -117,8 +107,8 @@ private:
     void childAppeared(uint32_t bits);
     void childWentAway(uint32_t bits);
     void selfWentAway(uint32_t bits);
-    void tellOfChild(const PathSignal& signal);
-    void tell(const PathSignal& signal, const PathSignal* signalToLinks);
+    void tellOfChild(PathSignal signal);
+    void tell(PathSignal signal, PathSignal signalToLinks);
     void tellNextLink();
     void tellDeletedLink();
     void forgetDeletedLink();
@@ -137,7 +127,7 @@ private:
     QString fileName;
     uint32_t effects = 0;
     // What the links to that path are to be told, and which of them still are.
-    const PathSignal* linkSignal = nullptr;
+    PathSignal linkSignal = nullptr;
     bool areLinksDue = false;
     QStringList linksToTell;
     // The verdict at hand: which links are to be told deleted, and forgotten then.
@@ -383,9 +373,9 @@ void InotifyWatcherPrivate::tellEffect()
     } else if (const uint32_t selfGone = takeBits(IN_DELETE_SELF | IN_MOVE_SELF)) {
         selfWentAway(selfGone);
     } else if (takeBits(IN_CLOSE_WRITE)) {
-        tellOfChild(Changed);
+        tellOfChild(&InotifyWatcher::pathChanged);
     } else if (takeBits(IN_ATTRIB)) {
-        tellOfChild(AttributesChanged);
+        tellOfChild(&InotifyWatcher::pathAttributesChanged);
     } else {
         effects = 0;
     }
@@ -405,7 +395,7 @@ void InotifyWatcherPrivate::childAppeared(uint32_t bits)
             }
         }
     }
-    tellOfChild(Created);
+    tellOfChild(&InotifyWatcher::pathCreated);
 }
 
 void InotifyWatcherPrivate::childWentAway(uint32_t bits)
@@ -418,7 +408,7 @@ void InotifyWatcherPrivate::childWentAway(uint32_t bits)
             return;
         }
     }
-    tell(Deleted, &Deleted);
+    tellOfChild(&InotifyWatcher::pathDeleted);
 }
 
 void InotifyWatcherPrivate::selfWentAway(uint32_t bits)
@@ -430,45 +420,45 @@ void InotifyWatcherPrivate::selfWentAway(uint32_t bits)
     q->removePath(path, true);
     // The other way round than everywhere else: links are told of the loss of their target
     // itself, and for them that is a change.
-    tell(Deleted, fileName.isEmpty() ? &Changed : nullptr);
+    tell(&InotifyWatcher::pathDeleted, fileName.isEmpty() ? &InotifyWatcher::pathChanged : nullptr);
 }
 
 // Links are told of what happens to a child of their target, not of what happens to the target.
-void InotifyWatcherPrivate::tellOfChild(const PathSignal& signal)
+void InotifyWatcherPrivate::tellOfChild(PathSignal signal)
 {
-    tell(signal, fileName.isEmpty() ? nullptr : &signal);
+    tell(signal, fileName.isEmpty() ? nullptr : signal);
 }
 
-void InotifyWatcherPrivate::tell(const PathSignal& signal, const PathSignal* signalToLinks)
+void InotifyWatcherPrivate::tell(PathSignal signal, PathSignal signalToLinks)
 {
     linkSignal = signalToLinks;
     areLinksDue = signalToLinks != nullptr;
     // Copies, which stay while an event loop of the slot goes on with the next event.
     const QString toldPath = path;
     const QString toldName = fileName;
-    Q_EMIT(q->*signal.emitter)(toldPath, toldName);
+    Q_EMIT(q->*signal)(toldPath, toldName);
 }
 
 void InotifyWatcherPrivate::tellNextLink()
 {
-    const QString link = linksToTell.takeLast();
+    const QString link = linksToTell.takeFirst();
     if (!deletedSymlinks.contains(link)) {
         const QString toldName = fileName;
-        Q_EMIT(q->*linkSignal->emitter)(link, toldName);
+        Q_EMIT(q->*linkSignal)(link, toldName);
     }
 }
 
 void InotifyWatcherPrivate::tellDeletedLink()
 {
-    path = linksToDelete.takeLast();
+    path = linksToDelete.takeFirst();
     fileName.clear();
-    tell(Deleted, &Changed);
+    tell(&InotifyWatcher::pathDeleted, &InotifyWatcher::pathChanged);
 }
 
 // Not before all are told of the deletions.
 void InotifyWatcherPrivate::forgetDeletedLink()
 {
-    const QString link = linksToForget.takeLast();
+    const QString link = linksToForget.takeFirst();
     q->removePath(link, false);
     deletedSymlinks.remove(link);
     Q_EMIT q->pathUnregistered(link);
