@@ -24,11 +24,41 @@ void inThread(Work work)
     std::thread(work).join();
 }
 
+// What another thread works out meanwhile.
 template <typename Result>
-bool isReady(const std::future<Result>& future, std::chrono::milliseconds within = patience)
+class Task
 {
-    return future.wait_for(within) == std::future_status::ready;
-}
+public:
+    Task() = default;
+    Q_DISABLE_COPY(Task)
+    ~Task()
+    {
+        if (m_thread.joinable()) {
+            m_thread.join();
+        }
+    }
+
+    template <typename Work>
+    void start(Work work)
+    {
+        m_thread = std::thread([this, work] { m_promise.set_value(work()); });
+    }
+
+    bool isReady(std::chrono::milliseconds within = patience) const
+    {
+        return m_result.wait_for(within) == std::future_status::ready;
+    }
+
+    Result get()
+    {
+        return m_result.get();
+    }
+
+private:
+    std::promise<Result> m_promise;
+    std::future<Result> m_result = m_promise.get_future();
+    std::thread m_thread;
+};
 
 } // namespace
 
@@ -111,18 +141,18 @@ void TestVFSPlaceBaseThreads::answersWithoutWaitingForASlot()
     const Entry top = base.createPlace(u"Top"_s, TypePlace, QString());
     const Entry samba = base.createPendingPlace(u"Samba"_s, TypeSambaNetworkPlace, &filler, "fill");
     base.createPendingPlace(u"Other"_s, TypePlace, &filler, "fillOtherwise");
-    std::future<bool> other;
+    Task<bool> other;
     bool answered = false;
     filler.work = [&](const QString&) {
         // The lock of the store is held, as during a call to the service.
-        other = std::async(std::launch::async, [&] {
+        other.start([&] {
             return base.hasPlace(u"Top"_s) && base.hasPlace(top) && !base.hasPlace(u"None"_s) &&
                    !base.hasPlace(u"Other/x"_s) && !base.isPathContainsPlace(u"/Top"_s) &&
                    base.placeOrderIndex(makeDir(u"/a"_s), top) == 0 &&
                    base.placeOrderIndex(top, makeDir(u"/a"_s)) == 0 &&
                    base.placeOrderIndex(top, Entry()) == 0;
         });
-        answered = isReady(other);
+        answered = other.isReady();
     };
     base.childEntries(samba);
     QVERIFY(answered);
@@ -136,13 +166,11 @@ void TestVFSPlaceBaseThreads::armsWithoutWaitingForASlot()
     PlaceFiller filler;
     const Entry samba = base.createPendingPlace(u"Samba"_s, TypeSambaNetworkPlace, &filler, "fill");
     const Entry top = base.createPlace(u"Top"_s, TypePlace, QString());
-    std::future<Entry> other;
+    Task<Entry> other;
     bool armed = false;
     bool returned = true;
     filler.work = [&](const QString&) {
-        other = std::async(std::launch::async, [&] {
-            return base.createPendingPlace(u"Top"_s, TypePlace, &filler, "fill");
-        });
+        other.start([&] { return base.createPendingPlace(u"Top"_s, TypePlace, &filler, "fill"); });
         QElapsedTimer timer;
         timer.start();
         while (!armed && timer.elapsed() < 30000) {
@@ -150,7 +178,7 @@ void TestVFSPlaceBaseThreads::armsWithoutWaitingForASlot()
             std::this_thread::yield();
         }
         // The record is in, while the place has to wait.
-        returned = isReady(other, 0ms);
+        returned = other.isReady(0ms);
     };
     base.childEntries(samba);
     QVERIFY(armed);
@@ -163,13 +191,13 @@ void TestVFSPlaceBaseThreads::waitsForASlotOtherwise()
     VFSPlaceBase base;
     PlaceFiller filler;
     const Entry samba = base.createPendingPlace(u"Samba"_s, TypeSambaNetworkPlace, &filler, "fill");
-    std::future<int> children;
-    std::future<Entry> below;
+    Task<int> children;
+    Task<Entry> below;
     bool returned = true;
     filler.work = [&](const QString& path) {
-        children = std::async(std::launch::async, [&] { return base.childEntries(samba).size(); });
-        below = std::async(std::launch::async, [&] { return base.placeEntry(u"Samba/WG"_s); });
-        returned = isReady(children, 50ms) || isReady(below, 50ms);
+        children.start([&] { return base.childEntries(samba).size(); });
+        below.start([&] { return base.placeEntry(u"Samba/WG"_s); });
+        returned = children.isReady(50ms) || below.isReady(50ms);
         base.addEntryToPlace(base.createPlace(path + u"/WG"_s, TypePlace, QString()), samba);
     };
     base.childEntries(samba);
@@ -188,13 +216,13 @@ void TestVFSPlaceBaseThreads::losesAStrayRecordByDestruction()
         PlaceFiller filler;
         const Entry samba = base.createPendingPlace(u"Samba"_s, TypePlace, &filler, "fill");
         const Entry stray = makePlace(u"Stray"_s);
-        std::future<void> other;
+        Task<Entry> other;
         bool destroyed = true;
         filler.work = [&](const QString&) {
-            other = std::async(std::launch::async, [&] {
-                base.createPendingPlace(u"Stray"_s, TypePlace, &filler, "fillOtherwise");
+            other.start([&] {
+                return base.createPendingPlace(u"Stray"_s, TypePlace, &filler, "fillOtherwise");
             });
-            isReady(other, std::chrono::milliseconds(1 << attempt));
+            other.isReady(std::chrono::milliseconds(1 << attempt));
             destroyed = base.destroyPlace(stray) || base.hasPlace(stray);
         };
         base.childEntries(samba);
