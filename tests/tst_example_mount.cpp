@@ -33,6 +33,7 @@ private Q_SLOTS:
     void asksOnceForWhatTheJobAsksTwice();
     void interruptBringsTheEchoBack();
     void takesWhatIsMounted();
+    void takesWhatIsMountedForAnotherUser();
     void showsEachFolderOfAServer();
     void asksForEachHostByItself();
     void asksInOtherWords();
@@ -130,6 +131,27 @@ void ExampleMountTest::takesWhatIsMounted()
     const auto example = run(QStringLiteral("sftp://anna@host/letters"));
     QCOMPARE(example->waitForEnd(), 0);
     QCOMPARE(example->output(), QByteArray("SFTP/anna@host/letters/first\n"));
+}
+
+void ExampleMountTest::takesWhatIsMountedForAnotherUser()
+{
+    tool->expect(asks); // As nobody in particular, to learn the name.
+    const QByteArray directory = scene.path("").toUtf8() + "home/.vey-fm-vfs/sftp/anna@host";
+    service->setValue(
+        QStringLiteral("FuseMountsManager.mounts"),
+        object(R"({"sftp://anna@host/": ")" + directory + R"("})"));
+    service->setValue(
+        QStringLiteral("NetworkMountsManager.mounts"),
+        object(R"({"sftp://anna@host/": ["SFTP/anna@host", ")" + directory + R"(", 4003]})"));
+    const auto example = run(QStringLiteral("sftp://host/letters"));
+    QVERIFY2(example->waitFor("User on host []: "), example->output().constData());
+    example->type("anna\n");
+    QVERIFY(example->waitFor("Password: "));
+    example->type("right\n");
+    QCOMPARE(example->waitForEnd(), 0);
+    QVERIFY2(
+        example->output().endsWith("SFTP/anna@host/letters/first\n"),
+        example->output().constData());
 }
 
 void ExampleMountTest::showsEachFolderOfAServer()

@@ -13,6 +13,7 @@
 #include <VeyFM/VFS>
 
 #include <QCoreApplication>
+#include <QMap>
 #include <QTextStream>
 #include <QTimer>
 #include <QUrl>
@@ -42,6 +43,18 @@ bool isOfOneServer(const QString& url, const QString& other)
 {
     // The user may be another one than the URL began with.
     return QUrl(url).adjusted(QUrl::RemoveUserInfo) == QUrl(other).adjusted(QUrl::RemoveUserInfo);
+}
+
+// The mount that the path of a job leads into. Its user is the one that was taken in the end.
+VeyFM::Entry mountOf(const QString& rootUrl, const QString& path)
+{
+    const QMap<QString, VeyFM::Entry> mounts = VeyFM::VFS::ptr()->networkMountsManager()->mounts();
+    for (auto it = mounts.cbegin(); it != mounts.cend(); ++it) {
+        if (isOfOneServer(it.key(), rootUrl) && path.startsWith(it->path() + QLatin1Char('/'))) {
+            return *it;
+        }
+    }
+    return VeyFM::Entry();
 }
 
 VeyFM::Entry entryBelow(const VeyFM::Entry& mount, const QString& relativePath)
@@ -80,15 +93,6 @@ int main(int argc, char** argv)
     QObject::connect(&job, &VeyFM::Job::finished, &app, &QCoreApplication::quit);
     bool finished = false;
     QObject::connect(&job, &VeyFM::Job::finished, &app, [&finished] { finished = true; });
-    // What is mounted newly is announced under the user that was taken in the end.
-    VeyFM::VFS* const vfs = VeyFM::VFS::ptr();
-    QString mountedUrl = rootUrl;
-    QObject::connect(
-        vfs, &VeyFM::VFS::fuseMountAdded, &app, [&mountedUrl, &rootUrl](const QString& added) {
-            if (isOfOneServer(added, rootUrl)) {
-                mountedUrl = added;
-            }
-        });
     job.start();
 
     if (!finished) {
@@ -106,7 +110,10 @@ int main(int argc, char** argv)
     if (job.error() != 0) {
         return fail(job.errorString());
     }
-    const VeyFM::Entry mount = vfs->networkMountsManager()->mounts().value(mountedUrl);
+    const VeyFM::Entry mount = mountOf(rootUrl, job.path());
+    if (mount.isNull()) {
+        return fail(QStringLiteral("the mount is gone"));
+    }
     const VeyFM::Entry entry = entryBelow(mount, VeyFM::MountPaths::mountRootRelativePath(url));
     return entry.exists() ? list(entry) : fail(QStringLiteral("the server has no such folder"));
 }
