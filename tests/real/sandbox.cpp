@@ -128,6 +128,11 @@ QString Sandbox::skipReason()
     return reason;
 }
 
+bool Sandbox::hasVersion6()
+{
+    return QFile::exists(QStringLiteral("/proc/net/if_inet6"));
+}
+
 QString Sandbox::home(const SandboxAccount& account)
 {
     return directory() + QStringLiteral("/home/") + QString::fromLatin1(account.name);

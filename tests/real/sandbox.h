@@ -83,6 +83,9 @@ public:
     static QString skipReason();
     /// @}
 
+    /// Whether ::1 is a host here.
+    static bool hasVersion6();
+
     /// The home of an account.
     static QString home(const SandboxAccount& account);
 

@@ -31,11 +31,6 @@ QString askedForKey()
 const QString askedInOtherWords =
     QStringLiteral("retry [sftp  other.test ] Access denied|(alice@other.test) Password: |alice");
 
-bool hasVersion6()
-{
-    return QFile::exists(QStringLiteral("/proc/net/if_inet6"));
-}
-
 } // namespace
 
 /// SFTP mounts from Debian's OpenSSH server, through Debian's sshfs.
@@ -339,7 +334,7 @@ void RealSftpTest::givenUpAtAPassphrase()
 
 void RealSftpTest::addressOfVersion6()
 {
-    if (!hasVersion6()) {
+    if (!Sandbox::hasVersion6()) {
         QSKIP("no IPv6 here");
     }
     KnownHosts::add("::1");
@@ -359,7 +354,7 @@ int main(int argc, char** argv)
     sandbox.addServer(
         std::make_unique<SshServer>(Sandbox::otherHost, SshServer::KeyboardInteractive));
     sandbox.addServer(std::make_unique<SshServer>(Sandbox::keyHost, SshServer::Key));
-    if (hasVersion6()) {
+    if (Sandbox::hasVersion6()) {
         sandbox.addServer(std::make_unique<SshServer>("::1"));
     }
     return sandbox.run([&] { return runSandboxTests<RealSftpTest>(argc, argv); });

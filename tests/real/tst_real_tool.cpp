@@ -21,6 +21,7 @@ private Q_SLOTS:
     void keyRefused();
     void wrongPasswords();
     void otherUser();
+    void addressOfVersion6();
     void cannotConnect_data();
     void cannotConnect();
     void otherPrompts();
@@ -185,6 +186,28 @@ void RealToolTest::otherUser()
     const QString name = mountDir(u"/sftp/bob@server.test~/name.txt"_s);
     QVERIFY(session->output().endsWith(name.toLatin1() + '\n'));
     QCOMPARE(fileContents(name), QByteArray("bob"));
+}
+
+void RealToolTest::addressOfVersion6()
+{
+    if (!Sandbox::hasVersion6()) {
+        QSKIP("no IPv6 here");
+    }
+    KnownHosts::add("::1");
+    const auto session = onTerminal("mount sftp://alice@[::1]/~/papers");
+    QVERIFY2(
+        session->waitFor("Password for alice on sftp://[::1]: "), session->output().constData());
+    session->type(keys(Sandbox::alice.password));
+    QCOMPARE(session->waitForEnd(), 0);
+    const QByteArray papers = mountDir(u"/sftp/alice@::1~/papers"_s).toLatin1();
+    QVERIFY2(session->output().endsWith(papers + '\n'), session->output().constData());
+
+    const ToolResult list = m_service->run("list SFTP/alice@::1/papers");
+    QCOMPARE(list.out, QByteArray("draft.txt\n"));
+    const ToolResult again = m_service->run("mount --no-input sftp://alice@[::1]/~/papers");
+    QCOMPARE(again.out, papers + '\n');
+    const ToolResult mounts = m_service->run("mounts");
+    QVERIFY2(mounts.out.startsWith("sftp://alice@[::1]/~/  "), mounts.out.constData());
 }
 
 void RealToolTest::cannotConnect_data()
@@ -384,6 +407,9 @@ int main(int argc, char** argv)
     sandbox.addServer(std::make_unique<SshServer>(Sandbox::serverHost));
     sandbox.addServer(
         std::make_unique<SshServer>(Sandbox::otherHost, SshServer::KeyboardInteractive));
+    if (Sandbox::hasVersion6()) {
+        sandbox.addServer(std::make_unique<SshServer>("::1"));
+    }
     sandbox.addServer(std::make_unique<SmbServer>());
     sandbox.addServer(std::make_unique<FtpServer>(Sandbox::serverHost));
     return sandbox.run([&] {

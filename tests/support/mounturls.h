@@ -185,8 +185,15 @@ private:
         row("sftp://host:99999/", sftpPort);
         row("sftp://host:port/", sftpPort);
         row("ftp://host:21/a@b", "curlftpfs is not told of a port: leave it out");
-        row("sftp://[::1]/", "sshfs can't be told of an IPv6 address: use a name of the host");
-        row("ftp://[::1]/", "curlftpfs can't be told of an IPv6 address: use a name of the host");
+        row("sftp://[::1]:22/", sftpPort);
+        row("sftp://::1/", "an IPv6 address needs brackets: [::1]");
+        row("ftp://me@2001:db8::1/", "an IPv6 address needs brackets: [2001:db8::1]");
+        row("sftp://[::g]/", "'::g' is no IPv6 address");
+        row("ftp://[::1%25;x]/", "'::1%;x' is no IPv6 address");
+        row("sftp://[v1.x]/", "sshfs can't be told of this user and host");
+        row("sftp://-oProxyCommand=id@[::1]/", "the name of the user must not begin with a dash");
+        row("sftp://[]-oProxyCommand=id@[::1]/",
+            "sshfs can't be told of a user with '[' in its name");
         row("sftp://[::1", "'[' is no name of a host");
         row("sftp://-oProxyCommand=id/", "the name of the host must not begin with a dash");
         row("sftp://-host", "the name of the host must not begin with a dash");
@@ -291,6 +298,11 @@ inline QStringList accepted()
           "ftp://50%25@host/",
           "ftp://host/100%25;type=i",
           "ftp://\u00fcser@host/",
+          "ftp://me@[2001:db8::1]/dir",
+          "sftp://[::1]",
+          "sftp://me@[::1]/~/dir",
+          "sftp://[::ffff:192.0.2.1]/",
+          "sftp://[fe80::1%25eth0]/",
           "sftp://host",
           "sftp://me@host/dir",
           "sftp://host/~",

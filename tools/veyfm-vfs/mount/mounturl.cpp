@@ -218,7 +218,16 @@ QString whyNotFuse(const QString& text, const QString& scheme, const QString& au
     const QString written = authority.mid(authority.indexOf(QLatin1Char('@')) + 1);
     const HostAndPort address(written);
     const QString host = url.isValid() ? url.host(QUrl::FullyDecoded) : address.host;
-    QString why = whyNoHost(host, toolOf(scheme));
+    const bool isBracketed = written.startsWith(QLatin1Char('['));
+    if (!isBracketed && written.count(QLatin1Char(':')) > 1) {
+        return QStringLiteral("an IPv6 address needs brackets: [%1]").arg(written);
+    }
+    QString why;
+    if (!isBracketed || !host.contains(QLatin1Char(':'))) {
+        why = whyNoHost(host, toolOf(scheme));
+    } else if (!UrlText::isSafeForTool(url.adjusted(QUrl::RemoveUserInfo))) {
+        why = QStringLiteral("'%1' is no IPv6 address").arg(host);
+    }
     if (!why.isEmpty()) {
         return why;
     }

@@ -194,7 +194,10 @@ bool TerminalAuthenticator::isWorthAnotherJob()
 
 QString TerminalAuthenticator::resource() const
 {
-    QString text = protocol() + QLatin1String("://") + server();
+    // An IPv6 address stands in brackets, as in the URL.
+    const bool isAddress = server().contains(QLatin1Char(':'));
+    const QString host = isAddress ? QLatin1Char('[') + server() + QLatin1Char(']') : server();
+    QString text = protocol() + QLatin1String("://") + host;
     if (!object().isEmpty()) {
         text += QLatin1Char('/') + object();
     }
