@@ -383,6 +383,17 @@ void TestVfsChilds::invalidNames()
         QVERIFY(m_scene.makeFifo("invalid/p" + name));
     }
     QCOMPARE(VFS::ptr()->childs(dir("invalid")).paths(), {m_scene.path("invalid/good")});
+
+    QByteArrayList leftOut = {"of before"};
+    const EntryList children = VFS::ptr()->childsAndLeftOut(dir("invalid"), {}, &leftOut);
+    QCOMPARE(children.paths(), {m_scene.path("invalid/good")});
+    QByteArrayList expected;
+    for (const QByteArray& name : invalid) {
+        expected << name << 'd' + name << 'p' + name;
+    }
+    std::sort(leftOut.begin(), leftOut.end());
+    std::sort(expected.begin(), expected.end());
+    QCOMPARE(leftOut, expected);
 }
 
 // A link stays, under what its name reads as, and so leads nowhere.
@@ -400,7 +411,10 @@ void TestVfsChilds::invalidLinks()
         QCOMPARE(child.localPath(), child.path());
         QVERIFY(!child.exists());
     }
-    QCOMPARE(VFS::ptr()->childs(dir("invalidLinks"), VFS::SkipSymLinks).size(), 0);
+    QByteArrayList leftOut;
+    QCOMPARE(
+        VFS::ptr()->childsAndLeftOut(dir("invalidLinks"), VFS::SkipSymLinks, &leftOut).size(), 0);
+    QCOMPARE(leftOut, QByteArrayList());
 
     // Where something else goes by what the name reads as, that is looked at.
     QVERIFY(m_scene.makeDir("aliased"));

@@ -12,6 +12,7 @@
 #include "core/stringmap.h"
 #include "veyfmvfs_export.h"
 
+#include <QByteArrayList>
 #include <QObject>
 #include <QUrl>
 
@@ -181,6 +182,14 @@ public:
      * service. A listing that stopGettingChilds() cancelled is empty.
      */
     EntryList childs(const Entry& entry, EntryChildFilters filter = {}) const;
+
+    /**
+     * childs(), and the names of the directory that it left out since they are not valid in the
+     * local encoding, in the order of the disk, both from one reading. For those who tell their
+     * user of them. A listing that was cancelled leaves some or none of them.
+     */
+    EntryList
+    childsAndLeftOut(const Entry& entry, EntryChildFilters filter, QByteArrayList* leftOut) const;
 
     /**
      * Cancels one listing: the running one that gets to a directory record first, or the next

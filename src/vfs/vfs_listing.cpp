@@ -63,8 +63,16 @@ QString joinedAscii(const QString& prefix, const char* name, int length)
 
 } // namespace
 
-EntryList VFS::childs(const Entry& given, EntryChildFilters filter) const
+EntryList VFS::childs(const Entry& entry, EntryChildFilters filter) const
 {
+    QByteArrayList leftOut;
+    return childsAndLeftOut(entry, filter, &leftOut);
+}
+
+EntryList
+VFS::childsAndLeftOut(const Entry& given, EntryChildFilters filter, QByteArrayList* leftOut) const
+{
+    leftOut->clear();
     Q_D(const VFS);
     const Entry entry = copied(given);
     EntryList children;
@@ -75,7 +83,7 @@ EntryList VFS::childs(const Entry& given, EntryChildFilters filter) const
     if (local.isEmpty() || !isListable(entry)) {
         return children;
     }
-    if (!d->appendDirectory(entry, local, filter, &children)) {
+    if (!d->appendDirectory(entry, local, filter, &children, leftOut)) {
         return EntryList();
     }
     if (filter.testFlag(WithExtraChildren)) {
@@ -87,7 +95,7 @@ EntryList VFS::childs(const Entry& given, EntryChildFilters filter) const
 // False if the listing was cancelled.
 bool VFSPrivate::appendDirectory(
     const Entry& entry, const QString& localPath, VFS::EntryChildFilters filter,
-    EntryList* children) const
+    EntryList* children, QByteArrayList* leftOut) const
 {
     QByteArray directory = localPath.toLocal8Bit();
     if (!directory.endsWith('/')) {
@@ -135,6 +143,7 @@ bool VFSPrivate::appendDirectory(
             const QString decoded = withSlash.mid(1);
             isValidName = withSlash.toLocal8Bit() == bytes;
             if (!isValidName && kind != DT_LNK) {
+                leftOut->append(name);
                 continue;
             }
             path = pathPrefix + decoded;

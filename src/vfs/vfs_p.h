@@ -72,7 +72,7 @@ public:
     // Listing.
     bool appendDirectory(
         const Entry& entry, const QString& localPath, VFS::EntryChildFilters filter,
-        EntryList* children) const;
+        EntryList* children, QByteArrayList* leftOut) const;
 
     /// The URL of a bookmark, or of something below it, by its path behind the Network place.
     QString bookmarkUrl(const QString& relativePath) const;

@@ -8,7 +8,6 @@
 
 #include <algorithm>
 
-#include <dirent.h>
 #include <sys/stat.h>
 
 namespace VeyFM {
@@ -35,22 +34,15 @@ void sortByFacts(QVector<Item>::iterator begin, QVector<Item>::iterator end, Sor
     });
 }
 
-bool isText(const QByteArray& name)
-{
-    const bool isAscii =
-        std::all_of(name.begin(), name.end(), [](char c) { return uchar(c) < 0x80; });
-    // Behind a slash, since a byte order mark at the head of a text is no part of it.
-    const QByteArray path = '/' + name;
-    return isAscii || QString::fromLocal8Bit(path).toLocal8Bit() == path;
-}
-
 } // namespace
 
-QVector<Item> listing(const Entry& entry, const ListingOptions& options)
+Listing listing(const Entry& entry, const ListingOptions& options)
 {
     EntryList places;
     EntryList files;
-    const EntryList children = VFS::ptr()->childs(entry, options.filters);
+    Listing result;
+    const EntryList children =
+        VFS::ptr()->childsAndLeftOut(entry, options.filters, &result.leftOut);
     for (const Entry& child : children) {
         if (child.isPlace()) {
             places.append(child);
@@ -63,7 +55,15 @@ QVector<Item> listing(const Entry& entry, const ListingOptions& options)
         files.sort(byFacts || !options.reverse);
     }
 
-    QVector<Item> items;
+    if (!options.hidden) {
+        const auto isHidden = [](const QByteArray& name) {
+            return name.startsWith('.');
+        };
+        QByteArrayList& names = result.leftOut;
+        names.erase(std::remove_if(names.begin(), names.end(), isHidden), names.end());
+    }
+
+    QVector<Item>& items = result.items;
     items.reserve(children.size());
     for (const Entry& place : qAsConst(places)) {
         items.append({place});
@@ -80,32 +80,17 @@ QVector<Item> listing(const Entry& entry, const ListingOptions& options)
     if (options.reverse && options.sortBy != SortBy::Name) {
         std::reverse(items.begin() + places.size(), items.end());
     }
-    return items;
+    return result;
 }
 
-bool reportLeftOut(const Entry& entry, const ListingOptions& options)
+bool reportLeftOut(const Entry& entry, const QByteArrayList& names)
 {
-    const QByteArray local = entry.localPath().toLocal8Bit();
-    if (local.isEmpty() || local.contains('\0') || !hasDirectory(entry)) {
-        return false;
+    for (const QByteArray& name : names) {
+        reportBytes(
+            shownPath(entry) + QLatin1Char('/'), name,
+            QStringLiteral("left out, not a valid name in the encoding of the locale"));
     }
-    bool wereAny = false;
-    DIR* const stream = ::opendir(local.constData());
-    while (const dirent* record = stream ? ::readdir(stream) : nullptr) {
-        const QByteArray name = record->d_name;
-        // Links of such names are listed.
-        const bool isShown = record->d_type == DT_LNK || isText(name);
-        if (!isShown && (options.hidden || !name.startsWith('.'))) {
-            reportBytes(
-                shownPath(entry) + QLatin1Char('/'), name,
-                QStringLiteral("left out, not a valid name in the encoding of the locale"));
-            wereAny = true;
-        }
-    }
-    if (stream) {
-        ::closedir(stream);
-    }
-    return wereAny;
+    return !names.isEmpty();
 }
 
 } // namespace Tool

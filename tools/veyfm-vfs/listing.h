@@ -31,17 +31,20 @@ struct ListingOptions
     VFS::EntryChildFilters filters = {};
 };
 
+struct Listing
+{
+    QVector<Item> items;
+    QByteArrayList leftOut; ///< Names that the encoding of the locale has no text for.
+};
+
 /**
  * The children of an entry: first the places, which keep the order of the tree, then what the
  * directory holds, sorted. Sizes and times sort the greatest and newest first, as ls does.
  */
-QVector<Item> listing(const Entry& entry, const ListingOptions& options);
+Listing listing(const Entry& entry, const ListingOptions& options);
 
-/**
- * Reports what listing() would show of the entry's directory, if the library did not leave it out:
- * names that the encoding of the locale has no text for. Whether there were any.
- */
-bool reportLeftOut(const Entry& entry, const ListingOptions& options);
+/// Reports the names that a listing of the entry had to leave out. Whether there were any.
+bool reportLeftOut(const Entry& entry, const QByteArrayList& names);
 
 } // namespace Tool
 } // namespace VeyFM

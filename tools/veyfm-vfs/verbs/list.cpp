@@ -213,7 +213,7 @@ int run(Invocation& invocation)
         const QString why = located.why.isEmpty() ? whyUnreadable(located.entry) : located.why;
         // A place without its directory still has its children in the tree.
         if (why.isEmpty() || located.entry.isPlace()) {
-            const QVector<Item> items = listing(located.entry, options);
+            const Listing listed = listing(located.entry, options);
             if (interrupt.wasRequested()) {
                 report(operand, interrupted);
                 exitCode = Failed;
@@ -222,10 +222,10 @@ int run(Invocation& invocation)
             if (several) {
                 printTitle(invocation, located.entry, first);
             }
-            print(invocation, json, items);
+            print(invocation, json, listed.items);
             first = false;
             output.flush();
-            if (reportLeftOut(located.entry, options)) {
+            if (reportLeftOut(located.entry, listed.leftOut)) {
                 exitCode = Failed;
             }
         }

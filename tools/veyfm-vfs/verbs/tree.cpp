@@ -80,11 +80,11 @@ private:
             m_failed = true;
         }
         EntryList children;
-        const QVector<Item> items = listing(entry, m_options);
-        for (const Item& item : items) {
+        const Listing listed = listing(entry, m_options);
+        for (const Item& item : listed.items) {
             children.append(item.entry);
         }
-        if (reportLeftOut(entry, m_options)) {
+        if (reportLeftOut(entry, listed.leftOut)) {
             m_failed = true;
         }
         return children;
