@@ -198,6 +198,7 @@ void ToolPatienceTest::later()
          {"SmbBrowser.workgroups", "list --json Samba", 1, "[]\n", error("list", silent)},
          // What was printed is not printed again.
          {"SmbBrowser.workgroups", "list /usr Samba", 1, "share\n", error("list", silent)},
+         {"SmbBrowser.workgroups", "list --json /usr Samba", 1, "\n]\n", error("list", silent)},
          {"StoragePlacesManager.availableStoragePlaces",
           "storage list",
           1,
@@ -266,6 +267,8 @@ void ToolPatienceTest::changes()
           "network rescan --timeout=0",
           1,
           {},
+          error("network rescan", askedFor)},
+         {"SmbBrowser.rescan", "network rescan --json", 1, "[]\n",
           error("network rescan", askedFor)},
          {"FileSystem.notifyWatchers",
           "notify --timeout=60 /tmp",

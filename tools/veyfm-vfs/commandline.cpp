@@ -318,9 +318,13 @@ int runCommandLine(const QStringList& words)
     }
     setVerbose(invocation.isSet(QStringLiteral("verbose")));
     VFS::initialize();
+    const bool wantsArray = invocation.json() && !verb->jsonLines;
+    if (wantsArray) {
+        Patience::setOutputEnd(QByteArrayLiteral("[]\n"));
+    }
     int exitCode = runVerb(invocation);
     // A verb that failed before it had anything to print.
-    if (invocation.json() && !verb->jsonLines && !output.wasUsed()) {
+    if (wantsArray && !output.wasUsed()) {
         JsonArray(output).end();
     }
     exitCode = output.finish(exitCode);

@@ -72,6 +72,11 @@ void Output::write(const QString& text)
     write(text.toLocal8Bit());
 }
 
+void Output::setEnd(const QByteArray& bytes)
+{
+    m_end = bytes;
+}
+
 bool Output::wasUsed() const
 {
     return m_wasUsed;
@@ -93,6 +98,9 @@ void Output::flush()
         } else if (errno != EINTR) {
             m_error = errno;
         }
+    }
+    if (!m_buffer.isEmpty()) {
+        Patience::setOutputEnd(m_end);
     }
     m_buffer.clear();
 }
@@ -154,13 +162,15 @@ JsonArray::~JsonArray()
 
 void JsonArray::append(const QJsonObject& object)
 {
-    m_output.write(m_empty ? QByteArrayLiteral("[\n") : QByteArrayLiteral(",\n"));
-    m_output.write(shownJson(object));
+    // In one piece, since the end fits behind whole elements.
+    m_output.setEnd(QByteArrayLiteral("\n]\n"));
+    m_output.write((m_empty ? "[\n" : ",\n") + shownJson(object));
     m_empty = false;
 }
 
 void JsonArray::end()
 {
+    m_output.setEnd(QByteArray());
     m_output.write(m_empty ? QByteArrayLiteral("[]\n") : QByteArrayLiteral("\n]\n"));
     m_ended = true;
 }

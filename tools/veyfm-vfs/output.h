@@ -37,6 +37,9 @@ public:
     void write(const QString& text);
     void flush();
 
+    /// What would be lacking behind all that is written from now on.
+    void setEnd(const QByteArray& bytes);
+
     /// Whether anything was written.
     bool wasUsed() const;
     /// What can't be written is dropped. An errno value says why. @{
@@ -61,6 +64,7 @@ private:
     Q_DISABLE_COPY(Output)
 
     QByteArray m_buffer;
+    QByteArray m_end;
     bool m_terminal;
     bool m_null = false;
     bool m_wasUsed = false;

@@ -37,6 +37,13 @@ constexpr std::chrono::seconds parting(2);
 constexpr std::chrono::seconds pulse(1);
 constexpr std::chrono::milliseconds pace(100);
 
+void tell(int descriptor, const QByteArray& bytes)
+{
+    if (::write(descriptor, bytes.constData(), size_t(bytes.size())) < 0) {
+        // Nobody to tell.
+    }
+}
+
 /// The thread that counts the time, and what it has to know.
 class Watch
 {
@@ -91,6 +98,12 @@ public:
     {
         const std::lock_guard<std::mutex> lock(m_lock);
         m_hasPrinted = true;
+    }
+
+    void setOutputEnd(const QByteArray& bytes)
+    {
+        const std::lock_guard<std::mutex> lock(m_lock);
+        m_outputEnd = bytes;
     }
 
     void noteAsked()
@@ -156,16 +169,15 @@ private:
         if (!m_hasPrinted && !m_hasAsked && !Restart::wasDone()) {
             Restart::withoutService();
         }
-        const QByteArray& line = m_hasAsked ? m_lineOfChanges : m_lineOfReads;
-        if (::write(STDERR_FILENO, line.constData(), size_t(line.size())) < 0) {
-            // Nobody to tell.
-        }
+        tell(STDOUT_FILENO, m_outputEnd);
+        tell(STDERR_FILENO, m_hasAsked ? m_lineOfChanges : m_lineOfReads);
         endAtOnce(Failed);
     }
 
     std::mutex m_lock;
     std::condition_variable m_changed;
     Clock::duration m_left = bound;
+    QByteArray m_outputEnd;
     QByteArray m_lineOfReads;
     QByteArray m_lineOfChanges;
     int m_holders = 0;
@@ -204,6 +216,11 @@ void Patience::setVerb(const QString& name)
 void Patience::notePrinted()
 {
     watch().notePrinted();
+}
+
+void Patience::setOutputEnd(const QByteArray& bytes)
+{
+    watch().setOutputEnd(bytes);
 }
 
 void Patience::noteAsked()

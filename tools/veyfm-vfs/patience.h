@@ -6,6 +6,7 @@
 
 #include "spinner.h"
 
+#include <QByteArray>
 #include <QObject>
 
 namespace VeyFM {
@@ -36,6 +37,9 @@ public:
     static void notePrinted();
     static void noteAsked();
     /// @}
+
+    /// What standard output lacks, should the program end now: the end of a JSON array.
+    static void setOutputEnd(const QByteArray& bytes);
 
     /// The service has shown that it lives: the time begins anew.
     static void renew();
