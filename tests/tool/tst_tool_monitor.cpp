@@ -9,7 +9,12 @@
 #include <QTemporaryDir>
 #include <QTest>
 
+#include <algorithm>
+
 #include <signal.h>
+#include <sys/socket.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 namespace {
 
@@ -107,6 +112,7 @@ private Q_SLOTS:
     void endsOnSignals_data();
     void endsOnSignals();
     void endsWithoutAReader();
+    void endsWithItsSocket();
     void endsWhereItCannotWrite();
     void tellsWhatItCannotWatch();
     void failingOperandDoesNotStopOthers();
@@ -247,6 +253,47 @@ void ToolMonitorTest::endsWithoutAReader()
         {QStringLiteral("-c"), QStringLiteral("{ \"$0\" monitor \"$1\"; echo $? >&2; } | :"),
          toolPath(), directory.path()});
     QCOMPARE(result.err, QByteArray("141\n")); // SIGPIPE, as a shell has it.
+}
+
+// What sshd makes standard output of.
+void ToolMonitorTest::endsWithItsSocket()
+{
+    QTemporaryDir directory;
+    int ends[2];
+    QCOMPARE(::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends), 0);
+    const QByteArray tool = toolPath().toLocal8Bit();
+    const QByteArray operand = directory.path().toLocal8Bit();
+    const pid_t process = ::fork();
+    if (process == 0) {
+        ::dup2(ends[1], STDOUT_FILENO);
+        ::execl(tool.constData(), "veyfm-vfs", "monitor", operand.constData(), nullptr);
+        ::_exit(127);
+    }
+    QVERIFY(process > 0);
+    ::close(ends[1]);
+    // What comes from the other side is no end.
+    QCOMPARE(::send(ends[0], "x", 1, MSG_NOSIGNAL), ssize_t(1));
+    QByteArray out;
+    const auto read = [&out, &ends] {
+        char bytes[4096];
+        const ssize_t size = ::recv(ends[0], bytes, sizeof bytes, MSG_DONTWAIT);
+        out.append(bytes, int(std::max<ssize_t>(size, 0)));
+        return out;
+    };
+    QTRY_VERIFY(createFile(directory.path(), "x") && read().contains("x\n"));
+    // All that is written is read, lest writing should end it.
+    QVERIFY(createFile(directory.path(), "last"));
+    QTRY_VERIFY(read().contains("changed     " + operand + "/last\n"));
+    ::close(ends[0]);
+    int status = 0;
+    pid_t ended = 0;
+    if (!QTest::qWaitFor([&] { return (ended = ::waitpid(process, &status, WNOHANG)) != 0; })) {
+        ::kill(process, SIGKILL);
+        ::waitpid(process, &status, 0);
+    }
+    QCOMPARE(ended, process);
+    QVERIFY(WIFSIGNALED(status));
+    QCOMPARE(WTERMSIG(status), SIGPIPE);
 }
 
 void ToolMonitorTest::endsWhereItCannotWrite()

@@ -19,6 +19,7 @@
 
 #include <cerrno>
 #include <signal.h>
+#include <sys/epoll.h>
 #include <sys/inotify.h>
 #include <unistd.h>
 
@@ -66,6 +67,33 @@ QString whyUnwatchable(const Entry& entry)
     }
     return error == 0 ? QString() : systemReason(error);
 }
+
+/// Has a descriptor that can be read from as soon as the other side of an open one has gone, and
+/// not because of what comes from there. Of a file it never can.
+class HangUp
+{
+public:
+    explicit HangUp(int watched)
+        : m_descriptor(::epoll_create1(EPOLL_CLOEXEC))
+    {
+        epoll_event nothingElse = {};
+        ::epoll_ctl(m_descriptor, EPOLL_CTL_ADD, watched, &nothingElse);
+    }
+    ~HangUp()
+    {
+        ::close(m_descriptor);
+    }
+
+    int descriptor() const
+    {
+        return m_descriptor;
+    }
+
+private:
+    Q_DISABLE_COPY(HangUp)
+
+    const int m_descriptor;
+};
 
 /// Whether all news of what is below the place come from the service.
 bool livesFromService(const Entry& entry)
@@ -223,9 +251,10 @@ int run(Invocation& invocation)
     const Interrupt interrupt({SIGINT, SIGTERM}, [] {
         QMetaObject::invokeMethod(qApp, &QCoreApplication::quit, Qt::QueuedConnection);
     });
-    // A pipe without a reader tells so by itself, not only to who writes. The signal is what
-    // writing would lead to.
-    QSocketNotifier reader(STDOUT_FILENO, QSocketNotifier::Exception);
+    // A pipe or a socket without a reader tells so by itself, not only to who writes. The signal is
+    // what writing would lead to.
+    const HangUp hangUp(STDOUT_FILENO);
+    QSocketNotifier reader(hangUp.descriptor(), QSocketNotifier::Read);
     QObject::connect(&reader, &QSocketNotifier::activated, &reader, [&invocation] {
         ::raise(SIGPIPE);
         invocation.output().setFailed(EPIPE);
