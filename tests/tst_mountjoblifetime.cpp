@@ -7,6 +7,7 @@
 #include "support/mountjobtest.h"
 
 #include <QElapsedTimer>
+#include <QPointer>
 #include <QProcess>
 
 #include <cerrno>
@@ -115,8 +116,14 @@ void MountJobLifetimeTest::jobIsDeletedDuringAQuestion()
         auth->answers.append(Auth::password(u"x"_s, u"bob"_s));
     }
     Auth::Answer answer = Auth::password(u"x"_s, u"bob"_s);
-    answer.before = [&job] {
+    QPointer<QProcess> process;
+    bool isProcessLeft = false;
+    answer.before = [&] {
+        process = job->findChild<QProcess*>();
+        const bool hasProcess = process;
         job.reset();
+        // It may be amid one of its signals.
+        isProcessLeft = !hasProcess || process;
     };
     if (plays.first() == keyWaits) {
         auth->duringQuestion = answer.before;
@@ -130,6 +137,8 @@ void MountJobLifetimeTest::jobIsDeletedDuringAQuestion()
     job->start();
     QVERIFY(QTest::qWaitFor([&job] { return !job; }, 20000));
 
+    QVERIFY(isProcessLeft);
+    QTRY_VERIFY(process.isNull());
     QCOMPARE(finished.count(), 0);
     QVERIFY(held.isNull());
     for (int run = 1; run <= plays.size(); ++run) {

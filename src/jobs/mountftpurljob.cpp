@@ -65,6 +65,12 @@ MountFtpURLJob::~MountFtpURLJob()
         }
         d->mount.removeMountDirectory();
     }
+    if (d->isHandling) {
+        // It may be amid a signal of the process, which goes on behind that.
+        d->process->disconnect(this);
+        d->process->setParent(nullptr);
+        d->process->deleteLater();
+    }
 }
 
 QString MountFtpURLJob::url() const
