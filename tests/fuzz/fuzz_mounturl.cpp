@@ -120,7 +120,10 @@ void checkFuse(const QUrl& url)
     require(url.password().isEmpty(), "there is no password");
     require(url.port() == -1 && !url.hasQuery() && !url.hasFragment(), "nothing is dropped");
     require(!account.startsWith(QLatin1Char('-')), "an account is no option");
-    require(!account.contains(QLatin1Char(':')), "an account ends at the colon behind it");
+    require(!user.contains(QLatin1Char(':')), "a user ends at no colon");
+    require(
+        !host.contains(QLatin1Char(':')) || UrlText::toolHost(url).startsWith(QLatin1Char('[')),
+        "a host ends at the colon behind it");
     require(account.toLocal8Bit().size() < 255, "an account is short enough for a directory");
     const QString root = QStringLiteral("/root/ftp/") + account;
     require(QDir::cleanPath(root) == root, "an account is one directory");
