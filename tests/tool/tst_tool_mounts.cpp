@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "mount/mountinfo.h"
+#include "host/mountinfo.h"
 #include "mount/networkmounts.h"
 #include "support/makeentry.h"
 #include "support/mountscene.h"

@@ -3,7 +3,7 @@
 
 #include "mount/fusedirectory.h"
 
-#include "mount/mountinfo.h"
+#include "host/mountinfo.h"
 #include "mount/pidfd.h"
 #include "report.h"
 #include "vfs/vfs.h"
@@ -25,6 +25,9 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::KernelMount;
+using Host::kernelPath;
 
 namespace {
 

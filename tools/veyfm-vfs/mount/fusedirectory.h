@@ -12,9 +12,14 @@
 #include <mutex>
 
 namespace VeyFM {
+
+namespace Host {
+class MountInfo;
+}
+
 namespace Tool {
 
-class MountInfo;
+using Host::MountInfo;
 
 /// The directory on which the jobs mount the root of an ftp or sftp URL.
 QString fuseDirectory(const QUrl& url);

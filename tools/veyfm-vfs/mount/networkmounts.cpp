@@ -3,7 +3,7 @@
 
 #include "mount/networkmounts.h"
 
-#include "mount/mountinfo.h"
+#include "host/mountinfo.h"
 
 #include <QDir>
 #include <QStringList>
@@ -13,6 +13,9 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::KernelMount;
+using Host::kernelPath;
 
 namespace {
 

@@ -12,9 +12,14 @@
 #include <QVector>
 
 namespace VeyFM {
+
+namespace Host {
+class MountInfo;
+}
+
 namespace Tool {
 
-class MountInfo;
+using Host::MountInfo;
 
 /// A directory that a network resource is mounted on, or that the service takes for one.
 struct NetworkMount

@@ -3,7 +3,7 @@
 
 #include "commandline.h"
 #include "describe.h"
-#include "mount/mountinfo.h"
+#include "host/mountinfo.h"
 #include "mount/networkmounts.h"
 #include "patience.h"
 #include "report.h"

@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "mount/mountinfo.h"
+#include "host/mountinfo.h"
 
 #include <QDir>
 #include <QFile>
@@ -10,7 +10,7 @@
 #include <algorithm>
 
 namespace VeyFM {
-namespace Tool {
+namespace Host {
 
 namespace {
 
@@ -96,16 +96,18 @@ QString kernelPath(const QString& directory, const QString& root)
     if (!(path + slash).startsWith(root + slash)) {
         return path;
     }
+    // Above a directory that is not there yet the links are the same as they will be.
     const int schemeEnd = path.indexOf(slash, root.size() + 1);
-    for (const int end : {schemeEnd, root.size()}) {
-        const QString canonical =
-            end < 0 ? QString() : QFileInfo(path.left(end)).canonicalFilePath();
+    int end = schemeEnd < 0 ? root.size() : schemeEnd;
+    while (end > 0) {
+        const QString canonical = QFileInfo(path.left(end)).canonicalFilePath();
         if (!canonical.isEmpty()) {
             return canonical + path.mid(end);
         }
+        end = path.lastIndexOf(slash, end - 1);
     }
     return path;
 }
 
-} // namespace Tool
+} // namespace Host
 } // namespace VeyFM

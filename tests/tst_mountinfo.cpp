@@ -1,16 +1,16 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "mount/mountinfo.h"
+#include "host/mountinfo.h"
 
 #include <QDir>
 #include <QFile>
 #include <QTemporaryDir>
 #include <QTest>
 
-using namespace VeyFM::Tool;
+using namespace VeyFM::Host;
 
-class ToolMountInfoTest : public QObject
+class MountInfoTest : public QObject
 {
     Q_OBJECT
 
@@ -25,7 +25,7 @@ private Q_SLOTS:
     void kernelPaths();
 };
 
-void ToolMountInfoTest::reads_data()
+void MountInfoTest::reads_data()
 {
     QTest::addColumn<QByteArray>("line");
     QTest::addColumn<QStringList>("mount");
@@ -56,7 +56,7 @@ void ToolMountInfoTest::reads_data()
         << QStringList({QStringLiteral("-"), QStringLiteral("t"), QStringLiteral("s")});
 }
 
-void ToolMountInfoTest::reads()
+void MountInfoTest::reads()
 {
     QFETCH(const QByteArray, line);
     QFETCH(const QStringList, mount);
@@ -67,7 +67,7 @@ void ToolMountInfoTest::reads()
     QCOMPARE(mounts.at(0).source, mount.at(2));
 }
 
-void ToolMountInfoTest::passesOver_data()
+void MountInfoTest::passesOver_data()
 {
     QTest::addColumn<QByteArray>("text");
     QTest::newRow("nothing") << QByteArray();
@@ -78,7 +78,7 @@ void ToolMountInfoTest::passesOver_data()
     QTest::newRow("NUL") << QByteArray("\0\0\0", 3);
 }
 
-void ToolMountInfoTest::passesOver()
+void MountInfoTest::passesOver()
 {
     QFETCH(const QByteArray, text);
     const MountInfo info(text);
@@ -86,7 +86,7 @@ void ToolMountInfoTest::passesOver()
     QVERIFY(!info.isMountPoint(QStringLiteral("/mnt")));
 }
 
-void ToolMountInfoTest::fuse()
+void MountInfoTest::fuse()
 {
     const auto isFuse = [](const char* type) {
         return KernelMount{QString(), QString::fromLatin1(type), QString()}.isFuse();
@@ -99,7 +99,7 @@ void ToolMountInfoTest::fuse()
     QVERIFY(!isFuse("ext4"));
 }
 
-void ToolMountInfoTest::mountPoints()
+void MountInfoTest::mountPoints()
 {
     const MountInfo info("1 2 0:1 / /a\\040b rw - t s rw\n1 2 0:1 / /c rw - t s rw\n");
     QVERIFY(info.isMountPoint(QStringLiteral("/a b")));
@@ -109,7 +109,7 @@ void ToolMountInfoTest::mountPoints()
     QVERIFY(!info.isMountPoint(QString()));
 }
 
-void ToolMountInfoTest::ownMounts()
+void MountInfoTest::ownMounts()
 {
     const MountInfo info = MountInfo::read();
     QCOMPARE(info.why(), QString());
@@ -117,7 +117,7 @@ void ToolMountInfoTest::ownMounts()
     QVERIFY(!info.isMountPoint(QDir::homePath()));
 }
 
-void ToolMountInfoTest::kernelPaths()
+void MountInfoTest::kernelPaths()
 {
     QTemporaryDir directory;
     const QString top = QDir(directory.path()).canonicalPath();
@@ -144,7 +144,12 @@ void ToolMountInfoTest::kernelPaths()
     QCOMPARE(
         kernelPath(QStringLiteral("/nowhere/x"), QStringLiteral("/nowhere")),
         QStringLiteral("/nowhere/x"));
+    // A root that is not there yet has the path that it will have.
+    QCOMPARE(
+        kernelPath(
+            top + QStringLiteral("/link/later/sftp/host"), top + QStringLiteral("/link/later")),
+        top + QStringLiteral("/real/later/sftp/host"));
 }
 
-QTEST_GUILESS_MAIN(ToolMountInfoTest)
-#include "tst_tool_mountinfo.moc"
+QTEST_GUILESS_MAIN(MountInfoTest)
+#include "tst_mountinfo.moc"

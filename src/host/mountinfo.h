@@ -1,15 +1,15 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#ifndef VEYFM_TOOL_MOUNTINFO_H
-#define VEYFM_TOOL_MOUNTINFO_H
+#ifndef VEYFM_HOST_MOUNTINFO_H
+#define VEYFM_HOST_MOUNTINFO_H
 
 #include <QByteArray>
 #include <QString>
 #include <QVector>
 
 namespace VeyFM {
-namespace Tool {
+namespace Host {
 
 /// A mount as the kernel lists it.
 struct KernelMount
@@ -54,12 +54,12 @@ private:
 
 /**
  * The directory as the kernel names it: tidied up and, where it lies below @p root, without links
- * from the top down to the directory of its scheme. Nothing below that is looked at, since it may
- * be a mount.
+ * from the top down to the directory of its scheme, or to where there is nothing yet. Nothing below
+ * that is looked at, since it may be a mount.
  */
 QString kernelPath(const QString& directory, const QString& root);
 
-} // namespace Tool
+} // namespace Host
 } // namespace VeyFM
 
 #endif
