@@ -1,14 +1,14 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-// Any text to the tool's look at what is to be mounted, and to the jobs' own; and what passes to
-// the jobs' and the tools' ways of reading it.
+// Any text to the look at what is to be mounted, and to the jobs' own; and what passes to the
+// jobs' and the tools' ways of reading it.
 
 #include "fuzzing.h"
 
 #include "core/smburl.h"
 #include "core/urltext.h"
-#include "mount/mounturl.h"
+#include "host/mounturl.h"
 
 #include <QDir>
 #include <QProcess>
@@ -17,7 +17,7 @@
 using Fuzzing::require;
 using VeyFM::SmbUrl;
 namespace UrlText = VeyFM::UrlText;
-using namespace VeyFM::Tool;
+using namespace VeyFM::Host;
 
 namespace {
 

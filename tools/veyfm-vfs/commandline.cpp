@@ -3,7 +3,7 @@
 
 #include "commandline.h"
 
-#include "mount/mounturl.h"
+#include "host/mounturl.h"
 #include "patience.h"
 #include "report.h"
 #include "session.h"
@@ -14,6 +14,8 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::shownUrl;
 
 namespace {
 

@@ -3,7 +3,7 @@
 
 #include "shown.h"
 
-#include "mount/mounturl.h"
+#include "host/mounturl.h"
 
 #include <QJsonArray>
 #include <QJsonDocument>
@@ -11,6 +11,8 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::shownUrl;
 
 namespace {
 

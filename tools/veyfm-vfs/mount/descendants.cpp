@@ -3,7 +3,7 @@
 
 #include "mount/descendants.h"
 
-#include "mount/pidfd.h"
+#include "host/pidfd.h"
 
 #include <QByteArray>
 #include <QDir>
@@ -20,6 +20,9 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::openPidfd;
+using Host::sendSignal;
 
 namespace {
 

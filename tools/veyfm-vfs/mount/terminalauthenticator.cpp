@@ -3,9 +3,9 @@
 
 #include "mount/terminalauthenticator.h"
 
+#include "host/mounturl.h"
 #include "jobs/mountsftpurljob.h"
 #include "mount/descendants.h"
-#include "mount/mounturl.h"
 #include "mount/sshconfig.h"
 #include "report.h"
 #include "spinner.h"
@@ -19,6 +19,8 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::whyNoUser;
 
 namespace {
 

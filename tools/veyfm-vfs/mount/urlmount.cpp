@@ -6,13 +6,13 @@
 #include "core/mountpaths.h"
 #include "core/smburl.h"
 #include "host/mountinfo.h"
+#include "host/mounturl.h"
 #include "jobs/mountfuseentryjob.h"
 #include "jobs/mounturljob.h"
 #include "mount/descendants.h"
 #include "mount/fusedirectory.h"
 #include "mount/jobfailure.h"
 #include "mount/mountauthenticator.h"
-#include "mount/mounturl.h"
 #include "mount/watchedjob.h"
 #include "report.h"
 #include "service.h"
@@ -32,6 +32,10 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::schemeOf;
+using Host::shownUrl;
+using Host::userOf;
 
 namespace {
 

@@ -3,8 +3,8 @@
 
 #include "commandline.h"
 #include "describe.h"
+#include "host/mounturl.h"
 #include "mount/login.h"
-#include "mount/mounturl.h"
 #include "mount/urlmount.h"
 #include "mount/watchedjob.h"
 #include "report.h"
@@ -13,6 +13,12 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::schemeOf;
+using Host::shownUrl;
+using Host::userOf;
+using Host::whyNotMountable;
+using Host::whyNoUser;
 
 namespace {
 

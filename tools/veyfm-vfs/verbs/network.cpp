@@ -4,7 +4,7 @@
 #include "commandline.h"
 #include "core/smburl.h"
 #include "describe.h"
-#include "mount/mounturl.h"
+#include "host/mounturl.h"
 #include "patience.h"
 #include "report.h"
 #include "service.h"
@@ -22,6 +22,9 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::shownUrl;
+using Host::whyNotMountable;
 
 namespace {
 

@@ -3,10 +3,10 @@
 
 #include "commandline.h"
 #include "describe.h"
+#include "host/mounturl.h"
 #include "locate.h"
 #include "mount/jobfailure.h"
 #include "mount/login.h"
-#include "mount/mounturl.h"
 #include "mount/recordjob.h"
 #include "mount/scanjob.h"
 #include "mount/sharejob.h"
@@ -22,6 +22,13 @@
 
 namespace VeyFM {
 namespace Tool {
+
+using Host::schemeOf;
+using Host::shownUrl;
+using Host::userOf;
+using Host::whyNoShare;
+using Host::whyNotMountable;
+using Host::whyNoUser;
 
 namespace {
 

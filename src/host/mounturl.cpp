@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "mount/mounturl.h"
+#include "host/mounturl.h"
 
 #include "core/smburl.h"
 #include "core/urltext.h"
@@ -13,7 +13,7 @@
 #include <algorithm>
 
 namespace VeyFM {
-namespace Tool {
+namespace Host {
 
 namespace {
 
@@ -419,5 +419,5 @@ QString shownUrl(const QString& url)
     return at >= behind ? url.left(match.capturedStart()) + url.mid(at) : url;
 }
 
-} // namespace Tool
+} // namespace Host
 } // namespace VeyFM

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "core/smburl.h"
-#include "mount/mounturl.h"
+#include "host/mounturl.h"
 #include "support/mounturls.h"
 
 #include <QDir>
@@ -11,7 +11,7 @@
 #include <QUrl>
 
 using namespace VeyFM;
-using namespace VeyFM::Tool;
+using namespace VeyFM::Host;
 
 namespace {
 
@@ -30,7 +30,7 @@ QStringList words(const QString& share, const QString& host, const QString& user
 
 } // namespace
 
-class ToolMountUrlTest : public QObject
+class MountUrlTest : public QObject
 {
     Q_OBJECT
 
@@ -49,7 +49,7 @@ private Q_SLOTS:
     void shown();
 };
 
-void ToolMountUrlTest::refused_data()
+void MountUrlTest::refused_data()
 {
     QTest::addColumn<QString>("text");
     QTest::addColumn<QString>("reason");
@@ -59,7 +59,7 @@ void ToolMountUrlTest::refused_data()
     }
 }
 
-void ToolMountUrlTest::refused()
+void MountUrlTest::refused()
 {
     QFETCH(const QString, text);
     QFETCH(const QString, reason);
@@ -67,7 +67,7 @@ void ToolMountUrlTest::refused()
     QCOMPARE(whyNotMountable(text), reason);
 }
 
-void ToolMountUrlTest::accepted_data()
+void MountUrlTest::accepted_data()
 {
     QTest::addColumn<QString>("text");
     const QStringList all = MountUrls::accepted();
@@ -76,20 +76,20 @@ void ToolMountUrlTest::accepted_data()
     }
 }
 
-void ToolMountUrlTest::accepted()
+void MountUrlTest::accepted()
 {
     QFETCH(const QString, text);
     QCOMPARE(whyNotMountable(text), QString());
     QCOMPARE(shownUrl(text), text);
 }
 
-void ToolMountUrlTest::acceptedStayWhereTheyBelong_data()
+void MountUrlTest::acceptedStayWhereTheyBelong_data()
 {
     accepted_data();
 }
 
 // The rules that the refusals are there for, as the jobs read a URL.
-void ToolMountUrlTest::acceptedStayWhereTheyBelong()
+void MountUrlTest::acceptedStayWhereTheyBelong()
 {
     QFETCH(const QString, text);
     if (text.startsWith(QLatin1String("smb"))) {
@@ -118,7 +118,7 @@ void ToolMountUrlTest::acceptedStayWhereTheyBelong()
     QVERIFY(path == root || path.startsWith(root + QLatin1Char('/')));
 }
 
-void ToolMountUrlTest::users_data()
+void MountUrlTest::users_data()
 {
     QTest::addColumn<QString>("scheme");
     QTest::addColumn<QString>("user");
@@ -153,7 +153,7 @@ void ToolMountUrlTest::users_data()
     row("sftp", "a:b", "sshfs can't be told of a user with ':' in its name");
 }
 
-void ToolMountUrlTest::users()
+void MountUrlTest::users()
 {
     QFETCH(const QString, scheme);
     QFETCH(const QString, user);
@@ -161,7 +161,7 @@ void ToolMountUrlTest::users()
     QCOMPARE(whyNoUser(scheme, user), reason);
 }
 
-void ToolMountUrlTest::shares_data()
+void MountUrlTest::shares_data()
 {
     QTest::addColumn<QStringList>("names");
     QTest::addColumn<QString>("reason");
@@ -187,14 +187,14 @@ void ToolMountUrlTest::shares_data()
     row("share", "host", "W\nG", "a control character in the name of the workgroup");
 }
 
-void ToolMountUrlTest::shares()
+void MountUrlTest::shares()
 {
     QFETCH(const QStringList, names);
     QFETCH(const QString, reason);
     QCOMPARE(whyNoShare(names.at(0), names.at(1), names.at(2)), reason);
 }
 
-void ToolMountUrlTest::shown_data()
+void MountUrlTest::shown_data()
 {
     QTest::addColumn<QString>("url");
     QTest::addColumn<QString>("text");
@@ -221,12 +221,12 @@ void ToolMountUrlTest::shown_data()
     row("", "");
 }
 
-void ToolMountUrlTest::shown()
+void MountUrlTest::shown()
 {
     QFETCH(const QString, url);
     QFETCH(const QString, text);
     QCOMPARE(shownUrl(url), text);
 }
 
-QTEST_GUILESS_MAIN(ToolMountUrlTest)
-#include "tst_tool_mounturl.moc"
+QTEST_GUILESS_MAIN(MountUrlTest)
+#include "tst_mounturl.moc"

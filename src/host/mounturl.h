@@ -1,13 +1,13 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#ifndef VEYFM_TOOL_MOUNTURL_H
-#define VEYFM_TOOL_MOUNTURL_H
+#ifndef VEYFM_HOST_MOUNTURL_H
+#define VEYFM_HOST_MOUNTURL_H
 
 #include <QString>
 
 namespace VeyFM {
-namespace Tool {
+namespace Host {
 
 // What is looked at before a job gets it. The jobs hand texts on to smbclient, curlftpfs and sshfs
 // as they come: a blank in the name of a share ends the argument that it is in, a comma in the
@@ -33,7 +33,7 @@ QString whyNoShare(const QString& share, const QString& host, const QString& wor
 /// The URL as it may be shown: without the password, be it a valid URL or not.
 QString shownUrl(const QString& url);
 
-} // namespace Tool
+} // namespace Host
 } // namespace VeyFM
 
 #endif

@@ -1,15 +1,15 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#ifndef VEYFM_TOOL_PIDFD_H
-#define VEYFM_TOOL_PIDFD_H
+#ifndef VEYFM_HOST_PIDFD_H
+#define VEYFM_HOST_PIDFD_H
 
 #include <sys/syscall.h>
 #include <sys/types.h>
 #include <unistd.h>
 
 namespace VeyFM {
-namespace Tool {
+namespace Host {
 
 // By number: glibc 2.36 declares pidfd_open() without C linkage.
 
@@ -25,7 +25,7 @@ inline bool sendSignal(int pidfd, int number)
     return ::syscall(SYS_pidfd_send_signal, pidfd, number, nullptr, 0) == 0;
 }
 
-} // namespace Tool
+} // namespace Host
 } // namespace VeyFM
 
 #endif
