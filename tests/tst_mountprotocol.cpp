@@ -149,6 +149,8 @@ void TestMountProtocol::passesRequests_data()
         R"({"do":"mount","url":"sftp://anna@server/~/Ördner","version":1})");
     QTest::newRow("mount for a user")
         << QByteArray(R"({"do":"mount","url":"ftp://server/","user":"anna","version":1})");
+    QTest::newRow("mount with patience")
+        << QByteArray(R"({"do":"mount","patience":200,"url":"ftp://server/","version":1})");
     QTest::newRow("yes") << QByteArray(R"({"do":"answer","id":1,"yes":true})");
     QTest::newRow("no") << QByteArray(R"({"do":"answer","id":2147483647,"yes":false})");
     QTest::newRow("password") << QByteArray(R"({"do":"answer","id":2,"password":true})");
@@ -234,6 +236,7 @@ void TestMountProtocol::passesReports()
         R"({"say":"rejected","user":"anna"})",
         R"({"say":"accepted"})",
         R"({"code":5,"say":"end","text":"Mounting sftp resource failed"})",
+        R"({"code":1,"directory":"/m/sftp/h","say":"end","text":"no such file"})",
         R"({"code":0,"directory":"/m/sftp/h","localPath":"/m/sftp/h/x","mounted":"present",)"
         R"("path":"SFTP/h/x","say":"end","shared":true,"text":"","url":"sftp://h/x"})",
         R"({"code":0,"directory":"/m/sftp/h","localPath":"/m/sftp/h/x","mounted":"new",)"

@@ -94,16 +94,25 @@ private:
 
 } // namespace
 
-int lookAt(const QString& path, std::chrono::milliseconds patience)
+int runInChild(const std::function<int()>& work, std::chrono::milliseconds patience)
 {
-    const QByteArray name = QFile::encodeName(path);
     const pid_t pid = ::fork();
     if (pid == 0) {
         ::closefrom(STDIN_FILENO);
-        struct statfs info;
-        ::_exit(::statfs(name.constData(), &info) == 0 ? 0 : errno);
+        ::_exit(work());
     }
-    return pid < 0 ? errno : waitForChild(pid, patience);
+    return pid < 0 ? -1 : waitForChild(pid, patience);
+}
+
+int lookAt(const QString& path, std::chrono::milliseconds patience)
+{
+    const QByteArray name = QFile::encodeName(path);
+    return runInChild(
+        [&name] {
+            struct statfs info;
+            return ::statfs(name.constData(), &info) == 0 ? 0 : errno;
+        },
+        patience);
 }
 
 bool unmountFuse(const QString& directory, bool lazily)

@@ -7,6 +7,7 @@
 #include <QString>
 
 #include <chrono>
+#include <functional>
 
 namespace VeyFM {
 namespace Host {
@@ -14,6 +15,10 @@ namespace Host {
 // What may hang in a mount whose server has gone, done in a child that is given up after a while.
 // A look that hangs can't be taken back, not even by the end of its process: such a child goes when
 // the mount does.
+
+/// Runs work in a child without descriptors: its exit code, or -1 for one that takes too long. In a
+/// process with threads the work must do nothing that needs a lock.
+int runInChild(const std::function<int()>& work, std::chrono::milliseconds patience);
 
 /// Looks at the file system of a path: 0, the error, or -1 for one that does not answer.
 int lookAt(const QString& path, std::chrono::milliseconds patience);

@@ -221,11 +221,13 @@ End readEnd(Members& members)
     End end;
     end.code = members.number("code");
     end.text = members.text("text");
+    if (end.code == 0 || members.has("directory")) {
+        end.directory = members.text("directory");
+    }
     if (end.code == 0) {
         end.url = members.text("url");
         end.path = members.text("path");
         end.localPath = members.text("localPath");
-        end.directory = members.text("directory");
         end.mounted = kindOf<End::Mounted>(members, "mounted", mountedNames);
         end.isShared = members.flag("shared");
         end.why = members.has("why") ? members.text("why") : QString();
@@ -253,13 +255,15 @@ void writeEnd(const End& end, QJsonObject* object)
 {
     object->insert(QStringLiteral("code"), end.code);
     object->insert(QStringLiteral("text"), clipped(end.text));
+    if (end.code == 0 || !end.directory.isEmpty()) {
+        object->insert(QStringLiteral("directory"), end.directory);
+    }
     if (end.code != 0) {
         return;
     }
     object->insert(QStringLiteral("url"), end.url);
     object->insert(QStringLiteral("path"), end.path);
     object->insert(QStringLiteral("localPath"), end.localPath);
-    object->insert(QStringLiteral("directory"), end.directory);
     object->insert(QStringLiteral("mounted"), QLatin1String(mountedNames[end.mounted]));
     object->insert(QStringLiteral("shared"), end.isShared);
     if (!end.why.isEmpty()) {
@@ -276,6 +280,9 @@ QByteArray encode(const Request& request)
     case Request::Mount:
         object.insert(QStringLiteral("version"), version);
         object.insert(QStringLiteral("url"), request.url);
+        if (request.patience != Request().patience) {
+            object.insert(QStringLiteral("patience"), request.patience);
+        }
         break;
     case Request::Answer:
         object.insert(QStringLiteral("id"), request.id);
@@ -333,6 +340,9 @@ std::optional<Request> decodeRequest(const Line& line, QString* why)
         members.checkVersion();
         request.url = members.shortText("url");
         request.user = members.shortTextOrNull("user");
+        if (members.has("patience")) {
+            request.patience = members.number("patience");
+        }
     } else if (members.isGood() && request.kind == Request::Answer) {
         readAnswer(members, &request);
     }

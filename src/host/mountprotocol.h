@@ -42,7 +42,8 @@ struct Request
 
     Kind kind = Cancel;
     QString url;
-    QString user; ///< Null where it was left out: as it is.
+    QString user;        ///< Null where it was left out: as it is.
+    int patience = 5000; ///< Milliseconds that a look at what is mounted may take.
     int id = 0;
     Reply reply = GivenUp;
     bool hasPassword = false;
@@ -74,12 +75,14 @@ struct End
         Reached  ///< A Samba URL, for which nothing is mounted.
     };
 
-    int code = 0; ///< See Job; nothing but the text holds for others than 0.
+    int code = 0; ///< See Job; nothing but the text and the directory hold for others than 0.
     QString text;
     QString url;  ///< With the user that was taken in the end.
     QString path; ///< In the tree of places; empty where there is none.
     QString localPath;
-    QString directory; ///< That the root of the URL is mounted on.
+    /// That the root of the URL is mounted on. With a failure, where there is a mount all the same:
+    /// there was, or the path below it is missing.
+    QString directory;
     Mounted mounted = New;
     bool isShared = false; ///< Whether the service knows of the mount.
     QString why;           ///< Why it does not.
