@@ -132,6 +132,7 @@ void Descendants::end(pid_t spared)
 {
     const Clock::time_point begin = Clock::now();
     std::set<pid_t> asked;
+    std::set<pid_t> helpers;
     while (true) {
         if (spared == 0) {
             reap(0);
@@ -141,25 +142,36 @@ void Descendants::end(pid_t spared)
         if (time > askingTime + killingTime || (all.empty() && hasNone(spared))) {
             return;
         }
+        std::set<pid_t> askedNow;
         for (const Process& process : all) {
-            const bool mustGo = time > askingTime;
-            const bool isAskable = asked.count(process.pid) == 0 && !isUnmounting(process.pid);
-            if (!mustGo && !isAskable) {
-                continue;
-            }
-            // Another that gets the number meanwhile has another parent, or is ours as well.
-            const int handle = Host::openPidfd(process.pid);
-            if (handle >= 0 && statFields(process.pid).value(1).toInt() == process.parent) {
-                asked.insert(process.pid);
-                Host::sendSignal(handle, mustGo ? SIGKILL : SIGTERM);
-                Host::sendSignal(handle, SIGCONT); // One that is stopped would not see it.
-            }
-            if (handle >= 0) {
-                ::close(handle);
+            const bool isSeen = asked.count(process.pid) + helpers.count(process.pid) > 0;
+            if (time > askingTime) {
+                signal(process, SIGKILL);
+            } else if (!isSeen && (asked.count(process.parent) > 0 || isUnmounting(process.pid))) {
+                helpers.insert(process.pid);
+            } else if (!isSeen && signal(process, SIGTERM)) {
+                askedNow.insert(process.pid);
             }
         }
+        asked.insert(askedNow.begin(), askedNow.end());
         waitForChange();
     }
+}
+
+/// False where it is not there any more. Another that gets the number meanwhile has another parent,
+/// or is ours as well.
+bool Descendants::signal(const Process& process, int number)
+{
+    const int handle = Host::openPidfd(process.pid);
+    const bool isSame = handle >= 0 && statFields(process.pid).value(1).toInt() == process.parent;
+    if (isSame) {
+        Host::sendSignal(handle, number);
+        Host::sendSignal(handle, SIGCONT); // One that is stopped would not see it.
+    }
+    if (handle >= 0) {
+        ::close(handle);
+    }
+    return isSame;
 }
 
 bool Descendants::reap(pid_t child)

@@ -25,9 +25,10 @@ public:
     Descendants();
 
     /**
-     * Ends all but one of them, which may be 0, and what else they start: by SIGTERM, and after two
-     * seconds by SIGKILL. fusermount3 is no daemon, and is given that time to finish. What does not
-     * even go then waits in the kernel for a file system, and is left behind a second later.
+     * Ends all but one of them, which may be 0: by SIGTERM, and after two seconds by SIGKILL. What
+     * they start when they have been asked gets that time in peace, as does fusermount3, which
+     * sshfs runs at its end. What does not even go then waits in the kernel for a file system, and
+     * is left behind a second later.
      */
     void end(pid_t spared = 0);
 
@@ -43,6 +44,7 @@ private:
 
     std::vector<Process> running(pid_t spared) const;
     bool hasNone(pid_t spared) const;
+    static bool signal(const Process& process, int number);
 
     std::vector<pid_t> m_inherited;
 };

@@ -123,7 +123,7 @@ End mount(SupervisorLink& link, const Request& request)
 /// standard error by people who can't place them.
 void dropWarnings(QtMsgType type, const QMessageLogContext& context, const QString& message)
 {
-    if (type == QtCriticalMsg || type == QtFatalMsg) {
+    if (type == QtFatalMsg) {
         std::fprintf(stderr, "%s\n", qPrintable(qFormatLogMessage(type, context, message)));
     }
 }
@@ -137,6 +137,7 @@ void runWorker(int socket, int& argc, char** argv)
     qInstallMessageHandler(dropWarnings);
     QCoreApplication application(argc, argv);
     QCoreApplication::setApplicationName(QStringLiteral("veyfm-mount"));
+    VFS::initialize();
     Report report;
     report.kind = Report::Ended;
     report.end = mount(link, request);
