@@ -66,6 +66,7 @@ private Q_SLOTS:
     void refusesReports_data();
     void refusesReports();
     void cutsLongTexts();
+    void fitsIntoALine();
     void passesSecrets_data();
     void passesSecrets();
     void refusesSecrets_data();
@@ -293,6 +294,17 @@ void TestMountProtocol::cutsLongTexts()
     QVERIFY(cut.size() > longestText / 4);
     QVERIFY(cut.back().isLowSurrogate());
     QVERIFY(asked.question.message.startsWith(cut));
+}
+
+void TestMountProtocol::fitsIntoALine()
+{
+    Report ended;
+    ended.kind = Report::Ended;
+    ended.end.localPath = QString(longestLine, QLatin1Char('x'));
+    const QByteArray line = encode(ended);
+    QVERIFY(line.size() <= longestLine);
+    QString why;
+    QCOMPARE(report(line, &why)->end.code, 5);
 }
 
 void TestMountProtocol::passesSecrets_data()

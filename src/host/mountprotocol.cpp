@@ -328,7 +328,16 @@ QByteArray encode(const Report& report)
         writeEnd(report.end, &object);
         break;
     }
-    return lineOf(object);
+    const QByteArray line = lineOf(object);
+    if (line.size() <= longestLine + 1) {
+        return line;
+    }
+    Report tooLong;
+    tooLong.kind = Report::Ended;
+    tooLong.end.code = 5;
+    tooLong.end.text =
+        QStringLiteral("what is to be said is longer than %1 bytes").arg(longestLine);
+    return encode(tooLong);
 }
 
 std::optional<Request> decodeRequest(const Line& line, QString* why)

@@ -107,7 +107,8 @@ struct Report
     End end;
 };
 
-/// A line, with its end. Texts of others are cut at longestText. @{
+/// A line, with its end. Texts of others are cut at longestText; a report that is too long all the
+/// same becomes a failure. @{
 QByteArray encode(const Request& request);
 QByteArray encode(const Report& report);
 /// @}
