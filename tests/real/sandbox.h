@@ -32,9 +32,9 @@ struct SandboxAccount
  *   - the tests run as the user `tester`, who is in the group `fuse` and may open /dev/fuse for
  *     that alone, without a terminal,
  *   - `alice` and `bob` have accounts on the servers, and the three homes are different,
- *   - there is loopback and nothing else: server.test (or server), other.test, key.test and
- *     closed.test, which nobody listens on, are addresses of their own, so each server has its
- *     usual port; so is ::1, where the machine knows IPv6,
+ *   - there is loopback and nothing else: server.test (or server), other.test, key.test,
+ *     stalled.test and closed.test, which nobody listens on, are addresses of their own, so each
+ *     server has its usual port; so is ::1, where the machine knows IPv6,
  *   - /run is empty, and everything is written below it, in memory: HOME, the XDG folders and
  *     temporary files of the tests too. Nothing is left on the disk, however the test ends.
  *
@@ -62,6 +62,7 @@ public:
     static constexpr const char* otherHost = "other.test";
     static constexpr const char* closedHost = "closed.test";
     static constexpr const char* keyHost = "key.test";
+    static constexpr const char* stalledHost = "stalled.test"; ///< See StallingServer.
 
     /// Takes the programs, by absolute path, without which the tests skip.
     explicit Sandbox(const QByteArrayList& programs = {});

@@ -29,7 +29,8 @@ const char hosts[] = "127.0.0.1 localhost sandbox\n"
                      "127.0.0.11 server.test server\n"
                      "127.0.0.12 other.test\n"
                      "127.0.0.13 closed.test\n"
-                     "127.0.0.14 key.test\n";
+                     "127.0.0.14 key.test\n"
+                     "127.0.0.15 stalled.test\n";
 
 // Files alone: neither a name service of the machine nor a network is asked.
 const char nameServices[] = "passwd: files\n"
