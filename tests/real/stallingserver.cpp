@@ -8,6 +8,7 @@
 #include <QFile>
 
 #include <algorithm>
+#include <limits>
 
 #include <arpa/inet.h>
 #include <netinet/in.h>
@@ -24,8 +25,15 @@ constexpr const char* serverAddress = "127.0.0.11";
 constexpr unsigned short sshPort = 22;
 constexpr unsigned short silentPorts[] = {21, 139, 445};
 
+/// Bytes, and a number for what is stalled then: the server's files can't be removed by the tests.
 const char limitFile[] = "/run/sandbox/tmp/stall-after";
-const char stalledFile[] = "/run/sandbox/tmp/has-stalled";
+
+QString stalledFile(int number)
+{
+    return QStringLiteral("/run/sandbox/tmp/has-stalled-%1").arg(number);
+}
+
+int lastNumber = 0; // Of the tests.
 
 sockaddr_in addressOf(const char* host, unsigned short port)
 {
@@ -46,17 +54,18 @@ int listenOn(unsigned short port)
     return done ? fd : -1;
 }
 
-int readLimit()
+QList<QByteArray> readLimit()
 {
     QFile file(QString::fromLatin1(limitFile));
-    return file.open(QIODevice::ReadOnly) ? file.readAll().toInt() : 0;
+    return file.open(QIODevice::ReadOnly) ? file.readAll().split(' ') : QList<QByteArray>();
 }
 
 /// False at the end of the connection.
-bool pass(int from, int to, int most)
+bool pass(int from, int to, int* most)
 {
     char buffer[4096];
-    const ssize_t size = ::read(from, buffer, size_t(std::min(most, int(sizeof buffer))));
+    const ssize_t size = ::read(from, buffer, size_t(std::min(*most, int(sizeof buffer))));
+    *most -= int(size);
     return size > 0 && ::write(to, buffer, size_t(size)) == size;
 }
 
@@ -67,24 +76,23 @@ bool pass(int from, int to, int most)
     if (::connect(server, reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0) {
         ::_exit(1);
     }
-    int left = readLimit();
+    const QList<QByteArray> limit = readLimit();
+    int left = limit.value(0).toInt();
     bool isOpen = true;
     while (isOpen) {
         if (left == 0) {
-            QFile file(QString::fromLatin1(stalledFile));
+            QFile file(stalledFile(limit.value(1).toInt()));
             file.open(QIODevice::WriteOnly);
             left = -1;
         }
         pollfd polls[] = {{client, POLLIN, 0}, {left > 0 ? server : -1, POLLIN, 0}};
         ::poll(polls, 2, -1);
         if (polls[0].revents != 0) {
-            isOpen = pass(client, server, 4096);
+            int unbounded = std::numeric_limits<int>::max();
+            isOpen = pass(client, server, &unbounded);
         }
         if (isOpen && polls[1].revents != 0) {
-            char buffer[4096];
-            const ssize_t size = ::read(server, buffer, size_t(std::min(left, int(sizeof buffer))));
-            isOpen = size > 0 && ::write(client, buffer, size_t(size)) == size;
-            left -= int(size);
+            isOpen = pass(server, client, &left);
         }
     }
     ::_exit(0);
@@ -125,14 +133,14 @@ bool StallingServer::start()
 
 void StallingServer::stallAfter(int bytes)
 {
-    QFile::remove(QString::fromLatin1(stalledFile));
     QFile file(QString::fromLatin1(limitFile));
-    if (!file.open(QIODevice::WriteOnly) || file.write(QByteArray::number(bytes)) <= 0) {
+    const QByteArray text = QByteArray::number(bytes) + ' ' + QByteArray::number(++lastNumber);
+    if (!file.open(QIODevice::WriteOnly) || file.write(text) != text.size()) {
         qFatal("%s", qPrintable(file.errorString()));
     }
 }
 
 bool StallingServer::hasStalled()
 {
-    return QFile::exists(QString::fromLatin1(stalledFile));
+    return QFile::exists(stalledFile(lastNumber));
 }

@@ -1,29 +1,18 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-#include "real/knownhosts.h"
-#include "real/realftptest.h"
-#include "real/stallingserver.h"
-#include "support/helpersession.h"
+#include "real/realhelpertest.h"
 
 #include <QElapsedTimer>
-#include <QTest>
-
-#include <algorithm>
-#include <memory>
-#include <vector>
 
 #include <signal.h>
-#include <unistd.h>
 
-/// veyfm-mount against real servers: what is mounted, and that nothing is left of what is not.
-class RealMountHelperTest : public QObject
+/// veyfm-mount against real servers, such as are silent too.
+class RealMountHelperTest : public RealHelperTest
 {
     Q_OBJECT
 
 private Q_SLOTS:
-    void init();
-    void cleanup();
     void firstContact();
     void wrongThenRightPassword_data();
     void wrongThenRightPassword();
@@ -35,109 +24,7 @@ private Q_SLOTS:
     void stoppedProcesses();
     void encryptedKey();
     void behindAJumpHost();
-    void cancelledAtAnyMoment();
-    void hostKilledAtAnyMoment();
-    void threeAtOnce();
-
-private:
-    static QByteArray passwordOf(const SandboxAccount& account)
-    {
-        return account.password;
-    }
-
-    static QString mountDir(const QString& relative = QString())
-    {
-        return QDir::homePath() + u"/.vey-fm-vfs"_s + relative;
-    }
-
-    static QStringList mountDirs()
-    {
-        QStringList result;
-        const QList<QByteArray> lines = fileContents(u"/proc/self/mounts"_s).split('\n');
-        for (const QByteArray& line : lines) {
-            const QString directory = QFile::decodeName(line.split(' ').value(1));
-            if (directory.startsWith(mountDir(u"/"_s))) {
-                result.append(directory);
-            }
-        }
-        return result;
-    }
-
-    /// What a mount needs, or has needed, and what is left of it.
-    static QStringList leftovers()
-    {
-        QStringList result = mountDirs();
-        if (QFile::exists(mountDir())) {
-            result += mountDir();
-        }
-        return result + processes();
-    }
-
-    /// Those that still run, by their programs.
-    static QStringList processes()
-    {
-        QStringList result;
-        for (const char* name :
-             {"veyfm-mount", "sshfs", "ssh", "fusermount3", "rclone", "curlftpfs", "smbclient",
-              "ssh-askpass"}) {
-            const QList<int> pids = processesNamed(name);
-            for (const int pid : pids) {
-                const QByteArray stat = fileContents(u"/proc/%1/stat"_s.arg(pid));
-                // Some have ended when one looks.
-                if (stat != "unreadable" && !stat.contains(") Z ")) {
-                    result += QString::fromLatin1(name);
-                }
-            }
-        }
-        return result;
-    }
-
-    /// Answers all questions, with yes or the password, up to the end.
-    static QJsonObject answerAll(HelperSession& session, const QByteArray& password)
-    {
-        while (true) {
-            const QJsonObject said = session.next();
-            const QString kind = textOf(said, "say");
-            if (kind == u"end"_s || said.isEmpty()) {
-                return said;
-            }
-            if (textOf(said, "kind") == u"confirm"_s) {
-                session.confirm(numberOf(said, "id"), true);
-            } else if (kind == u"question"_s) {
-                session.answerPassword(numberOf(said, "id"), password);
-            }
-        }
-    }
-
-    static QByteArray aliceUrl()
-    {
-        return QByteArray("sftp://alice@") + Sandbox::serverHost + "/~/papers";
-    }
 };
-
-void RealMountHelperTest::init()
-{
-    SKIP_WITHOUT_SANDBOX();
-    KnownHosts::clear();
-    KnownHosts::add(Sandbox::serverHost);
-}
-
-void RealMountHelperTest::cleanup()
-{
-    if (!Sandbox::isEntered()) {
-        return;
-    }
-    const QStringList mounted = mountDirs();
-    for (const QString& directory : mounted) {
-        QCOMPARE(QProcess::execute(u"fusermount3"_s, {u"-u"_s, directory}), 0);
-    }
-    QDir(mountDir()).removeRecursively();
-    QTRY_COMPARE(processes(), QStringList());
-    QStringList findings = SecretWatch::takeFindings();
-    findings.removeAll(u"smbclient environ"_s); // Where the contract puts it.
-    QCOMPARE(findings, QStringList());
-    QCOMPARE(SecretWatch::findFiles(), QStringList());
-}
 
 void RealMountHelperTest::firstContact()
 {
@@ -275,7 +162,7 @@ void RealMountHelperTest::stalledAmidAStage()
     known.close();
     int stalled = 0;
     int mounted = 0;
-    for (int bytes = 1; bytes < 4000; bytes += 160) {
+    for (int bytes = 1; bytes < 20000; bytes += 1 + bytes / 4) {
         StallingServer::stallAfter(bytes);
         HelperSession session;
         session.mount("sftp://alice@stalled.test/~/papers", R"(,"patience":200)");
@@ -369,143 +256,9 @@ void RealMountHelperTest::behindAJumpHost()
     QCOMPARE(leftovers(), QStringList());
 }
 
-void RealMountHelperTest::cancelledAtAnyMoment()
-{
-    constexpr int moments = 100;
-    QElapsedTimer time;
-    time.start();
-    {
-        HelperSession session;
-        session.mount(aliceUrl());
-        QCOMPARE(numberOf(answerAll(session, passwordOf(Sandbox::alice)), "code"), 0);
-        session.cancel();
-        QCOMPARE(session.waitForEnd(), 1);
-    }
-    const qint64 whole = time.nsecsElapsed();
-    int cancelled = 0;
-    for (int moment = 0; moment < moments; ++moment) {
-        const qint64 due = whole * moment / moments;
-        time.start();
-        HelperSession session;
-        session.mount(aliceUrl());
-        while (time.nsecsElapsed() < due) {
-            const int left = int((due - time.nsecsElapsed()) / 1000000);
-            if (!session.saysMore(left)) {
-                continue;
-            }
-            const QJsonObject said = session.next();
-            if (textOf(said, "say") == u"question"_s) {
-                session.answerPassword(numberOf(said, "id"), passwordOf(Sandbox::alice));
-            }
-        }
-        session.cancel();
-        QJsonObject last;
-        for (QJsonObject said = session.next(); !said.isEmpty(); said = session.next()) {
-            last = said;
-        }
-        QCOMPARE(textOf(last, "say"), u"end"_s);
-        QCOMPARE(numberOf(last, "code"), 2);
-        QCOMPARE(session.waitForEnd(), 1);
-        ++cancelled;
-        QVERIFY2(
-            leftovers().isEmpty(), qPrintable(u"at %1 %: "_s.arg(moment) + leftovers().join(u' ')));
-    }
-    QCOMPARE(cancelled, moments);
-}
-
-void RealMountHelperTest::hostKilledAtAnyMoment()
-{
-    // The shell is the host, and holds the ends of both pipes.
-    const QString script = QStringLiteral(
-        "rm -f in out; mkfifo in out; \"$0\" <in >out & exec 3>in 4<out\n"
-        "echo '{\"do\":\"mount\",\"version\":1,\"url\":\"%1\"}' >&3\n"
-        "while read line <&4; do case $line in *'\"question\"'*)\n"
-        "echo '{\"do\":\"answer\",\"id\":1,\"password\":true}' >&3; read password; echo "
-        "\"$password\" >&3;;\n"
-        "*) echo \"$line\";; esac; done");
-    constexpr int moments = 20;
-    qint64 whole = 0;
-    for (int moment = 0; moment <= moments; ++moment) {
-        QElapsedTimer time;
-        time.start();
-        QProcess host;
-        host.setWorkingDirectory(QDir::homePath());
-        host.start(
-            u"/bin/sh"_s, {u"-c"_s, script.arg(QString::fromLatin1(aliceUrl())),
-                           QStringLiteral(VEYFM_MOUNT_HELPER)});
-        QVERIFY(host.waitForStarted());
-        host.write('"' + passwordOf(Sandbox::alice) + "\"\n");
-        const qint64 due = whole * moment / moments;
-        QByteArray said;
-        // The first time up to the end.
-        while (whole == 0 ? !said.contains("\"code\":0") : time.elapsed() < due) {
-            host.waitForReadyRead(int(std::max<qint64>(1, due - time.elapsed())));
-            said += host.readAll();
-            QVERIFY(time.elapsed() < HelperSession::patience);
-        }
-        whole = whole == 0 ? std::max<qint64>(1, time.elapsed()) : whole;
-        host.kill();
-        QVERIFY(host.waitForFinished());
-        QTRY_COMPARE_WITH_TIMEOUT(leftovers(), QStringList(), 10000);
-    }
-    QFile::remove(QDir::homePath() + u"/in"_s);
-    QFile::remove(QDir::homePath() + u"/out"_s);
-}
-
-void RealMountHelperTest::threeAtOnce()
-{
-    constexpr int rounds = 200;
-    for (int round = 0; round < rounds; ++round) {
-        std::vector<std::unique_ptr<HelperSession>> sessions;
-        for (int i = 0; i < 3; ++i) {
-            sessions.push_back(std::make_unique<HelperSession>());
-        }
-        for (const auto& session : sessions) {
-            session->mount(aliceUrl());
-        }
-        int made = 0;
-        int present = 0;
-        std::vector<bool> ended(sessions.size(), false);
-        while (std::find(ended.begin(), ended.end(), false) != ended.end()) {
-            for (size_t i = 0; i < sessions.size(); ++i) {
-                if (ended[i] || !sessions[i]->saysMore(5)) {
-                    continue;
-                }
-                const QJsonObject said = sessions[i]->next();
-                if (textOf(said, "say") == u"question"_s) {
-                    sessions[i]->answerPassword(numberOf(said, "id"), passwordOf(Sandbox::alice));
-                } else if (textOf(said, "say") == u"end"_s) {
-                    QVERIFY2(numberOf(said, "code") == 0, qPrintable(textOf(said, "text")));
-                    made += textOf(said, "mounted") == u"new"_s;
-                    present += textOf(said, "mounted") == u"present"_s;
-                    ended[i] = true;
-                    sessions[i]->take();
-                }
-            }
-        }
-        QCOMPARE(made, 1);
-        QCOMPARE(present, 2);
-        const QString directory = mountDir(u"/sftp/alice@server.test~"_s);
-        QCOMPARE(mountDirs(), QStringList(directory));
-        sessions.clear();
-        QCOMPARE(QProcess::execute(u"fusermount3"_s, {u"-u"_s, directory}), 0);
-    }
-}
-
 int main(int argc, char** argv)
 {
-    Sandbox sandbox(
-        {"/usr/bin/sshfs", "/usr/bin/fusermount3", "/usr/bin/smbclient", "/usr/bin/rclone"});
-    sandbox.addServer(std::make_unique<SecretWatch>());
-    sandbox.addServer(std::make_unique<SshServer>(Sandbox::serverHost));
-    sandbox.addServer(
-        std::make_unique<SshServer>(Sandbox::otherHost, SshServer::KeyboardInteractive));
-    sandbox.addServer(std::make_unique<FtpServer>(Sandbox::serverHost));
-    sandbox.addServer(std::make_unique<StallingServer>());
-    return sandbox.run([&] {
-        useCurlftpfsAdapter();
-        return runSandboxTests<RealMountHelperTest>(argc, argv);
-    });
+    return runHelperTests<RealMountHelperTest>(argc, argv);
 }
 
 #include "tst_real_mounthelper.moc"

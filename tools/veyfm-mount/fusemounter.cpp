@@ -60,6 +60,7 @@ QString FuseMounter::rootUrl() const
 End FuseMounter::mount()
 {
     m_whyAlone = whyNoService();
+    m_runner.authenticator().setMountHost(m_url.host(QUrl::FullyDecoded));
     while (true) {
         lock();
         const JobResult result = work();

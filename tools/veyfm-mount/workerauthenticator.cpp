@@ -57,10 +57,16 @@ void WorkerAuthenticator::setOfferedUser(const QString& user)
     m_offeredUser = user;
 }
 
+void WorkerAuthenticator::setMountHost(const QString& host)
+{
+    m_mountHost = host;
+}
+
 void WorkerAuthenticator::beginJob()
 {
     setResource(QString(), QString(), QString(), QString());
     m_passwordGiven = false;
+    m_asked.clear();
     m_keyConfirmed = false;
     m_wasAccepted = false;
     m_whyEnded.clear();
@@ -131,6 +137,7 @@ QString WorkerAuthenticator::requestPassword(
     const bool wasPasswordGiven = std::exchange(m_passwordGiven, false);
     if (!isUsed) {
         m_refused.insert(resource());
+        m_asked.clear();
         if (wasPasswordGiven) {
             return QString(); // The tool asks again.
         }
@@ -154,7 +161,9 @@ QString WorkerAuthenticator::requestPassword(
     question.host = server();
     question.domain = domain();
     question.object = object();
-    question.isRetry = m_refused.contains(resource());
+    // A tool that asks the same again did not like what it got, such as the passphrase of a key.
+    question.isRetry = m_refused.contains(resource()) || m_asked.contains(resource() + message);
+    m_asked.insert(resource() + message);
     const QString before = user;
     QString password = ask(question, isUsed, user, cancelled);
     *userChanged = user != before;
@@ -172,7 +181,7 @@ QString WorkerAuthenticator::ask(Question question, bool isUsed, QString& user, 
             return QString();
         }
         const QString name = reply.answer.user.isNull() ? question.user : reply.answer.user;
-        const QString why = whyUnfit(name, reply.password);
+        const QString why = whyUnfit(name, name != user, reply.password);
         if (!why.isEmpty()) {
             MountProtocol::erase(&reply.password);
             question.message = why;
@@ -199,13 +208,17 @@ QString WorkerAuthenticator::ask(Question question, bool isUsed, QString& user, 
 }
 
 /// Why the job can't hand the answer to its tool, or empty.
-QString WorkerAuthenticator::whyUnfit(const QString& user, const QString& password) const
+QString WorkerAuthenticator::whyUnfit(
+    const QString& user, bool isUserChanged, const QString& password) const
 {
-    const QString why = Host::whyNoUser(protocol(), user);
-    if (why.isEmpty() && !survivesLocale(password)) {
+    if (isUserChanged && !m_mountHost.isNull() && server() != m_mountHost) {
+        return QStringLiteral("%1 is a host on the way: its user can't be changed here")
+            .arg(server());
+    }
+    if (!survivesLocale(password)) {
         return QStringLiteral("the encoding of the locale can't express this password");
     }
-    return why;
+    return isUserChanged ? Host::whyNoUser(protocol(), user) : QString();
 }
 
 bool WorkerAuthenticator::askQuestion(const QString& title, const QString& text)

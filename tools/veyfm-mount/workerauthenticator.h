@@ -36,6 +36,9 @@ public:
     /// What stands for the user that a Samba job begins without.
     void setOfferedUser(const QString& user);
 
+    /// The host whose user may be changed. Another one that asks is on the way there.
+    void setMountHost(const QString& host);
+
     /// To be called before a job: forgets what the one before was told, but not what was refused.
     void beginJob();
 
@@ -61,14 +64,16 @@ public:
 private:
     QString resource() const;
     QString ask(MountProtocol::Question question, bool isUsed, QString& user, bool* cancelled);
-    QString whyUnfit(const QString& user, const QString& password) const;
+    QString whyUnfit(const QString& user, bool isUserChanged, const QString& password) const;
 
     SupervisorLink& m_link;
     QString m_offeredUser;
+    QString m_mountHost;
     QString m_newUser;
     QString m_keptPassword;       ///< Came with the new user. Null where there is none.
     QString m_keptFor;            ///< The resource.
     QSet<QString> m_refused;      ///< Resources.
+    QSet<QString> m_asked;        ///< Since the tool has been started.
     bool m_passwordGiven = false; ///< Since the tool has been started.
     bool m_keyConfirmed = false;
     bool m_wasAccepted = false;
