@@ -112,6 +112,16 @@ protected:
         }
     }
 
+    /// What stands behind it is server.test.
+    static void addStalledHost()
+    {
+        QFile known(KnownHosts::path());
+        QVERIFY(known.open(QIODevice::Append));
+        known.write(
+            QByteArray(Sandbox::stalledHost) + ' ' + SshServer::publicKey(Sandbox::serverHost) +
+            '\n');
+    }
+
     static QByteArray aliceUrl()
     {
         return QByteArray("sftp://alice@") + Sandbox::serverHost + "/~/papers";
@@ -130,6 +140,7 @@ public:
         addServer(std::make_unique<SecretWatch>());
         addServer(std::make_unique<SshServer>(serverHost));
         addServer(std::make_unique<SshServer>(otherHost, SshServer::KeyboardInteractive));
+        addServer(std::make_unique<SshServer>(keyHost, SshServer::Key));
         addServer(std::make_unique<FtpServer>(serverHost));
         addServer(std::make_unique<StallingServer>());
     }

@@ -4,6 +4,7 @@
 #include "real/realhelpertest.h"
 
 #include <QElapsedTimer>
+#include <QTemporaryDir>
 
 #include <signal.h>
 
@@ -23,7 +24,10 @@ private Q_SLOTS:
     void stalledAmidAStage();
     void stoppedProcesses();
     void encryptedKey();
+    void keyOfAnAgent();
+    void behindAJumpHost_data();
     void behindAJumpHost();
+    void otherUserOfAJumpHost();
 };
 
 void RealMountHelperTest::firstContact()
@@ -154,12 +158,7 @@ void RealMountHelperTest::stalledAmidAStage()
 {
     // From the version of the server over the exchange of keys and the login to the first looks at
     // the files.
-    KnownHosts::add(Sandbox::serverHost); // A line to take the key from.
-    QFile known(KnownHosts::path());
-    QVERIFY(known.open(QIODevice::Append));
-    known.write(
-        QByteArray(Sandbox::stalledHost) + ' ' + SshServer::publicKey(Sandbox::serverHost) + '\n');
-    known.close();
+    addStalledHost();
     int stalled = 0;
     int mounted = 0;
     for (int bytes = 1; bytes < 20000; bytes += 1 + bytes / 4) {
@@ -215,45 +214,145 @@ void RealMountHelperTest::stoppedProcesses()
 
 void RealMountHelperTest::encryptedKey()
 {
-    // Nobody holds it, so that ssh asks for what opens it.
-    const QString key = QDir::homePath() + u"/.ssh/id_ed25519"_s;
-    QCOMPARE(
-        QProcess::execute(
-            u"ssh-keygen"_s,
-            {u"-q"_s, u"-t"_s, u"ed25519"_s, u"-N"_s, u"phrase-4-key"_s, u"-f"_s, key}),
-        0);
+    KnownHosts::add(Sandbox::keyHost);
+    KnownHosts::setConfiguration(
+        "Host key.test\nIdentityFile " + QFile::encodeName(SshServer::clientKey(Sandbox::keyHost)) +
+        '\n');
     HelperSession session;
-    session.mount(QByteArray("sftp://alice@") + Sandbox::otherHost + "/~/papers");
-    if (!session.saysMore(1000)) {
-        QVERIFY(!processesNamed("ssh").isEmpty());
-    }
+    session.mount("sftp://alice@key.test/~");
+    const QJsonObject question = session.next();
+    QCOMPARE(textOf(question, "kind"), u"password"_s);
+    QVERIFY(textOf(question, "message").contains(u"Enter passphrase for key"_s));
+    QCOMPARE(textOf(question, "host"), QString::fromLatin1(Sandbox::keyHost));
+    QCOMPARE(flagOf(question, "retry"), false);
+    session.answerPassword(numberOf(question, "id"), Sandbox::wrongPassword);
+    // It is asked for once, and then the login is refused.
+    QJsonObject said = session.next();
+    QCOMPARE(textOf(said, "say"), u"rejected"_s);
+    said = session.next();
+    QCOMPARE(flagOf(said, "retry"), true);
+    session.answerPassword(numberOf(said, "id"), SshServer::passphrase);
+    QCOMPARE(textOf(session.next(), "say"), u"accepted"_s);
+    QCOMPARE(numberOf(session.next(), "code"), 0);
     session.cancel();
     QCOMPARE(numberOf(session.end(), "code"), 2);
     QCOMPARE(session.waitForEnd(), 1);
-    QFile::remove(key);
-    QFile::remove(key + u".pub"_s);
     QCOMPARE(leftovers(), QStringList());
+
+    HelperSession cancelled;
+    cancelled.mount("sftp://alice@key.test/~");
+    QCOMPARE(textOf(cancelled.next(), "say"), u"question"_s);
+    cancelled.cancel();
+    QCOMPARE(numberOf(cancelled.end(), "code"), 2);
+    QCOMPARE(cancelled.waitForEnd(), 1);
+    QCOMPARE(leftovers(), QStringList());
+}
+
+void RealMountHelperTest::keyOfAnAgent()
+{
+    KnownHosts::add(Sandbox::keyHost);
+    const QString key = SshServer::clientKey(Sandbox::keyHost);
+    KnownHosts::setConfiguration("Host key.test\nIdentityFile " + QFile::encodeName(key) + '\n');
+    QTemporaryDir directory;
+    const QString socket = directory.filePath(u"agent"_s);
+    QProcess agent;
+    agent.start(u"ssh-agent"_s, {u"-D"_s, u"-a"_s, socket});
+    QTRY_VERIFY(QFile::exists(socket));
+    QFile askpass(directory.filePath(u"askpass"_s));
+    QVERIFY(askpass.open(QIODevice::WriteOnly));
+    askpass.write(QByteArray("#!/bin/sh\necho ") + SshServer::passphrase + '\n');
+    askpass.setPermissions(askpass.permissions() | QFile::ExeOwner);
+    askpass.close();
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(u"SSH_AUTH_SOCK"_s, socket);
+    QProcess add;
+    QProcessEnvironment adding = environment;
+    adding.insert(u"SSH_ASKPASS"_s, askpass.fileName());
+    adding.insert(u"SSH_ASKPASS_REQUIRE"_s, u"force"_s);
+    add.setProcessEnvironment(adding);
+    add.start(u"ssh-add"_s, {key});
+    QVERIFY(add.waitForFinished());
+    QCOMPARE(add.exitCode(), 0);
+    QVERIFY(askpass.remove());
+
+    HelperSession session(environment);
+    session.mount("sftp://alice@key.test/~");
+    QCOMPARE(textOf(session.next(), "say"), u"accepted"_s);
+    QCOMPARE(numberOf(session.next(), "code"), 0);
+    session.cancel();
+    QCOMPARE(numberOf(session.end(), "code"), 2);
+    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(leftovers(), QStringList());
+    // It was not started by the helper.
+    QCOMPARE(agent.state(), QProcess::Running);
+    agent.terminate();
+    QVERIFY(agent.waitForFinished());
+}
+
+void RealMountHelperTest::behindAJumpHost_data()
+{
+    QTest::addColumn<int>("answers");
+    QTest::addColumn<int>("bytes");
+    constexpr int all = 1 << 30;
+    QTest::newRow("at the first question") << 0 << all;
+    QTest::newRow("at the second question") << 1 << all;
+    QTest::newRow("behind a host that stalls") << 1 << 0;
+    QTest::newRow("behind the mount") << 2 << all;
 }
 
 void RealMountHelperTest::behindAJumpHost()
 {
     // Each of the two has an ssh of its own.
-    QFile config(QDir::homePath() + u"/.ssh/config"_s);
-    QVERIFY(config.open(QIODevice::WriteOnly));
-    config.write("Host stalled.test\n  ProxyJump bob@server.test\n");
-    config.close();
-    StallingServer::stallAfter(0);
+    QFETCH(int, answers);
+    QFETCH(int, bytes);
+    addStalledHost();
+    KnownHosts::setConfiguration("Host stalled.test\n  ProxyJump bob@server.test\n");
+    StallingServer::stallAfter(bytes);
     HelperSession session;
     session.mount("sftp://alice@stalled.test/");
-    QCOMPARE(textOf(session.next(), "say"), u"question"_s);
+    const char* const hosts[] = {Sandbox::serverHost, Sandbox::stalledHost};
+    const SandboxAccount accounts[] = {Sandbox::bob, Sandbox::alice};
+    for (int i = 0; i <= answers; ++i) {
+        if (i == 1 && bytes == 0) {
+            QTRY_VERIFY(StallingServer::hasStalled());
+            break;
+        }
+        const QJsonObject said = session.next();
+        if (i == 2) {
+            QCOMPARE(textOf(said, "say"), u"accepted"_s);
+            QCOMPARE(numberOf(session.next(), "code"), 0);
+            break;
+        }
+        QCOMPARE(textOf(said, "host"), QString::fromLatin1(hosts[i]));
+        QCOMPARE(textOf(said, "user"), QString::fromLatin1(accounts[i].name));
+        QCOMPARE(flagOf(said, "retry"), false);
+        if (i < answers) {
+            session.answerPassword(numberOf(said, "id"), passwordOf(accounts[i]));
+        }
+    }
     QVERIFY(processesNamed("ssh").size() >= 2);
-    session.answerPassword(1, passwordOf(Sandbox::bob));
-    QTRY_VERIFY(StallingServer::hasStalled());
     session.cancel();
     QCOMPARE(numberOf(session.end(), "code"), 2);
     QCOMPARE(session.waitForEnd(), 1);
-    QVERIFY(config.remove());
     QCOMPARE(leftovers(), QStringList());
+}
+
+void RealMountHelperTest::otherUserOfAJumpHost()
+{
+    addStalledHost();
+    KnownHosts::setConfiguration("Host stalled.test\n  ProxyJump bob@server.test\n");
+    StallingServer::stallAfter(0);
+    HelperSession session;
+    session.mount("sftp://alice@stalled.test/");
+    QCOMPARE(textOf(session.next(), "user"), u"bob"_s);
+    session.answerPassword(1, passwordOf(Sandbox::alice), R"(,"user":"alice")");
+    const QJsonObject again = session.next();
+    QCOMPARE(numberOf(again, "id"), 2);
+    QCOMPARE(
+        textOf(again, "message"),
+        u"server.test is a host on the way: its user can't be changed here"_s);
+    session.cancel();
+    QCOMPARE(numberOf(session.end(), "code"), 2);
 }
 
 int main(int argc, char** argv)
