@@ -65,7 +65,7 @@ bool pass(int from, int to, int* most)
 {
     char buffer[4096];
     const ssize_t size = ::read(from, buffer, size_t(std::min(*most, int(sizeof buffer))));
-    *most -= int(size);
+    *most -= size > 0 ? int(size) : 0;
     return size > 0 && ::write(to, buffer, size_t(size)) == size;
 }
 
