@@ -4,6 +4,7 @@
 #ifndef VEYFM_TESTS_MOUNTSCENE_H
 #define VEYFM_TESTS_MOUNTSCENE_H
 
+#include "support/privatemounts.h"
 #include "support/standin.h"
 #include "support/terminalsession.h"
 #include "support/toolscene.h"
@@ -12,25 +13,11 @@
 #include <QFile>
 #include <QTemporaryDir>
 
-#include <cerrno>
-#include <cstring>
 #include <memory>
 
-#include <sched.h>
 #include <signal.h>
 #include <sys/mount.h>
 #include <unistd.h>
-
-/// Mounts of this thread and of the processes that it starts are their own from now on, and go
-/// with them. Why that is not possible here, or empty.
-inline QString keepMountsPrivate()
-{
-    if (::access("/dev/fuse", R_OK | W_OK) == 0 && ::unshare(CLONE_NEWNS) == 0 &&
-        ::mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0) {
-        return QString();
-    }
-    return QStringLiteral("no mounts here: ") + QString::fromLocal8Bit(std::strerror(errno));
-}
 
 /// veyfm-vfs in a home of its own, with a stand-in for a tool that mounts, and with a service or
 /// without.
