@@ -67,7 +67,7 @@ void ToolCompletionTest::verbs()
         complete({QString()}),
         QByteArrayList(
             {"list", "tree", "info", "monitor", "parent", "resolve", "storage", "bookmark",
-             "network", "mount", "mounts", "update", "notify", "status", "help"}));
+             "network", "mount", "unmount", "mounts", "update", "notify", "status", "help"}));
     QCOMPARE(
         complete({QStringLiteral("bookmark"), QString()}),
         QByteArrayList({"list", "add", "remove"}));

@@ -82,8 +82,9 @@ void ToolUsageTest::helpShowsAllVerbs()
             {QStringLiteral("list"), QStringLiteral("tree"), QStringLiteral("info"),
              QStringLiteral("monitor"), QStringLiteral("parent"), QStringLiteral("resolve"),
              QStringLiteral("storage"), QStringLiteral("bookmark"), QStringLiteral("network"),
-             QStringLiteral("mount"), QStringLiteral("mounts"), QStringLiteral("update"),
-             QStringLiteral("notify"), QStringLiteral("status"), QStringLiteral("help")}));
+             QStringLiteral("mount"), QStringLiteral("unmount"), QStringLiteral("mounts"),
+             QStringLiteral("update"), QStringLiteral("notify"), QStringLiteral("status"),
+             QStringLiteral("help")}));
     QVERIFY(allShownVerbs().contains(QStringLiteral("storage eject")));
     QCOMPARE(runTool({QStringLiteral("-h")}).out, result.out);
     QCOMPARE(runTool({QStringLiteral("help")}).out, result.out);

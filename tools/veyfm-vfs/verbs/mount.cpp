@@ -95,7 +95,7 @@ Verb mountVerb()
         "A URL of the schemes smb, ftp and sftp. Prints the local path of what it names. "
         "Passwords\n"
         "and the keys of unknown hosts are asked about on the terminal. What is mounted stays so:\n"
-        "'fusermount3 -u' and the directory ends it.");
+        "'veyfm-vfs unmount' ends it.");
     verb.operandKind = OperandKind::Texts;
     verb.leastOperands = 1;
     verb.mostOperands = 1;

@@ -45,9 +45,9 @@ int editDistance(const QString& left, const QString& right)
 const QVector<Verb>& verbs()
 {
     static const QVector<Verb> all = {
-        listVerb(),    treeVerb(),     infoVerb(),    monitorVerb(),  parentVerb(), resolveVerb(),
-        storageVerb(), bookmarkVerb(), networkVerb(), mountVerb(),    mountsVerb(), updateVerb(),
-        notifyVerb(),  statusVerb(),   helpVerb(),    completeVerb(),
+        listVerb(),    treeVerb(),     infoVerb(),    monitorVerb(), parentVerb(),   resolveVerb(),
+        storageVerb(), bookmarkVerb(), networkVerb(), mountVerb(),   unmountVerb(),  mountsVerb(),
+        updateVerb(),  notifyVerb(),   statusVerb(),  helpVerb(),    completeVerb(),
     };
     return all;
 }

@@ -34,6 +34,7 @@ Verb resolveVerb();
 Verb statusVerb();
 Verb storageVerb();
 Verb treeVerb();
+Verb unmountVerb();
 Verb updateVerb();
 /// @}
 
