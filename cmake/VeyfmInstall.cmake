@@ -1,31 +1,38 @@
 # SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 # SPDX-License-Identifier: LGPL-2.1-or-later
 
-# Installs the library and what others find it by: the CMake package and the pkg-config file.
+# Installs the libraries and what others find them by: the CMake package and the pkg-config file.
 # Public headers are installed where they are declared; see veyfm_public_classes().
 
 include(CMakePackageConfigHelpers)
 
 set(VEYFM_PACKAGE_DIR ${CMAKE_INSTALL_LIBDIR}/cmake/veyfmvfs)
 
-install(TARGETS veyfmvfs
-    EXPORT veyfmvfsTargets
-    LIBRARY
-        DESTINATION ${CMAKE_INSTALL_LIBDIR}
-        COMPONENT Runtime
-        NAMELINK_COMPONENT Development
-)
-install(FILES ${PROJECT_BINARY_DIR}/src/veyfmvfs_export.h
-    DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/veyfmvfs
-    COMPONENT Development
-)
+# veyfm_install_library(<target> <export header>): the library, its export header, and the targets
+# file of the CMake package, which has one for each library.
+function(veyfm_install_library target export_header)
+    install(TARGETS ${target}
+        EXPORT ${target}Targets
+        LIBRARY
+            DESTINATION ${CMAKE_INSTALL_LIBDIR}
+            COMPONENT Runtime
+            NAMELINK_COMPONENT Development
+    )
+    install(FILES ${export_header}
+        DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/veyfmvfs
+        COMPONENT Development
+    )
+    install(EXPORT ${target}Targets
+        NAMESPACE VeyFM::
+        DESTINATION ${VEYFM_PACKAGE_DIR}
+        COMPONENT Development
+    )
+endfunction()
 
-# find_package(veyfmvfs)
-install(EXPORT veyfmvfsTargets
-    NAMESPACE VeyFM::
-    DESTINATION ${VEYFM_PACKAGE_DIR}
-    COMPONENT Development
-)
+veyfm_install_library(veyfmvfs ${PROJECT_BINARY_DIR}/src/veyfmvfs_export.h)
+veyfm_install_library(veyfmvfshost ${PROJECT_BINARY_DIR}/src/host/veyfmvfshost_export.h)
+
+# find_package(veyfmvfs), with COMPONENTS host for the second library.
 configure_package_config_file(${CMAKE_CURRENT_LIST_DIR}/veyfmvfsConfig.cmake.in
     ${PROJECT_BINARY_DIR}/veyfmvfsConfig.cmake
     INSTALL_DESTINATION ${VEYFM_PACKAGE_DIR}
@@ -43,8 +50,8 @@ install(
     COMPONENT Development
 )
 
-# pkg-config libveyfmvfs. Its prefix follows from where the file lies, so an installed tree may be
-# moved; that takes directories that are relative to the prefix.
+# pkg-config libveyfmvfs and libveyfmvfs-host. The prefix follows from where the file lies, so an
+# installed tree may be moved; that takes directories that are relative to the prefix.
 set(VEYFM_PC_LIBDIR "\${prefix}/${CMAKE_INSTALL_LIBDIR}")
 set(VEYFM_PC_INCLUDEDIR "\${prefix}/${CMAKE_INSTALL_INCLUDEDIR}")
 if(IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}" OR IS_ABSOLUTE "${CMAKE_INSTALL_INCLUDEDIR}")
@@ -56,10 +63,10 @@ else()
     string(REGEX REPLACE "/$" "" up "${up}")
     set(VEYFM_PC_PREFIX "\${pcfiledir}/${up}")
 endif()
-configure_file(${CMAKE_CURRENT_LIST_DIR}/libveyfmvfs.pc.in
-    ${PROJECT_BINARY_DIR}/libveyfmvfs.pc @ONLY
-)
-install(FILES ${PROJECT_BINARY_DIR}/libveyfmvfs.pc
-    DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig
-    COMPONENT Development
-)
+foreach(name IN ITEMS libveyfmvfs libveyfmvfs-host)
+    configure_file(${CMAKE_CURRENT_LIST_DIR}/${name}.pc.in ${PROJECT_BINARY_DIR}/${name}.pc @ONLY)
+    install(FILES ${PROJECT_BINARY_DIR}/${name}.pc
+        DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig
+        COMPONENT Development
+    )
+endforeach()

@@ -19,6 +19,8 @@ endif()
 # The forwarding headers in the build tree; the installed ones follow.
 add_executable(consumer_in_tree consumer/main.cpp)
 target_link_libraries(consumer_in_tree PRIVATE VeyFM::vfs)
+add_executable(host_in_tree consumer/host/main.cpp)
+target_link_libraries(host_in_tree PRIVATE VeyFM::host)
 
 # What looks at the tree and its packaging, not at running code, has nothing to gain from
 # sanitizers.
