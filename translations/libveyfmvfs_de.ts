@@ -82,6 +82,37 @@
     </message>
 </context>
 <context>
+    <name>VeyFM::MountResourceJob</name>
+    <message>
+        <source>No progress within %1 s</source>
+        <translation>Seit %1 s kein Fortschritt</translation>
+    </message>
+    <message>
+        <source>Mounting was cancelled</source>
+        <translation>Das Einhängen wurde abgebrochen</translation>
+    </message>
+    <message>
+        <source>Can&apos;t start %1: %2</source>
+        <translation>%1 lässt sich nicht starten: %2</translation>
+    </message>
+    <message>
+        <source>%1 has not handed the mount over</source>
+        <translation>%1 hat die Einhängung nicht übergeben</translation>
+    </message>
+    <message>
+        <source>Can&apos;t understand %1: %2</source>
+        <translation>%1 ist nicht zu verstehen: %2</translation>
+    </message>
+    <message>
+        <source>%1 was ended by signal %2</source>
+        <translation>%1 wurde durch Signal %2 beendet</translation>
+    </message>
+    <message>
+        <source>%1 has ended too early</source>
+        <translation>%1 hat sich zu früh beendet</translation>
+    </message>
+</context>
+<context>
     <name>VeyFM::MountSFtpURLJob</name>
     <message>
         <source>Url scheme is not sftp</source>
@@ -176,6 +207,45 @@ Soll die Verbindung wirklich aufgebaut werden?</translation>
     <message>
         <source>Can&apos;t get service interface</source>
         <translation>Die Schnittstelle des Dienstes ist nicht erreichbar</translation>
+    </message>
+</context>
+<context>
+    <name>VeyFM::UnmountResourceJob</name>
+    <message>
+        <source>%1 is no mount of a network resource</source>
+        <translation>%1 ist keine eingehängte Netzwerkressource</translation>
+    </message>
+    <message>
+        <source>The file system of %1 does not answer</source>
+        <translation>Das Dateisystem von %1 antwortet nicht</translation>
+    </message>
+    <message>
+        <source>Nothing is mounted on %1</source>
+        <translation>In %1 ist nichts eingehängt</translation>
+    </message>
+    <message>
+        <source>%1 is being mounted by another program</source>
+        <translation>%1 wird gerade von einem anderen Programm eingehängt</translation>
+    </message>
+    <message>
+        <source>%1 does not come to an end</source>
+        <translation>%1 kommt zu keinem Ende</translation>
+    </message>
+    <message>
+        <source>Can&apos;t start %1: %2</source>
+        <translation>%1 lässt sich nicht starten: %2</translation>
+    </message>
+    <message>
+        <source>%1 is in use by: %2</source>
+        <translation>%1 wird benutzt von: %2</translation>
+    </message>
+    <message>
+        <source>%1 is in use</source>
+        <translation>%1 wird benutzt</translation>
+    </message>
+    <message>
+        <source>Can&apos;t unmount %1</source>
+        <translation>%1 lässt sich nicht aushängen</translation>
     </message>
 </context>
 <context>

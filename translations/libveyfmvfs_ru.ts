@@ -82,6 +82,37 @@
     </message>
 </context>
 <context>
+    <name>VeyFM::MountResourceJob</name>
+    <message>
+        <source>No progress within %1 s</source>
+        <translation>Нет продвижения в течение %1 с</translation>
+    </message>
+    <message>
+        <source>Mounting was cancelled</source>
+        <translation>Подключение отменено</translation>
+    </message>
+    <message>
+        <source>Can&apos;t start %1: %2</source>
+        <translation>Не удалось запустить %1: %2</translation>
+    </message>
+    <message>
+        <source>%1 has not handed the mount over</source>
+        <translation>%1 не передал подключённый ресурс</translation>
+    </message>
+    <message>
+        <source>Can&apos;t understand %1: %2</source>
+        <translation>Не удалось понять %1: %2</translation>
+    </message>
+    <message>
+        <source>%1 was ended by signal %2</source>
+        <translation>%1 завершён сигналом %2</translation>
+    </message>
+    <message>
+        <source>%1 has ended too early</source>
+        <translation>%1 завершился слишком рано</translation>
+    </message>
+</context>
+<context>
     <name>VeyFM::MountSFtpURLJob</name>
     <message>
         <source>Url scheme is not sftp</source>
@@ -176,6 +207,45 @@ Are you sure you want to continue connecting?</source>
     <message>
         <source>Can&apos;t get service interface</source>
         <translation>Не удалось получить интерфейс службы</translation>
+    </message>
+</context>
+<context>
+    <name>VeyFM::UnmountResourceJob</name>
+    <message>
+        <source>%1 is no mount of a network resource</source>
+        <translation>%1 не является подключённым сетевым ресурсом</translation>
+    </message>
+    <message>
+        <source>The file system of %1 does not answer</source>
+        <translation>Файловая система %1 не отвечает</translation>
+    </message>
+    <message>
+        <source>Nothing is mounted on %1</source>
+        <translation>К %1 ничего не подключено</translation>
+    </message>
+    <message>
+        <source>%1 is being mounted by another program</source>
+        <translation>%1 сейчас подключает другая программа</translation>
+    </message>
+    <message>
+        <source>%1 does not come to an end</source>
+        <translation>%1 не завершается</translation>
+    </message>
+    <message>
+        <source>Can&apos;t start %1: %2</source>
+        <translation>Не удалось запустить %1: %2</translation>
+    </message>
+    <message>
+        <source>%1 is in use by: %2</source>
+        <translation>%1 используется программами: %2</translation>
+    </message>
+    <message>
+        <source>%1 is in use</source>
+        <translation>%1 используется</translation>
+    </message>
+    <message>
+        <source>Can&apos;t unmount %1</source>
+        <translation>Не удалось отключить %1</translation>
     </message>
 </context>
 <context>
