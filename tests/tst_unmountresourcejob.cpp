@@ -80,6 +80,7 @@ private:
         if (!server->waitForReadyRead()) {
             qFatal("%s", server->readAllStandardError().constData());
         }
+        gap->restart();
         return server;
     }
 
@@ -117,6 +118,7 @@ private:
         if (!process->waitForStarted()) {
             qFatal("no sleep");
         }
+        gap->restart();
         return process;
     }
 
@@ -400,7 +402,7 @@ void UnmountResourceJobTest::stoppedServer()
     QVERIFY(!isMounted(anna()));
     QVERIFY(!QFileInfo::exists(anna()));
     ::kill(pid_t(server->processId()), SIGCONT);
-    QVERIFY(reader->waitForFinished());
+    QVERIFY(reader->state() == QProcess::NotRunning || reader->waitForFinished());
 }
 
 void UnmountResourceJobTest::waitsForOthers()

@@ -10,19 +10,21 @@
 namespace VeyFM {
 namespace Host {
 
-void startThread(std::function<void()> work)
+bool startThread(std::function<void()> work)
 {
     // A thread begins with the mask of its creator.
     sigset_t all;
     sigset_t before;
     ::sigfillset(&all);
     ::pthread_sigmask(SIG_SETMASK, &all, &before);
+    bool isStarted = true;
     try {
         std::thread(std::move(work)).detach();
     } catch (const std::system_error&) {
-        // Whoever waits for the work has a bound.
+        isStarted = false;
     }
     ::pthread_sigmask(SIG_SETMASK, &before, nullptr);
+    return isStarted;
 }
 
 Background::Background(QObject* parent)

@@ -14,9 +14,9 @@
 namespace VeyFM {
 namespace Host {
 
-/// Runs work in a thread that nobody waits for, and in which no signal handlers run. Where the
-/// system has no more threads nothing is done.
-void startThread(std::function<void()> work);
+/// Runs work in a thread that nobody waits for, and in which no signal handlers run. False where
+/// the system has no more threads, and nothing is done.
+bool startThread(std::function<void()> work);
 
 /**
  * Work in a thread that may hang in there for ever, such as a look at a file system whose server
@@ -31,11 +31,12 @@ public:
     explicit Background(QObject* parent = nullptr);
     ~Background() override;
 
-    /// Calls @p done with what @p work returns. The work must own what it uses.
+    /// Calls @p done with what @p work returns. The work must own what it uses. False where there
+    /// is no thread for it.
     template <typename Work, typename Done>
-    void run(Work work, Done done)
+    bool run(Work work, Done done)
     {
-        startThread([work = std::move(work), done = std::move(done), address = m_address] {
+        return startThread([work = std::move(work), done = std::move(done), address = m_address] {
             auto result = work();
             const std::lock_guard<std::mutex> lock(address->lock);
             if (address->receiver) {

@@ -7,9 +7,11 @@
 #include "host/pidfd.h"
 
 #include <QFile>
+#include <QTimer>
 
 #include <cerrno>
 #include <csignal>
+#include <utility>
 
 #include <fcntl.h>
 #include <spawn.h>
@@ -119,6 +121,22 @@ int statusOf(pid_t pid)
 
 } // namespace
 
+/// A process that nobody may have taken when it is there.
+struct ChildProcess::Started
+{
+    Started() = default;
+    ~Started()
+    {
+        if (pid > 0) {
+            startThread([pid = pid] { statusOf(pid); });
+        }
+    }
+    Q_DISABLE_COPY(Started)
+
+    int error = 0;
+    pid_t pid = -1;
+};
+
 ChildProcess::ChildProcess(QObject* parent)
     : QObject(parent)
 {
@@ -139,35 +157,57 @@ ChildProcess::~ChildProcess()
     }
 }
 
-int ChildProcess::start(const QString& program, const QStringList& arguments, Streams streams)
+void ChildProcess::start(const QString& program, const QStringList& arguments, Streams streams)
 {
     int ends[2] = {-1, -1};
-    int error = makeSocket(ends);
+    const int error = makeSocket(ends);
     if (error != 0) {
-        return error;
+        failLater(error);
+        return;
     }
-    error = Spawning(ends[1], streams).start(&m_pid, program, arguments);
-    closeFile(&ends[1]);
     m_socket = ends[0];
-    if (error != 0) {
-        m_pid = -1;
-        closeFile(&m_socket);
-        return error;
-    }
-    m_handle = openPidfd(m_pid);
-    if (m_handle < 0) {
-        error = errno;
-        closeFile(&m_socket); // With its input at the end, the program does nothing.
-        return error;
-    }
     m_reading = std::make_unique<QSocketNotifier>(m_socket, QSocketNotifier::Read);
     connect(m_reading.get(), &QSocketNotifier::activated, this, &ChildProcess::readyRead);
     m_writing = std::make_unique<QSocketNotifier>(m_socket, QSocketNotifier::Write);
     m_writing->setEnabled(false);
     connect(m_writing.get(), &QSocketNotifier::activated, this, &ChildProcess::flush);
+    m_starting = std::make_unique<Background>();
+    const bool isBegun = m_starting->run(
+        [socket = ends[1], program, arguments, streams] {
+            const auto started = std::make_shared<Started>();
+            started->error = Spawning(socket, streams).start(&started->pid, program, arguments);
+            started->pid = started->error == 0 ? started->pid : -1;
+            ::close(socket);
+            return started;
+        },
+        [this](const std::shared_ptr<Started>& started) { takeStarted(started); });
+    if (!isBegun) {
+        closeFile(&ends[1]);
+        failLater(EAGAIN);
+    }
+}
+
+void ChildProcess::failLater(int error)
+{
+    stopReading();
+    QTimer::singleShot(0, this, [this, error] { Q_EMIT failed(error); });
+}
+
+void ChildProcess::takeStarted(const std::shared_ptr<Started>& started)
+{
+    if (started->error != 0) {
+        failLater(started->error);
+        return;
+    }
+    m_handle = openPidfd(started->pid);
+    if (m_handle < 0) {
+        failLater(errno);
+        closeFile(&m_socket); // With its input at the end, the program does nothing.
+        return;
+    }
+    m_pid = std::exchange(started->pid, -1);
     m_ending = std::make_unique<QSocketNotifier>(m_handle, QSocketNotifier::Read);
     connect(m_ending.get(), &QSocketNotifier::activated, this, &ChildProcess::reap);
-    return 0;
 }
 
 void ChildProcess::send(const char* bytes, size_t size)

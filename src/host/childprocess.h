@@ -17,12 +17,15 @@
 namespace VeyFM {
 namespace Host {
 
+class Background;
+
 /**
  * A program that runs beside this one, and is spoken with through one socket.
  *
- * Unlike QProcess this never waits: starting copies no memory of this process, writing keeps what
- * does not go at once, and the destructor neither kills the program nor waits for it, but closes
- * the socket and leaves the rest to a thread. What was kept is overwritten when it has gone.
+ * Unlike QProcess this never waits: starting copies no memory of this process and is done in a
+ * thread, since the program has to be read from the disk, writing keeps what does not go at once,
+ * and the destructor neither kills the program nor waits for it, but closes the socket and leaves
+ * the rest to a thread. What was kept is overwritten when it has gone.
  *
  * Signals come from the event loop of the object's thread. It may be deleted in their slots.
  */
@@ -40,8 +43,8 @@ public:
     ~ChildProcess() override;
 
     /// Starts a program, which is looked for in PATH where it has no slash, in a process group of
-    /// its own, with the usual signals and no other open file. 0, or an error as errno has them.
-    int start(const QString& program, const QStringList& arguments, Streams streams);
+    /// its own, with the usual signals and no other open file. What is sent meanwhile is not lost.
+    void start(const QString& program, const QStringList& arguments, Streams streams);
 
     /// Bytes for the program; nothing once it has closed its end.
     void send(const char* bytes, size_t size);
@@ -59,6 +62,10 @@ public:
     void kill(int signal);
 
 Q_SIGNALS:
+    /// The program can't be started, for an error as errno has them. Nothing else comes, and this
+    /// not inside start().
+    void failed(int error);
+
     /// There is something to read, or nothing will come any more.
     void readyRead();
 
@@ -67,6 +74,10 @@ Q_SIGNALS:
     void ended(int status);
 
 private:
+    struct Started;
+
+    void failLater(int error);
+    void takeStarted(const std::shared_ptr<Started>& started);
     void flush();
     void reap();
 
@@ -78,6 +89,7 @@ private:
     std::unique_ptr<QSocketNotifier> m_reading;
     std::unique_ptr<QSocketNotifier> m_writing;
     std::unique_ptr<QSocketNotifier> m_ending;
+    std::unique_ptr<Background> m_starting;
 };
 
 } // namespace Host

@@ -85,14 +85,15 @@ void MountResourceJobPrivate::run()
         m_status = status;
         takeLineLater();
     });
-    const int error = m_helper->start(program, {}, Host::ChildProcess::Conversation);
-    if (error != 0) {
-        m_helper.reset();
-        stop(
-            5, MountResourceJob::tr("Can't start %1: %2")
-                   .arg(program, QString::fromLocal8Bit(std::strerror(error))));
-        return;
-    }
+    QObject::connect(m_helper.get(), &Host::ChildProcess::failed, job(), [this](int error) {
+        if (m_state == Talking) {
+            m_code = 5;
+            m_text = MountResourceJob::tr("Can't start %1: %2")
+                         .arg(program, QString::fromLocal8Bit(std::strerror(error)));
+        }
+        finish();
+    });
+    m_helper->start(program, {}, Host::ChildProcess::Conversation);
     Request request;
     request.kind = Request::Mount;
     request.url = url;

@@ -220,18 +220,20 @@ void UnmountResourceJobPrivate::unmount(const QString& program)
         programEnded(status);
     });
     const QString option = isLazy ? QStringLiteral("-uz") : QStringLiteral("-u");
-    const int error = m_program->start(program, {option, directory}, Host::ChildProcess::Output);
-    if (error == 0) {
-        wait(patience, [this, program] {
-            m_program->kill(SIGKILL);
-            fail(UnmountResourceJob::tr("%1 does not come to an end").arg(program));
+    QObject::connect(
+        m_program.get(), &Host::ChildProcess::failed, q_ptr, [this, program](int error) {
+            if (error == ENOENT && program == QLatin1String("fusermount3")) {
+                unmount(QStringLiteral("fusermount"));
+            } else {
+                fail(UnmountResourceJob::tr("Can't start %1: %2")
+                         .arg(program, QString::fromLocal8Bit(std::strerror(error))));
+            }
         });
-    } else if (error == ENOENT && program == QLatin1String("fusermount3")) {
-        unmount(QStringLiteral("fusermount"));
-    } else {
-        fail(UnmountResourceJob::tr("Can't start %1: %2")
-                 .arg(program, QString::fromLocal8Bit(std::strerror(error))));
-    }
+    wait(patience, [this, program] {
+        m_program->kill(SIGKILL);
+        fail(UnmountResourceJob::tr("%1 does not come to an end").arg(program));
+    });
+    m_program->start(program, {option, directory}, Host::ChildProcess::Output);
 }
 
 void UnmountResourceJobPrivate::read()
