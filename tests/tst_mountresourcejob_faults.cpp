@@ -156,8 +156,8 @@ void MountResourceJobFaultsTest::misbehaves_data()
     QTest::newRow("killed") << QByteArrayList{"read", Helper::begin, "kill 9"}
                             << u"veyfm-mount was ended by signal 9"_s;
     QTest::newRow("killed at question")
-        << QByteArrayList{"read", Helper::begin, Helper::askPassword(), "kill 11"}
-        << u"veyfm-mount was ended by signal 11"_s;
+        << QByteArrayList{"read", Helper::begin, Helper::askPassword(), "kill 15"}
+        << u"veyfm-mount was ended by signal 15"_s;
     QTest::newRow("half a line") << QByteArrayList{"read", Helper::begin, "out {\"say\"", "exit 0"}
                                  << finishedTooEarly;
 }
