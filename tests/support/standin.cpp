@@ -10,12 +10,14 @@
 #include <fcntl.h>
 #include <fstream>
 #include <iterator>
+#include <sstream>
 #include <string>
 #include <sys/ioctl.h>
 #include <sys/mount.h>
 #include <sys/wait.h>
 #include <termios.h>
 #include <unistd.h>
+#include <vector>
 
 namespace {
 
@@ -162,6 +164,38 @@ void mountDirectory()
     }
 }
 
+// As a tool that serves a mount in the background: a program of its own, which prints a line when
+// it has mounted.
+void serveDirectory(const std::string& words)
+{
+    std::istringstream stream(words);
+    std::vector<std::string> texts{std::istream_iterator<std::string>(stream), {}};
+    texts.insert(texts.begin() + 1, directory);
+    std::vector<char*> arguments;
+    for (std::string& text : texts) {
+        arguments.push_back(text.data());
+    }
+    arguments.push_back(nullptr);
+    int mounted[2];
+    if (pipe2(mounted, O_CLOEXEC) != 0) {
+        _exit(92);
+    }
+    if (fork() == 0) {
+        setsid();
+        const int nowhere = open("/dev/null", O_RDWR | O_CLOEXEC);
+        dup2(nowhere, STDIN_FILENO);
+        dup2(nowhere, STDERR_FILENO);
+        dup2(mounted[1], STDOUT_FILENO);
+        execv(arguments[0], arguments.data());
+        _exit(92);
+    }
+    close(mounted[1]);
+    char c = 0;
+    if (read(mounted[0], &c, 1) != 1) {
+        _exit(92);
+    }
+}
+
 void play(const std::string& line)
 {
     const size_t blank = line.find(' ');
@@ -195,6 +229,8 @@ void play(const std::string& line)
         finishSlowly();
     } else if (verb == "mount") {
         mountDirectory();
+    } else if (verb == "serve") {
+        serveDirectory(rest);
     } else if (verb == "interrupt") {
         kill(getppid(), SIGINT);
         raise(SIGINT);

@@ -26,6 +26,8 @@
  *   fork                 starts a process that waits for a signal that ends it
  *   finish               runs a process that needs a third of a second; see hasFinished()
  *   mount                mounts a dead file system on the directory among its arguments
+ *   serve PROGRAM ARGS   starts a program with that directory before its arguments, in the
+ *                        background, and waits for the first that it prints
  *   kill N, exit N       ends
  *   interrupt            ends by a SIGINT, which its parent gets first, as Ctrl-C is for both
  *

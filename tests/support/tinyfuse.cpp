@@ -1,15 +1,18 @@
 // SPDX-FileCopyrightText: 2026 The libveyfmvfs authors
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
-// veyfm-tinyfuse DIRECTORY: a file system with one file, "file", which holds "hello". Prints a line
-// when it is mounted, and ends when it is not any more.
+// veyfm-tinyfuse DIRECTORY [FILE...]: a file system with files by their paths, or with one file,
+// "file". They all hold "hello". Prints a line when it is mounted, and ends when it is not any
+// more.
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
 #include <string>
 #include <vector>
 
+#include <dirent.h>
 #include <fcntl.h>
 #include <linux/fuse.h>
 #include <sys/mount.h>
@@ -19,10 +22,44 @@
 namespace {
 
 constexpr uint64_t rootNode = FUSE_ROOT_ID;
-constexpr uint64_t fileNode = 2;
 const std::string content = "hello";
 
+struct Node
+{
+    uint64_t parent;
+    std::string name;
+    bool isDirectory;
+};
+std::vector<Node> nodes = {{0, "", true}}; // The first one is the root.
+
 int device = -1;
+
+/// 0 for none.
+uint64_t find(uint64_t parent, const std::string& name)
+{
+    for (uint64_t node = rootNode; node <= nodes.size(); ++node) {
+        if (nodes[node - 1].parent == parent && nodes[node - 1].name == name) {
+            return node;
+        }
+    }
+    return 0;
+}
+
+void addFile(const std::string& path)
+{
+    uint64_t parent = rootNode;
+    size_t begin = 0;
+    while (begin <= path.size()) {
+        const size_t end = std::min(path.find('/', begin), path.size());
+        const std::string name = path.substr(begin, end - begin);
+        const uint64_t known = find(parent, name);
+        if (known == 0) {
+            nodes.push_back({parent, name, end < path.size()});
+        }
+        parent = known != 0 ? known : nodes.size();
+        begin = end + 1;
+    }
+}
 
 void answer(const fuse_in_header& request, int error, const void* data = nullptr, size_t size = 0)
 {
@@ -49,15 +86,37 @@ void answerWith(const fuse_in_header& request, const Data& data)
 
 fuse_attr attributes(uint64_t node)
 {
+    const bool isDirectory = nodes[node - 1].isDirectory;
     fuse_attr attributes = {};
     attributes.ino = node;
-    attributes.mode = node == rootNode ? S_IFDIR | 0755 : S_IFREG | 0444;
-    attributes.nlink = node == rootNode ? 2 : 1;
-    attributes.size = node == rootNode ? 0 : content.size();
+    attributes.mode = isDirectory ? S_IFDIR | 0755 : S_IFREG | 0444;
+    attributes.nlink = isDirectory ? 2 : 1;
+    attributes.size = isDirectory ? 0 : content.size();
     attributes.uid = getuid();
     attributes.gid = getgid();
     attributes.blksize = 4096;
     return attributes;
+}
+
+/// All of a directory at once, and nothing where it is read on.
+void list(const fuse_in_header& request, const fuse_read_in& read)
+{
+    std::string entries;
+    for (uint64_t node = rootNode; node <= nodes.size() && read.offset == 0; ++node) {
+        const Node& child = nodes[node - 1];
+        if (child.parent != request.nodeid) {
+            continue;
+        }
+        fuse_dirent entry = {};
+        entry.ino = node;
+        entry.off = node;
+        entry.namelen = uint32_t(child.name.size());
+        entry.type = child.isDirectory ? DT_DIR : DT_REG;
+        entries.append(reinterpret_cast<const char*>(&entry), FUSE_NAME_OFFSET);
+        entries += child.name;
+        entries.resize(FUSE_DIRENT_ALIGN(entries.size()));
+    }
+    answer(request, 0, entries.data(), entries.size());
 }
 
 void serve(const fuse_in_header& request, const char* body)
@@ -78,13 +137,14 @@ void serve(const fuse_in_header& request, const char* body)
         break;
     }
     case FUSE_LOOKUP: {
-        if (request.nodeid != rootNode || std::strcmp(body, "file") != 0) {
+        const uint64_t node = find(request.nodeid, body);
+        if (node == 0) {
             answer(request, ENOENT);
             break;
         }
         fuse_entry_out reply = {};
-        reply.nodeid = fileNode;
-        reply.attr = attributes(fileNode);
+        reply.nodeid = node;
+        reply.attr = attributes(node);
         answerWith(request, reply);
         break;
     }
@@ -102,6 +162,8 @@ void serve(const fuse_in_header& request, const char* body)
         answerWith(request, fuse_statfs_out{});
         break;
     case FUSE_READDIR:
+        list(request, *reinterpret_cast<const fuse_read_in*>(body));
+        break;
     case FUSE_RELEASE:
     case FUSE_RELEASEDIR:
     case FUSE_FLUSH:
@@ -128,7 +190,13 @@ int main(int argc, char** argv)
     const std::string options = "rootmode=40000,user_id=" + std::to_string(getuid()) +
                                 ",group_id=" + std::to_string(getgid()) +
                                 ",fd=" + std::to_string(device);
-    if (argc != 2 || device < 0 ||
+    for (int i = 2; i < argc; ++i) {
+        addFile(argv[i]);
+    }
+    if (argc == 2) {
+        addFile("file");
+    }
+    if (argc < 2 || device < 0 ||
         mount("tinyfuse", argv[1], "fuse", MS_NOSUID | MS_NODEV, options.c_str()) != 0) {
         std::perror("tinyfuse");
         return 1;
