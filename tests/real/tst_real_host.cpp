@@ -5,6 +5,7 @@
 #include "host/unmountresourcejob.h"
 #include "real/knownhosts.h"
 #include "real/realftptest.h"
+#include "real/sshagent.h"
 #include "real/sshserver.h"
 #include "real/stallingserver.h"
 #include "support/loopgap.h"
@@ -32,6 +33,10 @@ private Q_SLOTS:
     void firstContact();
     void givenUp();
     void authenticator();
+    void behindAJumpHost();
+    void cancelledBehindAJumpHost();
+    void encryptedKey();
+    void keyOfAnAgent();
     void silentServer_data();
     void silentServer();
     void silenceLimit();
@@ -94,6 +99,44 @@ private:
         return result;
     }
 
+    /// What stands behind it is server.test.
+    static void addStalledHost()
+    {
+        QFile known(KnownHosts::path());
+        QVERIFY(known.open(QIODevice::Append));
+        known.write(
+            QByteArray(Sandbox::stalledHost) + ' ' + SshServer::publicKey(Sandbox::serverHost) +
+            '\n');
+    }
+
+    static void jumpToStalledHost()
+    {
+        addStalledHost();
+        KnownHosts::setConfiguration("Host stalled.test\n  ProxyJump bob@server.test\n");
+        StallingServer::stallAfter(1 << 30);
+    }
+
+    static void offerKey()
+    {
+        KnownHosts::add(Sandbox::keyHost);
+        KnownHosts::setConfiguration(
+            "Host key.test\nIdentityFile " +
+            QFile::encodeName(SshServer::clientKey(Sandbox::keyHost)) + '\n');
+    }
+
+    /// The mount is served, and can be taken away.
+    static void verifyMount(const MountResourceJob& job, const QString& place)
+    {
+        QCOMPARE(job.errorString(), QString());
+        QCOMPARE(job.entry().path(), place);
+        QVERIFY(QFile::exists(job.localPath() + u"/draft.txt"_s));
+        UnmountResourceJob unmount(job.directory());
+        unmount.setDeleteOnFinish(false);
+        QVERIFY(runToEnd(&unmount));
+        QCOMPARE(unmount.errorString(), QString());
+        QTRY_COMPARE(mountDirs() + processes(), QStringList());
+    }
+
     static bool runToEnd(VeyFM::Job* job, int milliseconds = 20000)
     {
         QSignalSpy finished(job, &VeyFM::Job::finished);
@@ -103,6 +146,7 @@ private:
 
     const QString m_password = QString::fromLatin1(Sandbox::alice.password);
     std::unique_ptr<LoopGap> m_gap;
+    std::unique_ptr<SshAgent> m_agent;
 };
 
 void RealHostTest::initTestCase()
@@ -130,6 +174,7 @@ void RealHostTest::cleanup()
     const int ticks = m_gap->ticks();
     const double largest = m_gap->largest();
     m_gap.reset();
+    m_agent.reset();
     endScene();
     QDir(mountDir(QString())).removeRecursively();
     QTRY_COMPARE(processes(), QStringList());
@@ -227,6 +272,93 @@ void RealHostTest::authenticator()
     QCOMPARE(auth->calls.constLast(), u"accepted"_s);
 }
 
+void RealHostTest::behindAJumpHost()
+{
+    jumpToStalledHost();
+    const auto job = makeHostJob(u"sftp://alice@stalled.test/~/papers"_s);
+    QStringList asked;
+    connect(job.get(), &MountResourceJob::passwordRequested, this, [&](const MountQuestion& of) {
+        asked += of.user + u'@' + of.host + (of.isRetry ? u" again"_s : QString());
+        const bool isFirst = of.host == QLatin1String(Sandbox::stalledHost) && !of.isRetry;
+        const char* const password = of.user == u"bob"_s ? Sandbox::bob.password
+                                     : isFirst           ? Sandbox::wrongPassword
+                                                         : Sandbox::alice.password;
+        QTimer::singleShot(
+            20, job.get(), [&job, user = of.user, text = QString::fromLatin1(password)] {
+                job->answerPassword(user, text);
+            });
+    });
+    QSignalSpy rejected(job.get(), &MountResourceJob::credentialsRejected);
+    QVERIFY(runToEnd(job.get()));
+    QCOMPARE(
+        asked, QStringList(
+                   {u"bob@server.test"_s, u"alice@stalled.test"_s, u"bob@server.test"_s,
+                    u"alice@stalled.test again"_s}));
+    QCOMPARE(rejected.count(), 1);
+    verifyMount(*job, u"SFTP/alice@stalled.test/papers"_s);
+}
+
+void RealHostTest::cancelledBehindAJumpHost()
+{
+    for (int answers : {0, 1}) {
+        jumpToStalledHost();
+        const auto job = makeHostJob(u"sftp://alice@stalled.test/"_s);
+        QSignalSpy asked(job.get(), &MountResourceJob::passwordRequested);
+        QSignalSpy finished(job.get(), &VeyFM::Job::finished);
+        job->start();
+        QVERIFY(asked.wait());
+        if (answers == 1) {
+            job->answerPassword(u"bob"_s, QString::fromLatin1(Sandbox::bob.password));
+            QVERIFY(asked.wait());
+        }
+        // Each of the two hosts has one of its own.
+        QVERIFY(processes().count(u"ssh"_s) >= 2);
+        job->cancel();
+        QVERIFY(finished.wait());
+        QCOMPARE(job->error(), 2);
+        QCOMPARE(leftovers().join(u' '), QString());
+    }
+}
+
+void RealHostTest::encryptedKey()
+{
+    offerKey();
+    const auto job = makeHostJob(u"sftp://alice@key.test/~/papers"_s);
+    QSignalSpy asked(job.get(), &MountResourceJob::passwordRequested);
+    answerAll(
+        job.get(),
+        {QString::fromLatin1(Sandbox::wrongPassword), QString::fromLatin1(SshServer::passphrase)});
+    QVERIFY(runToEnd(job.get()));
+    QCOMPARE(asked.count(), 2);
+    for (int i = 0; i < asked.count(); ++i) {
+        const auto question = asked.at(i).at(0).value<MountQuestion>();
+        QVERIFY(question.message.contains(u"Enter passphrase for key"_s));
+        QCOMPARE(question.host, QString::fromLatin1(Sandbox::keyHost));
+        QCOMPARE(question.isRetry, i == 1);
+    }
+    verifyMount(*job, u"SFTP/alice@key.test/papers"_s);
+}
+
+void RealHostTest::keyOfAnAgent()
+{
+    offerKey();
+    m_agent = std::make_unique<SshAgent>(SshServer::clientKey(Sandbox::keyHost));
+    QVERIFY(m_agent->holdsKey());
+    m_gap = std::make_unique<LoopGap>(); // That has taken its time.
+    qputenv("SSH_AUTH_SOCK", QFile::encodeName(m_agent->socket()));
+    const auto job = makeHostJob(u"sftp://alice@key.test/~/papers"_s);
+    QSignalSpy asked(job.get(), &MountResourceJob::passwordRequested);
+    QSignalSpy accepted(job.get(), &MountResourceJob::credentialsAccepted);
+    const bool hasEnded = runToEnd(job.get());
+    qunsetenv("SSH_AUTH_SOCK");
+    QVERIFY(hasEnded);
+    QCOMPARE(asked.count(), 0);
+    QCOMPARE(accepted.count(), 1);
+    verifyMount(*job, u"SFTP/alice@key.test/papers"_s);
+    // It is no process of the mount.
+    QVERIFY(m_agent->isRunning());
+}
+
 void RealHostTest::silentServer_data()
 {
     QTest::addColumn<QString>("url");
@@ -265,11 +397,7 @@ void RealHostTest::silenceLimit()
 
 void RealHostTest::stalledAmidAStage()
 {
-    QFile known(KnownHosts::path());
-    QVERIFY(known.open(QIODevice::Append));
-    known.write(
-        QByteArray(Sandbox::stalledHost) + ' ' + SshServer::publicKey(Sandbox::serverHost) + '\n');
-    known.close();
+    addStalledHost();
     int stalled = 0;
     for (int bytes = 1; bytes < 3500; bytes += 500) {
         StallingServer::stallAfter(bytes);
@@ -424,6 +552,7 @@ int main(int argc, char** argv)
     Sandbox sandbox({"/usr/bin/sshfs", "/usr/bin/fusermount3", "/usr/bin/rclone"});
     sandbox.addServer(std::make_unique<SecretWatch>());
     sandbox.addServer(std::make_unique<SshServer>(Sandbox::serverHost));
+    sandbox.addServer(std::make_unique<SshServer>(Sandbox::keyHost, SshServer::Key));
     sandbox.addServer(std::make_unique<FtpServer>(Sandbox::serverHost));
     sandbox.addServer(std::make_unique<StallingServer>());
     return sandbox.run([&] {

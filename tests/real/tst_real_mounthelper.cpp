@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: LGPL-2.1-or-later
 
 #include "real/realhelpertest.h"
+#include "real/sshagent.h"
 
 #include <QElapsedTimer>
-#include <QTemporaryDir>
 
 #include <signal.h>
 
@@ -253,27 +253,10 @@ void RealMountHelperTest::keyOfAnAgent()
     KnownHosts::add(Sandbox::keyHost);
     const QString key = SshServer::clientKey(Sandbox::keyHost);
     KnownHosts::setConfiguration("Host key.test\nIdentityFile " + QFile::encodeName(key) + '\n');
-    QTemporaryDir directory;
-    const QString socket = directory.filePath(u"agent"_s);
-    QProcess agent;
-    agent.start(u"ssh-agent"_s, {u"-D"_s, u"-a"_s, socket});
-    QTRY_VERIFY(QFile::exists(socket));
-    QFile askpass(directory.filePath(u"askpass"_s));
-    QVERIFY(askpass.open(QIODevice::WriteOnly));
-    askpass.write(QByteArray("#!/bin/sh\necho ") + SshServer::passphrase + '\n');
-    askpass.setPermissions(askpass.permissions() | QFile::ExeOwner);
-    askpass.close();
+    SshAgent agent(key);
+    QVERIFY(agent.holdsKey());
     QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
-    environment.insert(u"SSH_AUTH_SOCK"_s, socket);
-    QProcess add;
-    QProcessEnvironment adding = environment;
-    adding.insert(u"SSH_ASKPASS"_s, askpass.fileName());
-    adding.insert(u"SSH_ASKPASS_REQUIRE"_s, u"force"_s);
-    add.setProcessEnvironment(adding);
-    add.start(u"ssh-add"_s, {key});
-    QVERIFY(add.waitForFinished());
-    QCOMPARE(add.exitCode(), 0);
-    QVERIFY(askpass.remove());
+    environment.insert(u"SSH_AUTH_SOCK"_s, agent.socket());
 
     HelperSession session(environment);
     session.mount("sftp://alice@key.test/~");
@@ -284,9 +267,7 @@ void RealMountHelperTest::keyOfAnAgent()
     QCOMPARE(session.waitForEnd(), 1);
     QCOMPARE(leftovers(), QStringList());
     // It was not started by the helper.
-    QCOMPARE(agent.state(), QProcess::Running);
-    agent.terminate();
-    QVERIFY(agent.waitForFinished());
+    QVERIFY(agent.isRunning());
 }
 
 void RealMountHelperTest::behindAJumpHost_data()
