@@ -155,6 +155,8 @@ void TestMountProtocol::passesRequests_data()
     QTest::newRow("yes") << QByteArray(R"({"do":"answer","id":1,"yes":true})");
     QTest::newRow("no") << QByteArray(R"({"do":"answer","id":2147483647,"yes":false})");
     QTest::newRow("password") << QByteArray(R"({"do":"answer","id":2,"password":true})");
+    QTest::newRow("last password")
+        << QByteArray(R"({"do":"answer","id":2,"last":true,"password":true})");
     QTest::newRow("user and password")
         << QByteArray(R"({"do":"answer","id":2,"password":true,"user":"an\nna"})");
     QTest::newRow("empty user") << QByteArray(

@@ -26,6 +26,9 @@ private Q_SLOTS:
     void passesUserOn();
     void asksPassword();
     void asksAnotherUser();
+    void answersWithUserAlone_data();
+    void answersWithUserAlone();
+    void answersForTheLastTime();
     void asksConfirmation_data();
     void asksConfirmation();
     void givesUp_data();
@@ -219,6 +222,42 @@ void MountResourceJobTest::asksAnotherUser()
     finish(job.get());
     QCOMPARE(said().value(1), QByteArray(R"({"do":"answer","id":1,"password":true,"user":"bob"})"));
     QCOMPARE(said().value(2), QByteArray(R"("")"));
+}
+
+void MountResourceJobTest::answersWithUserAlone_data()
+{
+    QTest::addColumn<bool>("withAuthenticator");
+    QTest::newRow("method") << false;
+    QTest::newRow("authenticator") << true;
+}
+
+void MountResourceJobTest::answersWithUserAlone()
+{
+    QFETCH(bool, withAuthenticator);
+    tool->expect({"read", Helper::begin, Helper::askPassword(), "read", Helper::fail(5, "x")});
+    const auto job = makeJob(withAuthenticator);
+    if (withAuthenticator) {
+        auth->answers = {Auth::changeUser(u"bob"_s)};
+    }
+    connect(job.get(), &Job::passwordRequested, this, [&] { job->answerUser(u"bob"_s); });
+    finish(job.get());
+    QCOMPARE(
+        said().mid(1), QByteArrayList({R"({"do":"answer","id":1,"password":false,"user":"bob"})"}));
+}
+
+void MountResourceJobTest::answersForTheLastTime()
+{
+    tool->expect(
+        {"read", Helper::begin, Helper::askPassword(), "read", "read",
+         Helper::askPassword(2, "anna", true), "read", "read", Helper::fail(2, "x")});
+    const auto job = makeJob();
+    connect(job.get(), &Job::passwordRequested, this, [&](const MountQuestion& question) {
+        job->setLastTry(question.isRetry);
+        job->answerPassword(u"anna"_s, u"geheim"_s);
+    });
+    finish(job.get());
+    QCOMPARE(said().value(1), QByteArray(R"({"do":"answer","id":1,"password":true})"));
+    QCOMPARE(said().value(3), QByteArray(R"({"do":"answer","id":2,"last":true,"password":true})"));
 }
 
 void MountResourceJobTest::asksConfirmation_data()

@@ -191,6 +191,7 @@ void readAnswer(Members& members, Request* request)
                                       "or \"cancelled\""));
     } else if (isLogin) {
         request->reply = Request::Login;
+        request->isLast = members.flagOrFalse("last");
     } else if (isConfirmed) {
         request->reply = members.flag("yes") ? Request::Yes : Request::No;
     } else {
@@ -297,6 +298,9 @@ QByteArray encode(const Request& request)
     }
     if (isLogin) {
         object.insert(QStringLiteral("password"), request.hasPassword);
+        if (request.isLast) {
+            object.insert(QStringLiteral("last"), true);
+        }
     } else if (request.kind == Request::Answer && request.reply == Request::GivenUp) {
         object.insert(QStringLiteral("cancelled"), true);
     } else if (request.kind == Request::Answer) {

@@ -47,6 +47,8 @@ struct Request
     int id = 0;
     Reply reply = GivenUp;
     bool hasPassword = false;
+    bool isLast =
+        false; ///< Of a login: when it is refused the mount ends, and nothing more is tried.
 };
 
 /// A question for the user.

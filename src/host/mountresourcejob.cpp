@@ -39,6 +39,16 @@ int MountResourceJob::silenceLimit() const
     return d_func()->silenceLimit;
 }
 
+void MountResourceJob::setPatience(int milliseconds)
+{
+    d_func()->patience = milliseconds;
+}
+
+void MountResourceJob::setLastTry(bool isLast)
+{
+    d_func()->isLastTry = isLast;
+}
+
 void MountResourceJob::setHelperProgram(const QString& program)
 {
     d_func()->program = program;
@@ -116,6 +126,14 @@ void MountResourceJob::answerPassword(const QString& user, const QString& passwo
     request.user = user;
     request.hasPassword = true;
     d_func()->answer(request, password);
+}
+
+void MountResourceJob::answerUser(const QString& user)
+{
+    Request request;
+    request.reply = Request::Login;
+    request.user = user.isNull() ? QStringLiteral("") : user;
+    d_func()->answer(request);
 }
 
 void MountResourceJob::confirm(bool yes)

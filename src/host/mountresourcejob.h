@@ -89,6 +89,19 @@ public:
     int silenceLimit() const;
 
     /**
+     * How many milliseconds a look at what is mounted may take before it counts as dead; 5000 by
+     * default. To be set before start().
+     */
+    void setPatience(int milliseconds);
+
+    /**
+     * Whether the answers that follow are the last ones: when the server refuses such a password
+     * the job ends with code 2, and the server is not tried once more for the next question. False
+     * by default.
+     */
+    void setLastTry(bool isLast);
+
+    /**
      * The program to start in the place of the installed `veyfm-mount`; for tests. What is
      * installed is found by the place of this library.
      */
@@ -146,6 +159,8 @@ public Q_SLOTS:
     /// No copy of the password is kept. An empty password is a password. Another user than that of
     /// the question begins the mount anew in that name. @{
     void answerPassword(const QString& user, const QString& password);
+    /// Another user alone: for ftp and sftp the password is asked for when it is needed.
+    void answerUser(const QString& user);
     void confirm(bool yes);
     /// @}
 

@@ -98,6 +98,7 @@ void MountResourceJobPrivate::run()
     request.kind = Request::Mount;
     request.url = url;
     request.user = user.isEmpty() ? QString() : user;
+    request.patience = patience;
     send(request);
     restartSilence();
 }
@@ -301,6 +302,8 @@ void MountResourceJobPrivate::askAuthenticator()
         const bool isTaken = userChanged || copy.protocol == QLatin1String("smb");
         if (cancelled) {
             job()->giveUp();
+        } else if (userChanged && password.isNull() && copy.protocol != QLatin1String("smb")) {
+            job()->answerUser(name);
         } else {
             job()->answerPassword(isTaken ? name : copy.user, password);
         }
@@ -319,7 +322,9 @@ void MountResourceJobPrivate::answer(const Request& answered, const QString& pas
     Request request = answered;
     request.kind = Request::Answer;
     request.id = m_questionId;
-    if (request.user == question->user) {
+    request.isLast = isLastTry;
+    // A name alone has to be said; see readAnswer().
+    if (request.hasPassword && request.user == question->user) {
         request.user = QString();
     }
     question.reset();

@@ -34,6 +34,8 @@ public:
     QString user;
     QString program;
     int silenceLimit = 0;
+    int patience = MountProtocol::Request().patience;
+    bool isLastTry = false;
     std::optional<MountQuestion> question;
     MountProtocol::End result; ///< As far as the job has ended well.
     Entry entry;

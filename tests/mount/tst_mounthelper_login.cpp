@@ -18,6 +18,8 @@ private Q_SLOTS:
     void passwordOfSamba();
     void wrongPassword_data();
     void wrongPassword();
+    void lastPassword_data();
+    void lastPassword();
     void wrongPasswordBehindTheKey();
     void keyRefused();
     void endsBeforeThePassword();
@@ -185,6 +187,32 @@ void MountHelperLoginTest::wrongPassword()
     session.take();
     QCOMPARE(session.waitForEnd(), 0);
     QCOMPARE(scene.tool.input(3), QByteArray("geheim3\n"));
+}
+
+void MountHelperLoginTest::lastPassword_data()
+{
+    wrongPassword_data();
+}
+
+void MountHelperLoginTest::lastPassword()
+{
+    // The server is not troubled once more to have it ask for what there is not.
+    QFETCH(QByteArray, tool);
+    QFETCH(QByteArray, url);
+    QFETCH(QByteArrayList, prompt);
+    QFETCH(QByteArrayList, refusal);
+    MountScene scene(tool);
+    scene.tool.expect(prompt + refusal);
+    HelperSession session(scene.environment());
+    session.mount(url);
+    QCOMPARE(textOf(session.next(), "kind"), QStringLiteral("password"));
+    session.say(R"({"do":"answer","id":1,"password":true,"last":true})");
+    session.say(R"("geheim")");
+    QCOMPARE(textOf(session.next(), "say"), QStringLiteral("rejected"));
+    QCOMPARE(numberOf(session.next(), "code"), 2);
+    QCOMPARE(session.waitForEnd(), 1);
+    QCOMPARE(scene.tool.runs(), 1);
+    QVERIFY(scene.isClean());
 }
 
 void MountHelperLoginTest::wrongPasswordBehindTheKey()

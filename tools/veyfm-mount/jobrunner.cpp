@@ -3,6 +3,7 @@
 
 #include "jobrunner.h"
 
+#include "host/helpertexts.h"
 #include "jobs/checksmbshareauthjob.h"
 #include "jobs/job.h"
 #include "jobs/mountftpurljob.h"
@@ -84,7 +85,7 @@ bool JobRunner::takeSilence(JobResult* result)
     if (m_authenticator->isGivenUp()) {
         *result = {cancelledCode, cancelledText()};
     } else {
-        *result = {failedCode, QStringLiteral("the server ended the connection")};
+        *result = {failedCode, QLatin1String(Host::endedByServer)};
     }
     return true;
 }

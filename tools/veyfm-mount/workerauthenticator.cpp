@@ -3,6 +3,7 @@
 
 #include "workerauthenticator.h"
 
+#include "host/helpertexts.h"
 #include "host/mounturl.h"
 #include "host/secretline.h"
 
@@ -138,12 +139,17 @@ QString WorkerAuthenticator::requestPassword(
     if (!isUsed) {
         m_refused.insert(resource());
         m_asked.clear();
+        if (wasPasswordGiven && m_isLastTry) {
+            m_isGivenUp = true;
+            *cancelled = true;
+            return QString();
+        }
         if (wasPasswordGiven) {
             return QString(); // The tool asks again.
         }
         if (protocol() == sftp) {
             // It would end like that for ever.
-            m_whyEnded = QStringLiteral("the connection ended before a password was asked for");
+            m_whyEnded = QLatin1String(Host::endedBeforePassword);
             *cancelled = true;
             return QString();
         }
@@ -192,6 +198,7 @@ QString WorkerAuthenticator::ask(Question question, bool isUsed, QString& user, 
             m_newUser = name;
             m_keptPassword = reply.answer.hasPassword ? reply.password : QString();
             m_keptFor = resource();
+            m_isLastTry = reply.answer.isLast;
             m_refused.clear();
             *cancelled = true;
             return QString();
@@ -203,6 +210,7 @@ QString WorkerAuthenticator::ask(Question question, bool isUsed, QString& user, 
         }
         m_refused.remove(resource());
         m_passwordGiven = true;
+        m_isLastTry = reply.answer.isLast;
         return reply.password;
     }
 }

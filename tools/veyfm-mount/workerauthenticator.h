@@ -75,6 +75,7 @@ private:
     QSet<QString> m_refused;      ///< Resources.
     QSet<QString> m_asked;        ///< Since the tool has been started.
     bool m_passwordGiven = false; ///< Since the tool has been started.
+    bool m_isLastTry = false;     ///< Whether the last answer is followed by no other.
     bool m_keyConfirmed = false;
     bool m_wasAccepted = false;
     bool m_isGivenUp = false;
