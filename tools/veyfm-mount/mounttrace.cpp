@@ -7,6 +7,7 @@
 #include "host/mountinfo.h"
 
 #include <QFile>
+#include <QFileInfo>
 
 #include <cerrno>
 #include <chrono>
@@ -61,8 +62,12 @@ MountTrace::MountTrace(const QString& directory, const QString& mountRoot)
     , m_kernelPath(Host::kernelPath(directory, mountRoot))
     , m_mounts(fuseMountsOn(m_kernelPath))
 {
-    for (const QString& path : {directory, parentOf(directory), mountRoot}) {
-        if (!isThere(path)) {
+    if (!isThere(directory)) {
+        m_missing.append(directory);
+    }
+    // No mounts of ours, and what is above them may have more than can be read.
+    for (const QString& path : {parentOf(directory), mountRoot}) {
+        if (!QFileInfo(path).exists() && !QFileInfo(path).isSymLink()) {
             m_missing.append(path);
         }
     }

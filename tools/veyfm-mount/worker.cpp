@@ -137,6 +137,7 @@ void runWorker(int socket, int& argc, char** argv)
     qInstallMessageHandler(dropWarnings);
     QCoreApplication application(argc, argv);
     QCoreApplication::setApplicationName(QStringLiteral("veyfm-mount"));
+    VFS::setServiceProbe(Tool::probeMilliseconds);
     VFS::initialize();
     Report report;
     report.kind = Report::Ended;
