@@ -130,6 +130,22 @@ public:
         return all;
     }
 
+    /// The process of the program that a run of the tool goes back to; 0 where there is none any
+    /// more.
+    pid_t programOf(int run) const
+    {
+        pid_t pid = pid_t(tool.parentId(run));
+        while (pid > 1) {
+            QFile file(QStringLiteral("/proc/%1/stat").arg(pid));
+            const QByteArray stat = file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
+            if (stat.contains(" (veyfm-vfs) ")) {
+                return pid;
+            }
+            pid = stat.mid(stat.lastIndexOf(')') + 2).split(' ').value(1).toInt();
+        }
+        return 0;
+    }
+
     /// One that has ended may wait for a while until somebody takes note of it.
     static bool isRunning(qint64 pid)
     {

@@ -196,6 +196,21 @@ void serveDirectory(const std::string& words)
     }
 }
 
+// The nearest ancestor that is veyfm-vfs.
+pid_t program()
+{
+    pid_t pid = getppid();
+    while (pid > 1) {
+        const std::string stat = contents("/proc/" + std::to_string(pid) + "/stat");
+        if (stat.find(" (veyfm-vfs) ") != std::string::npos) {
+            return pid;
+        }
+        const size_t state = stat.rfind(')') + 2;
+        pid = stat.size() > state + 2 ? std::atoi(stat.c_str() + state + 2) : 0;
+    }
+    _exit(91);
+}
+
 void play(const std::string& line)
 {
     const size_t blank = line.find(' ');
@@ -232,7 +247,7 @@ void play(const std::string& line)
     } else if (verb == "serve") {
         serveDirectory(rest);
     } else if (verb == "interrupt") {
-        kill(getppid(), SIGINT);
+        kill(program(), SIGINT);
         raise(SIGINT);
     } else if (verb == "kill") {
         raise(std::atoi(rest.c_str()));

@@ -29,7 +29,7 @@
  *   serve PROGRAM ARGS   starts a program with that directory before its arguments, in the
  *                        background, and waits for the first that it prints
  *   kill N, exit N       ends
- *   interrupt            ends by a SIGINT, which its parent gets first, as Ctrl-C is for both
+ *   interrupt            ends by a SIGINT, which veyfm-vfs gets first, as Ctrl-C is for both
  *
  * At the end of the lines it exits with 0. A run that nobody expects exits with 93, and shows in
  * runs() like any other.

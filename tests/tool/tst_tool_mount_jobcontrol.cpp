@@ -185,7 +185,7 @@ void ToolMountJobControlTest::stoppedUnseen()
     shell.run("$TOOL mount sftp://me@host/");
     QVERIFY(shell->waitFor(question));
     QTRY_COMPARE(scene.tool.runs(), 1);
-    ::kill(pid_t(scene.tool.parentId(1)), SIGSTOP);
+    ::kill(scene.programOf(1), SIGSTOP);
     QVERIFY2(shell->waitFor("Stopped"), shell->output().constData());
     shell.run("fg");
     QVERIFY(shell->waitFor(question, 2));
@@ -211,7 +211,7 @@ void ToolMountJobControlTest::stoppedUnseenInPlainShell()
         QDir::rootPath(), scene.environment(), 200);
     QVERIFY(session.waitFor(question));
     QTRY_COMPARE(scene.tool.runs(), 1);
-    ::kill(pid_t(scene.tool.parentId(1)), SIGSTOP);
+    ::kill(scene.programOf(1), SIGSTOP);
     QVERIFY2(session.waitFor(question, 2), session.output().constData());
     session.type(typed);
     QVERIFY2(session.waitFor("end\n"), session.output().constData());

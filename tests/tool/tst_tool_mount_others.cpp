@@ -135,10 +135,8 @@ void ToolMountOthersTest::duringQuestion()
     scene.tool.expect(Said::sshPassword() + Said::sshRefusal());
     const auto session = scene.onTerminal("mount sftp://me@host/");
     QVERIFY(session->waitFor("Password for me on sftp://host: "));
-    {
-        const OtherMount other(type.constData(), scene.directory(QStringLiteral("sftp/me@host")));
-        QVERIFY(other.stands());
-    }
+    const OtherMount other(type.constData(), scene.directory(QStringLiteral("sftp/me@host")));
+    QVERIFY(other.stands());
     session->type(key);
     QCOMPARE(session->waitForEnd(), key == "\003" ? 128 + SIGINT : 1);
     QVERIFY2(session->output().contains(why), session->output().constData());
@@ -173,10 +171,8 @@ void ToolMountOthersTest::besideFailingTool()
     process.setProcessEnvironment(scene.environment());
     process.start(toolPath(), MountScene::words("mount sftp://me@host/"));
     QTRY_VERIFY_WITH_TIMEOUT(scene.tool.processId(1) > 0, patience);
-    {
-        const OtherMount other("fuse", scene.directory(QStringLiteral("sftp/me@host")));
-        QVERIFY(other.stands());
-    }
+    const OtherMount other("fuse", scene.directory(QStringLiteral("sftp/me@host")));
+    QVERIFY(other.stands());
     ::kill(pid_t(scene.tool.processId(1)), SIGKILL);
     QVERIFY(process.waitForFinished(patience));
     QCOMPARE(process.exitCode(), 1);

@@ -32,6 +32,7 @@ private Q_SLOTS:
     void passphraseThreeTimes();
     void doesWithoutAPassphrase_data();
     void doesWithoutAPassphrase();
+    void doesWithoutAPassphraseInVain();
     void ownWords();
     void ownWordsFromDescriptor();
 };
@@ -189,6 +190,22 @@ void ToolMountPromptsTest::doesWithoutAPassphrase()
     QVERIFY2(result.err.contains(error), result.err.constData());
     QCOMPARE(result.exitCode, error.isEmpty() ? 0 : 1);
     QCOMPARE(scene.tool.input(1), input);
+}
+
+// Where the server takes keys alone.
+void ToolMountPromptsTest::doesWithoutAPassphraseInVain()
+{
+    MountScene scene("sshfs");
+    scene.tool.expect(asksPassphrase + Said::sshRefusal());
+    scene.tool.expect(asksPassphrase + Said::sshRefusal());
+    const ToolResult result = scene.run("mount --no-input sftp://me@host/");
+    QCOMPARE(result.exitCode, 1);
+    QCOMPARE(
+        result.err, failure(
+                        "sftp://me@host/",
+                        "the connection ended before a password was asked for: look with 'ssh "
+                        "me@host' whether the host answers, and lets you in"));
+    QVERIFY(scene.isClean());
 }
 
 void ToolMountPromptsTest::ownWords()

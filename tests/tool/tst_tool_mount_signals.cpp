@@ -157,7 +157,7 @@ void ToolMountSignalsTest::interruptedTool()
     QProcess process;
     scene.start(process, "mount --timeout 0 " + url);
     QTRY_VERIFY_WITH_TIMEOUT(scene.tool.childId(1) > 0, patience);
-    ::kill(pid_t(scene.tool.parentId(1)), number);
+    ::kill(scene.programOf(1), number);
     QVERIFY(process.waitForFinished(patience));
     QCOMPARE(process.exitStatus(), QProcess::CrashExit);
     QCOMPARE(process.exitCode(), number);
@@ -201,7 +201,7 @@ void ToolMountSignalsTest::interruptedService()
              .isEmpty(),
         patience);
     QCOMPARE(scene.mounts(), QStringList(QStringLiteral("sftp/me@host")));
-    ::kill(pid_t(scene.tool.parentId(1)), SIGINT);
+    ::kill(scene.programOf(1), SIGINT);
     QVERIFY(process.waitForFinished(patience));
     QCOMPARE(process.exitStatus(), QProcess::CrashExit);
     QCOMPARE(process.exitCode(), SIGINT);

@@ -9,6 +9,24 @@
 #include <cstring>
 #include <grp.h>
 
+namespace {
+
+/// One who is not root, with a runtime directory to write in.
+class Outsider
+{
+public:
+    Outsider()
+    {
+        qputenv("XDG_RUNTIME_DIR", QFile::encodeName(m_runtime.path()));
+    }
+
+private:
+    const OutsideGroup m_outside;
+    const QTemporaryDir m_runtime;
+};
+
+} // namespace
+
 /// "mount" as one who is not root.
 class ToolMountUserTest : public QObject
 {
@@ -33,7 +51,7 @@ void ToolMountUserTest::initTestCase()
 
 void ToolMountUserTest::outsideTheGroup()
 {
-    const OutsideGroup outside;
+    const Outsider outsider;
     ToolScene service;
     QVERIFY(service.isReady());
     MountScene scene("sshfs", &service);
@@ -52,7 +70,7 @@ void ToolMountUserTest::outsideTheGroup()
 void ToolMountUserTest::hungTool()
 {
     // A process that leaves no core file is closed to others of its user, but not to itself.
-    const OutsideGroup outside;
+    const Outsider outsider;
     MountScene scene("sshfs");
     scene.tool.expect({"hang"});
     const ToolResult result = scene.run("mount --timeout 1 sftp://me@host/");
@@ -65,7 +83,7 @@ void ToolMountUserTest::hungTool()
 void ToolMountUserTest::closedToDumps()
 {
     // What the kernel would write no core file of belongs to root in /proc, whoever runs it.
-    const OutsideGroup outside;
+    const Outsider outsider;
     const auto ownerOf = [](qint64 pid) {
         return QFileInfo(QStringLiteral("/proc/%1/environ").arg(pid)).ownerId();
     };

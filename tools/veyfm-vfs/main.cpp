@@ -4,7 +4,6 @@
 #include "commandline.h"
 #include "descriptors.h"
 #include "ending.h"
-#include "mount/descendants.h"
 #include "report.h"
 #include "restart.h"
 #include "service.h"
@@ -22,7 +21,6 @@ int main(int argc, char* argv[])
     VeyFM::Tool::Restart::prepare(argv);
     // Where the caller ignores it, nobody learns how the tools end.
     ::signal(SIGCHLD, SIG_DFL);
-    VeyFM::Tool::leaveInheritedChildren();
     VeyFM::Tool::installLogging();
     QCoreApplication application(argc, argv);
     QCoreApplication::setApplicationName(QStringLiteral("veyfm-vfs"));

@@ -4,13 +4,17 @@
 #include "mount/jobfailure.h"
 
 #include "core/fuse.h"
+#include "host/helpertexts.h"
+#include "jobs/mountftpurljob.h"
+#include "jobs/mountfuseentryjob.h"
+#include "jobs/mountsftpurljob.h"
+#include "jobs/mountsmburljob.h"
 #include "mount/login.h"
 #include "report.h"
-#include "service/smbbrowserproxy.h"
-#include "vfs/vfs.h"
 
 #include <QStandardPaths>
 
+#include <algorithm>
 #include <cerrno>
 #include <grp.h>
 #include <unistd.h>
@@ -64,14 +68,14 @@ QString lookWithSsh(const TerminalAuthenticator& authenticator)
         .arg(authenticator.sshCommand());
 }
 
-QString whyNoProgress(const QString& scheme, const TerminalAuthenticator& authenticator)
+QString
+whyNoProgress(const QString& scheme, const TerminalAuthenticator& authenticator, bool isMounted)
 {
     if (authenticator.isDescriptorSilent()) {
         return QStringLiteral("no password came from the descriptor of --password-fd");
     }
-    // A job that runs no tool, or is done with it, waits for the service alone.
-    if (authenticator.protocol().isEmpty() || authenticator.wasAccepted() ||
-        authenticator.wasUserChangedLast()) {
+    // Nothing but the service is waited for then.
+    if (isMounted || authenticator.wasAccepted()) {
         return QStringLiteral("the file manager service does not tell of the mount");
     }
     if (scheme == QLatin1String("sftp")) {
@@ -100,14 +104,32 @@ QString whyNoFuse(const QString& scheme)
     return QString();
 }
 
+/// Whether it is what the jobs say of tools that have failed.
+bool isOfTool(const QString& text)
+{
+    const QString all[] = {
+        MountSFtpURLJob::tr("Mounting sftp resource failed"),
+        MountSFtpURLJob::tr("Can't pass password to sshfs"),
+        MountFtpURLJob::tr("Mounting ftp resource failed"),
+        MountSmbURLJob::tr("Can't get local path for samba network")};
+    return std::find(std::begin(all), std::end(all), text) != std::end(all);
+}
+
 QString whyToolFailed(
     const QString& text, const QString& scheme, const TerminalAuthenticator& authenticator)
 {
+    if (text == QLatin1String(Host::endedBeforePassword)) {
+        return authenticator.withSshCommand(Host::endedBeforePassword);
+    }
+    if (text == QLatin1String(Host::endedByServer)) {
+        return text + QStringLiteral(": ") + lookWithSsh(authenticator);
+    }
+    if (!isOfTool(text)) {
+        return text;
+    }
     if (scheme == QLatin1String("smb")) {
-        return VFS::ptr()->smbBrowser()->smbNetworkLocalPath().isEmpty()
-                   ? QStringLiteral("the file manager service has no directory in which it keeps "
-                                    "the Samba network: see its own documentation")
-                   : text;
+        return QStringLiteral("the file manager service has no directory in which it keeps the "
+                              "Samba network: see its own documentation");
     }
     const QString why = whyNoFuse(scheme);
     if (!why.isEmpty()) {
@@ -147,35 +169,25 @@ QString whyOutsideGroup()
 
 QString whyFailed(
     const JobResult& result, const QString& scheme, const TerminalAuthenticator& authenticator,
-    const JobWatch& watch)
+    const JobWatch& watch, bool isMounted)
 {
     if (result.end == JobResult::Interrupted) {
         return watch.whyStopped();
     }
     if (result.end == JobResult::TimedOut) {
-        return watch.whyStopped() + QStringLiteral(": ") + whyNoProgress(scheme, authenticator);
+        return watch.whyStopped() + QStringLiteral(": ") +
+               whyNoProgress(scheme, authenticator, isMounted);
     }
-    if (result.end == JobResult::NotStarted) {
-        return QStringLiteral("%1 can't be started: %2").arg(programOf(scheme), result.text);
-    }
-    if (!authenticator.whyGivenUp().isEmpty()) {
-        return authenticator.whyGivenUp();
-    }
-    if (result.end == JobResult::Silent) {
-        return QStringLiteral("the server ended the connection: ") + lookWithSsh(authenticator);
-    }
-    // Codes that say so, and also that the user gave up.
+    // Codes that say that the user gave up, and also that nothing was tried.
     if (result.code == 2 || result.code == 4) {
-        const QString why = whyOutsideGroup();
-        if (!why.isEmpty()) {
-            return why;
-        }
+        const QString why = result.code == 2 ? authenticator.whyGivenUp() : QString();
+        const QString whyOutside = why.isEmpty() ? whyOutsideGroup() : why;
+        return whyOutside.isEmpty() ? result.text : whyOutside;
     }
     if (result.code == 5) {
         return whyToolFailed(result.text, scheme, authenticator);
     }
-    // The tool has done its work then.
-    return authenticator.wasAccepted()
+    return result.text == MountFuseEntryJob::tr("Couldn't access resource")
                ? result.text + QStringLiteral(": the file manager service refuses the mount")
                : result.text;
 }

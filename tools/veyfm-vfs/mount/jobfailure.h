@@ -15,10 +15,11 @@ QString whyNoTool(const QString& scheme);
 /// Why a user outside the group "fuse" can't mount, with what helps; empty for others.
 QString whyOutsideGroup();
 
-/// Why a job of the scheme did not come to a good end, with what helps.
+/// Why a job of the scheme did not come to a good end, with what helps. @p isMounted says whether
+/// there is a mount all the same.
 QString whyFailed(
     const JobResult& result, const QString& scheme, const TerminalAuthenticator& authenticator,
-    const JobWatch& watch);
+    const JobWatch& watch, bool isMounted = false);
 
 } // namespace Tool
 } // namespace VeyFM

@@ -5,7 +5,10 @@
 
 #include "terminal.h"
 
+#include <QEventLoop>
+#include <QSocketNotifier>
 #include <QStringList>
+#include <QTimer>
 
 #include <array>
 #include <cerrno>
@@ -16,7 +19,6 @@
 #include <signal.h>
 #include <sys/eventfd.h>
 #include <termios.h>
-#include <thread>
 #include <unistd.h>
 
 namespace VeyFM {
@@ -256,7 +258,9 @@ bool Prompt::waitForForeground()
         // A shell looks after the group as a whole.
         ::kill(0, SIGTTIN);
         // A signal that came with the one to go on may be on its way to cancel() yet.
-        std::this_thread::sleep_for(pace);
+        QEventLoop loop;
+        QTimer::singleShot(pace, &loop, &QEventLoop::quit);
+        loop.exec();
     }
     m_isOutOfReach = true;
     return false;
@@ -321,7 +325,7 @@ bool Prompt::waitForInput(int descriptor) const
 {
     while (true) {
         pollfd polled[] = {{descriptor, POLLIN, 0}, {m_wake, POLLIN, 0}};
-        const int ready = ::poll(polled, 2, -1);
+        const int ready = ::poll(polled, 2, 0);
         if (ready < 0 && errno != EINTR) {
             return false;
         }
@@ -335,6 +339,13 @@ bool Prompt::waitForInput(int descriptor) const
         if (ready > 0 && polled[0].revents != 0) {
             return true;
         }
+        // All else goes on meanwhile.
+        QEventLoop loop;
+        const QSocketNotifier input(descriptor, QSocketNotifier::Read);
+        const QSocketNotifier woken(m_wake, QSocketNotifier::Read);
+        QObject::connect(&input, &QSocketNotifier::activated, &loop, &QEventLoop::quit);
+        QObject::connect(&woken, &QSocketNotifier::activated, &loop, &QEventLoop::quit);
+        loop.exec();
     }
 }
 

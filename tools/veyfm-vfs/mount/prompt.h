@@ -19,6 +19,8 @@ namespace Tool {
  * While a password is typed the terminal shows nothing; it is put back as it was at the end, and
  * also while the program is stopped (Ctrl-Z) and before a signal ends it. A question is asked in
  * the foreground only: in the background the program stops until a shell brings it there.
+ *
+ * While it waits, an event loop runs.
  */
 class Prompt
 {

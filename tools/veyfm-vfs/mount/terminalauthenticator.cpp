@@ -3,9 +3,9 @@
 
 #include "mount/terminalauthenticator.h"
 
+#include "host/helpertexts.h"
 #include "host/mounturl.h"
 #include "jobs/mountsftpurljob.h"
-#include "mount/descendants.h"
 #include "mount/sshconfig.h"
 #include "report.h"
 #include "spinner.h"
@@ -27,6 +27,7 @@ namespace {
 constexpr int mostTries = 3;
 
 const QLatin1String smb("smb");
+const QLatin1String ftp("ftp");
 const QLatin1String sftp("sftp");
 
 /// Neither this process nor the tools that get the password leave a core file with it.
@@ -138,9 +139,6 @@ void TerminalAuthenticator::beginJob()
     setResource(QString(), QString(), QString(), QString());
     m_whyGivenUp.clear();
     m_wasAccepted = false;
-    m_keyConfirmed = false;
-    m_passwordGiven = false;
-    m_userChangedLast = false;
 }
 
 void TerminalAuthenticator::setAccount(const QString& user, const QString& host)
@@ -159,6 +157,12 @@ QString TerminalAuthenticator::sshCommand() const
            (plain.match(m_user).hasMatch() ? m_user + QLatin1Char('@') + host : host);
 }
 
+QString TerminalAuthenticator::withSshCommand(const char* why) const
+{
+    return QStringLiteral("%1: look with '%2' whether the host answers, and lets you in")
+        .arg(QLatin1String(why), sshCommand());
+}
+
 bool TerminalAuthenticator::wasAccepted() const
 {
     return m_wasAccepted;
@@ -169,29 +173,22 @@ bool TerminalAuthenticator::isDescriptorSilent() const
     return m_isDescriptorSilent;
 }
 
-bool TerminalAuthenticator::wasUserChangedLast() const
+QString TerminalAuthenticator::user() const
 {
-    return m_userChangedLast;
+    return m_user;
 }
 
-QStringList TerminalAuthenticator::changedUsers() const
+bool TerminalAuthenticator::isLastTry() const
 {
-    const std::lock_guard<std::mutex> lock(m_changedUsersLock);
-    return m_changedUsers;
+    return m_descriptorRead || m_tries.value(resource()).count == mostTries;
 }
 
 QString TerminalAuthenticator::whyGivenUp() const
 {
-    return m_whyGivenUp;
-}
-
-bool TerminalAuthenticator::isWorthAnotherJob()
-{
-    if (!m_whyGivenUp.isEmpty() || !m_keyConfirmed || !m_passwordGiven) {
-        return false;
+    if (!m_whyGivenUp.isEmpty() || !isLastTry()) {
+        return m_whyGivenUp;
     }
-    m_tries[resource()].wasRefused = true;
-    return true;
+    return m_descriptorRead ? QStringLiteral("the password was refused") : threeWereRefused();
 }
 
 QString TerminalAuthenticator::resource() const
@@ -242,20 +239,18 @@ QString TerminalAuthenticator::requestPassword(
     bool isRetry, const QString& title, const QString& message, QString& user, bool* userChanged,
     bool* cancelled)
 {
-    Q_UNUSED(isRetry) // Some jobs say so of the first question, too.
-    m_userChangedLast = false;
     if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty()) {
         return giveUp(wasCancelled(), cancelled);
     }
-    // A job that asks when its tool has ended throws the answer away.
-    const bool isUsed = protocol() == smb || hasRunningDescendants();
-    if (!isUsed) {
+    if (isRetry) {
         m_tries[resource()].wasRefused = true; // Without a user the jobs do not tell.
     }
-    QString why = whyNoMoreTries(isUsed);
+    QString why = whyNoMoreTries();
     if (!why.isEmpty()) {
         return giveUp(why, cancelled);
     }
+    // Nobody in particular was refused, and only the name of somebody is of use.
+    const bool isUsed = protocol() != ftp || !user.isEmpty();
 
     const Asking asking(*this);
     if (isUsed && isOwnWords(protocol(), message)) {
@@ -265,7 +260,7 @@ QString TerminalAuthenticator::requestPassword(
         m_prompt.show(message.isEmpty() || protocol() != smb ? title : message);
     }
     QString name = user;
-    if (isUserAsked(user, isUsed)) {
+    if (isUserAsked(user)) {
         why = whyNoUserName(name);
     }
     if (!why.isEmpty()) {
@@ -280,7 +275,6 @@ QString TerminalAuthenticator::requestPassword(
             return QString();
         }
     }
-    m_passwordGiven = isUsed;
     if (!isUsed) {
         return QString();
     }
@@ -297,10 +291,12 @@ QString
 TerminalAuthenticator::answerOwnWords(const QString& question, const QString& user, bool* cancelled)
 {
     const bool isPassphrase = question.startsWith(QLatin1String("Enter passphrase for key"));
-    if (isPassphrase && !isPersonAsked()) {
-        return QString(); // There may be another way to log in.
-    }
     Tries& tries = m_tries[isPassphrase ? question : resource()];
+    if (isPassphrase && !isPersonAsked()) {
+        // There may be another way to log in, but not behind that.
+        return ++tries.count == 1 ? QString()
+                                  : giveUp(withSshCommand(Host::endedBeforePassword), cancelled);
+    }
     QString why = tries.count == mostTries ? threeWereRefused() : QString();
     Secret answer;
     if (why.isEmpty()) {
@@ -310,7 +306,6 @@ TerminalAuthenticator::answerOwnWords(const QString& question, const QString& us
         return giveUp(why, cancelled);
     }
     ++tries.count;
-    m_passwordGiven = true;
     return answer.text();
 }
 
@@ -318,30 +313,12 @@ void TerminalAuthenticator::noteChangedUser(const QString& user)
 {
     m_user = user;
     m_tries[resource()].wasRefused = false;
-    m_userChangedLast = true;
-    const std::lock_guard<std::mutex> lock(m_changedUsersLock);
-    m_changedUsers.append(user);
 }
 
 /// Why there is no use in another try; empty when there is.
-QString TerminalAuthenticator::whyNoMoreTries(bool isUsed) const
+QString TerminalAuthenticator::whyNoMoreTries() const
 {
-    const Tries tries = m_tries.value(resource());
-    if (!tries.wasRefused) {
-        return QString();
-    }
-    if (tries.count == mostTries) {
-        return threeWereRefused();
-    }
-    if (m_descriptorRead) {
-        return QStringLiteral("the password was refused");
-    }
-    if (protocol() == sftp && !isUsed && !m_passwordGiven) {
-        return QStringLiteral("the connection ended before a password was asked for: look with "
-                              "'%1' whether the host answers, and lets you in")
-            .arg(sshCommand());
-    }
-    return QString();
+    return m_tries.value(resource()).wasRefused && isLastTry() ? whyGivenUp() : QString();
 }
 
 bool TerminalAuthenticator::isPersonAsked() const
@@ -349,7 +326,7 @@ bool TerminalAuthenticator::isPersonAsked() const
     return !m_login.noInput && m_login.passwordDescriptor < 0 && m_prompt.isAvailable();
 }
 
-bool TerminalAuthenticator::isUserAsked(const QString& user, bool isUsed) const
+bool TerminalAuthenticator::isUserAsked(const QString& user) const
 {
     if (!user.isEmpty()) {
         return protocol() == smb;
@@ -358,7 +335,7 @@ bool TerminalAuthenticator::isUserAsked(const QString& user, bool isUsed) const
         return true;
     }
     // Without a name ssh has one of its own.
-    return isUsed && (!m_login.user.isEmpty() || isPersonAsked());
+    return !m_login.user.isEmpty() || isPersonAsked();
 }
 
 QString TerminalAuthenticator::whyNoAnswer(const QString& needed, const QString& options) const
@@ -461,7 +438,6 @@ QString TerminalAuthenticator::whyNotFromDescriptor(const QString& user, Secret&
 bool TerminalAuthenticator::askQuestion(const QString& title, const QString& text)
 {
     Q_UNUSED(title) // It says that this is a question.
-    m_userChangedLast = false;
     if (m_prompt.isCancelled() || !m_whyGivenUp.isEmpty()) {
         return false;
     }
@@ -483,7 +459,6 @@ bool TerminalAuthenticator::askQuestion(const QString& title, const QString& tex
         }
         const QString answer = line.text().trimmed();
         if (answer == QLatin1String("yes")) {
-            m_keyConfirmed = true;
             return true;
         }
         if (answer == QLatin1String("no")) {

@@ -10,10 +10,8 @@
 #include "mount/secret.h"
 
 #include <QHash>
-#include <QStringList>
 
 #include <functional>
-#include <mutex>
 
 namespace VeyFM {
 namespace Tool {
@@ -22,10 +20,8 @@ namespace Tool {
  * Answers the jobs of one command with what the person at the terminal types, or with what the
  * command line gives in place of that.
  *
- * After a refusal the mount jobs ask twice, and throw the first answer away. That question shows
- * by its tool having ended, and the person is not troubled with it. There are three tries, and
- * one for a password that is not typed. Then, and when the person gives up, every question of the
- * job is answered with "cancelled", and whyGivenUp() says why.
+ * There are three tries, and one for a password that is not typed. Then, and when the person gives
+ * up, every question of the job is answered with "cancelled", and whyGivenUp() says why.
  *
  * What ssh asks in other words than for a password is asked in its words. Where nobody can be, it
  * has to do without the passphrase of a key, and a password that is not typed goes to the host of
@@ -57,29 +53,24 @@ public:
     /// What a person types to look at the host of an SFTP job.
     QString sshCommand() const;
 
+    /// Why such a job failed, and that.
+    QString withSshCommand(const char* why) const;
+
     /// Whether the job told that a login has worked.
     bool wasAccepted() const;
 
     /// Whether the job was stopped while it waited for --password-fd.
     bool isDescriptorSilent() const;
 
-    /// Whether the last answer to the job was another user. When it asks no more, that user's mount
-    /// was there.
-    bool wasUserChangedLast() const;
+    /// Whom the job logs in as by now; may be empty.
+    QString user() const;
 
-    /// The users that jobs were told so far to take in place of the one in the URL, the last one
-    /// last. From any thread.
-    QStringList changedUsers() const;
+    /// Whether the last answer was the last one of all, should it be refused.
+    bool isLastTry() const;
 
-    /// Why a question of the job had no answer, with what helps; empty when all had one.
+    /// Why a job was given up, with what helps: a question had no answer, or the last answer was
+    /// refused. Empty when all had one, and there are more.
     QString whyGivenUp() const;
-
-    /**
-     * To be called when a job has ended without a word. Whether it is worth to start another: an
-     * SFTP job does not tell that a password was wrong if the key of the host was confirmed in
-     * the same run. The next job asks again then.
-     */
-    bool isWorthAnotherJob();
 
     /// Called with true before a person is asked and with false behind, in the thread of the job.
     void setAskingHandler(std::function<void(bool)> handler);
@@ -101,11 +92,11 @@ private:
     QString whose(const QString& user) const;
     bool isOnTheWay() const;
     bool isPersonAsked() const;
-    bool isUserAsked(const QString& user, bool isUsed) const;
+    bool isUserAsked(const QString& user) const;
     QString answerOwnWords(const QString& question, const QString& user, bool* cancelled);
     QString whyNoAnswer(const QString& needed, const QString& options) const;
     QString whyNotAnswered() const;
-    QString whyNoMoreTries(bool isUsed) const;
+    QString whyNoMoreTries() const;
     QString whyNoUserName(QString& user);
     QString whyNoPassword(const QString& user, const QString& question, Secret& password);
     QString whyNotFromDescriptor(const QString& user, Secret& password);
@@ -119,15 +110,10 @@ private:
     std::function<void(bool)> m_askingHandler;
 
     QHash<QString, Tries> m_tries; ///< By resource, or by the question that is not its password.
-    bool m_passwordGiven = false;  ///< Since the last refusal.
     bool m_descriptorRead = false;
     bool m_isDescriptorSilent = false;
     bool m_wasAccepted = false;
-    bool m_keyConfirmed = false;
-    bool m_userChangedLast = false;
     QString m_whyGivenUp;
-    mutable std::mutex m_changedUsersLock;
-    QStringList m_changedUsers;
 };
 
 } // namespace Tool

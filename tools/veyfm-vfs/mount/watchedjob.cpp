@@ -6,7 +6,6 @@
 #include "commandline.h"
 #include "ending.h"
 #include "jobs/job.h"
-#include "mount/descendants.h"
 #include "patience.h"
 #include "report.h"
 #include "session.h"
@@ -14,9 +13,10 @@
 
 #include <QCoreApplication>
 #include <QEventLoop>
-#include <QProcess>
+#include <QFile>
 
 #include <algorithm>
+#include <signal.h>
 #include <unistd.h>
 
 namespace VeyFM {
@@ -26,7 +26,8 @@ namespace {
 
 constexpr int defaultTimeout = 60;
 constexpr uint longestTimeout = 1000000; // Seconds; poll() takes milliseconds in an int.
-constexpr std::chrono::seconds grace(5);
+constexpr std::chrono::seconds grace(7); // A mount that is cancelled takes five at most.
+constexpr std::chrono::seconds graceOfTools(1);
 constexpr std::chrono::milliseconds graceOfCalls(500);
 constexpr std::chrono::milliseconds graceOfSignals(500); // timeout(1) sends each twice.
 constexpr std::chrono::seconds parting(2);
@@ -34,12 +35,21 @@ constexpr int paceMilliseconds = 100;
 
 std::atomic<bool> hadToStop{false};
 
-bool hasRunningTool(const Job& job)
+/// The children of the main thread.
+std::vector<pid_t> children()
 {
-    const QList<QProcess*> tools = job.findChildren<QProcess*>();
-    return std::any_of(tools.begin(), tools.end(), [](const QProcess* tool) {
-        return tool->state() != QProcess::NotRunning;
-    });
+    std::vector<pid_t> all;
+    QFile file(QStringLiteral("/proc/self/task/%1/children").arg(::getpid()));
+    if (file.open(QIODevice::ReadOnly)) {
+        const QList<QByteArray> numbers = file.readAll().simplified().split(' ');
+        for (const QByteArray& number : numbers) {
+            const pid_t child = number.toInt();
+            if (child > 0) {
+                all.push_back(child);
+            }
+        }
+    }
+    return all;
 }
 
 } // namespace
@@ -85,6 +95,7 @@ QString askService(const QString& what, int timeoutSeconds, const std::function<
 JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int timeoutSeconds)
     : m_authenticator(std::move(authenticator))
     , m_timeoutSeconds(timeoutSeconds)
+    , m_otherChildren(children())
 {
     if (!m_pipe.isOpen()) {
         qFatal("no pipe for the watch of a job");
@@ -103,11 +114,10 @@ JobWatch::~JobWatch()
     }
 }
 
-void JobWatch::setCutOff(const QString& what, const std::function<void()>& cleanUp)
+void JobWatch::setCutOff(const QString& what)
 {
     const std::lock_guard<std::mutex> lock(m_lock);
     m_what = what;
-    m_cleanUp = cleanUp;
 }
 
 bool JobWatch::wasInterrupted() const
@@ -122,14 +132,16 @@ QString JobWatch::whyStopped() const
                             : QStringLiteral("no progress within %1 s").arg(m_timeoutSeconds);
 }
 
-JobResult JobWatch::run(Job& job, const QString& doing)
+JobResult JobWatch::run(Job& job, const QString& doing, const std::function<void()>& cancel)
 {
     job.setDeleteOnFinish(false);
     Patience::noteAsked();
     m_authenticator->beginJob();
     m_timedOut = false;
+    JobResult result;
+    result.end = JobResult::Interrupted;
     if (wasInterrupted()) {
-        return {JobResult::Interrupted, 0, QString()};
+        return result;
     }
     m_authenticator->setAskingHandler([this, doing](bool asking) {
         setState(InJob, !asking);
@@ -137,12 +149,22 @@ JobResult JobWatch::run(Job& job, const QString& doing)
             Spinner::begin(doing);
         }
     });
-    JobResult result;
+    QEventLoop loop;
+    QObject::connect(&job, &Job::finished, &loop, [&](Job* finished) {
+        result = {JobResult::Finished, finished->error(), finished->errorString()};
+        m_authenticator->cancel(); // A question that is open has no job any more.
+        loop.quit();
+    });
     {
         const Waiting waiting(doing);
+        setLoop(&loop, cancel);
         setState(InJob, true);
-        result = resultOf(job);
+        job.start();
+        if (result.end != JobResult::Finished) {
+            loop.exec();
+        }
         setState(Idle, false);
+        setLoop(nullptr, {});
     }
     m_authenticator->setAskingHandler({});
     // What comes too late does not count: the caller cleans up behind it.
@@ -165,53 +187,11 @@ void JobWatch::call(const std::function<void()>& work)
     setState(Idle, false);
 }
 
-JobResult JobWatch::resultOf(Job& job)
+void JobWatch::setLoop(QEventLoop* loop, const std::function<void()>& cancel)
 {
-    JobResult result;
-    bool ended = false;
-    QEventLoop loop;
-    QObject::connect(&job, &Job::finished, &loop, [&](Job* finished) {
-        ended = true;
-        result = {JobResult::Finished, finished->error(), finished->errorString()};
-        loop.quit();
-    });
-    {
-        const std::lock_guard<std::mutex> lock(m_lock);
-        m_loop = &loop;
-    }
-    job.start();
-    // All of an SFTP conversation happens in there.
-    const bool isSilent = m_authenticator->protocol() == QLatin1String("sftp") &&
-                          !m_authenticator->wasAccepted() && !m_authenticator->wasUserChangedLast();
-    if (!ended && !isSilent) {
-        const QList<QProcess*> tools = job.findChildren<QProcess*>();
-        for (QProcess* tool : tools) {
-            const auto note = [&, tool](QProcess::ProcessError error) {
-                if (error != QProcess::FailedToStart) {
-                    return;
-                }
-                ended = true;
-                result = {JobResult::NotStarted, 0, tool->errorString()};
-                loop.quit();
-            };
-            QObject::connect(tool, &QProcess::errorOccurred, &loop, note);
-        }
-        if (!wasStopped()) {
-            loop.exec();
-        }
-        // Jobs that were stopped end with their tools, and those that were given up clean up then.
-        while (hasRunningTool(job)) {
-            loop.processEvents(QEventLoop::WaitForMoreEvents);
-        }
-    }
     const std::lock_guard<std::mutex> lock(m_lock);
-    m_loop = nullptr;
-    return result;
-}
-
-bool JobWatch::wasStopped() const
-{
-    return wasInterrupted() || m_timedOut;
+    m_loop = loop;
+    m_cancel = cancel;
 }
 
 void JobWatch::setState(State state, bool clockRuns)
@@ -306,9 +286,8 @@ bool JobWatch::stop()
     hadToStop = true;
     const Clock::time_point begin = runningTime();
     Clock::time_point signalled = begin;
-    Descendants tools;
     while (true) {
-        // Again and again, since a job may start another tool, or its loop, only now.
+        // Again and again, since a job may start another tool only now.
         const State now = state();
         // The next one may have begun already, and has its own time.
         if ((now == Idle || hasNextTurn()) && !m_interrupted) {
@@ -316,8 +295,7 @@ bool JobWatch::stop()
         }
         if (now == InJob) {
             m_authenticator->cancel();
-            quitLoop();
-            tools.end();
+            stopJob(runningTime() - begin);
         }
         const SignalPipe::Byte byte = nextByte(paceMilliseconds);
         if (byte == SignalPipe::End) {
@@ -336,11 +314,23 @@ bool JobWatch::stop()
     }
 }
 
-void JobWatch::quitLoop()
+void JobWatch::stopJob(Clock::duration elapsed)
 {
     const std::lock_guard<std::mutex> lock(m_lock);
-    if (m_loop) {
-        QMetaObject::invokeMethod(m_loop, &QEventLoop::quit, Qt::QueuedConnection);
+    if (!m_loop) {
+        return;
+    }
+    if (m_cancel) {
+        QMetaObject::invokeMethod(m_loop, m_cancel, Qt::QueuedConnection);
+        return;
+    }
+    QMetaObject::invokeMethod(m_loop, &QEventLoop::quit, Qt::QueuedConnection);
+    const std::vector<pid_t> all = children();
+    for (const pid_t child : all) {
+        if (std::find(m_otherChildren.begin(), m_otherChildren.end(), child) ==
+            m_otherChildren.end()) {
+            ::kill(child, elapsed < graceOfTools ? SIGTERM : SIGKILL);
+        }
     }
 }
 
@@ -348,16 +338,11 @@ void JobWatch::cutOff()
 {
     Spinner::end();
     QString what;
-    std::function<void()> cleanUp;
     {
         const std::lock_guard<std::mutex> lock(m_lock);
         what = m_what;
-        cleanUp = m_cleanUp;
     }
     Prompt::restoreTerminal();
-    if (cleanUp) {
-        cleanUp();
-    }
     const bool isServiceSilent = state() == InCall && !wasInterrupted();
     report(
         what, isServiceSilent

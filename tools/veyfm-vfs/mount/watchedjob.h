@@ -14,6 +14,9 @@
 #include <functional>
 #include <mutex>
 #include <thread>
+#include <vector>
+
+#include <sys/types.h>
 
 class QEventLoop;
 
@@ -30,13 +33,11 @@ struct JobResult
 {
     enum End {
         Finished,    ///< By itself, with the code and text below.
-        Silent,      ///< Without a word: it will not finish any more.
-        NotStarted,  ///< Its tool could not be started; the text says why.
         TimedOut,    ///< It got no further in the time that it had.
         Interrupted, ///< By a signal.
     };
 
-    End end = Silent;
+    End end = Finished;
     int code = 0; ///< Job::error().
     QString text; ///< Job::errorString().
 
@@ -57,18 +58,17 @@ int jobTimeout(const Invocation& invocation);
 void boundParting();
 
 /**
- * Runs the jobs of a verb, one after the other, and sees to it that each comes to an end: jobs
- * may by their contract stay unfinished for ever, and some block their thread.
+ * Runs the jobs of a verb in the event loop, one after the other, and what asks the service and
+ * blocks, and sees to it that each comes to an end.
  *
  * A job gets so many seconds in which neither it ends nor somebody is asked; those that the
- * program is stopped (Ctrl-Z) don't count. When they are over, or on SIGINT, SIGTERM or SIGHUP, a
- * thread of this object has the authenticator cancel every question, and ends the tools that the
- * job has started and starts, until it comes back. One that does not is cut off after five seconds:
- * the cleaning is done, the reason is reported, and the program exits. As long as the object lives
- * signals end only jobs, so a verb can clean up behind them. Another signal, half a second behind
- * the first or later, cuts off what is left of that. When the object has ended behind a signal,
- * others have no effect: see boundParting(). Signals that are ignored when the object is made stay
- * ignored.
+ * program is stopped (Ctrl-Z) don't count. When they are over, or on SIGINT, SIGTERM or SIGHUP, the
+ * authenticator cancels every question, and the job is stopped. What can't be stopped, since it
+ * waits for the service, is cut off: the reason is reported, and the program exits. As long as the
+ * object lives signals end only jobs, so a verb can clean up behind them. Another signal, half a
+ * second behind the first or later, cuts off what is left of that. When the object has ended behind
+ * a signal, others have no effect: see boundParting(). Signals that are ignored when the object is
+ * made stay ignored.
  *
  * The signals are not blocked, and programs that are started meanwhile don't have them blocked.
  * One object at a time, and none beside an Interrupt.
@@ -79,12 +79,16 @@ public:
     JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int timeoutSeconds);
     ~JobWatch();
 
-    /// What a cut off is reported of, and what is done before it, in another thread.
-    void setCutOff(const QString& what, const std::function<void()>& cleanUp = {});
+    /// What a cut off is reported of.
+    void setCutOff(const QString& what);
 
-    /// Runs a job to its end, showing on the terminal what takes its time. The caller owns it:
-    /// it must not delete itself.
-    JobResult run(Job& job, const QString& doing);
+    /**
+     * Runs a job to its end, showing on the terminal what takes its time. The caller owns it: it
+     * must not delete itself. To stop it @p cancel is called in its thread, again and again until
+     * it finishes. A job without that is left where it stands, and the programs that this thread
+     * has started for it are ended, since it may wait for one of them.
+     */
+    JobResult run(Job& job, const QString& doing, const std::function<void()>& cancel = {});
 
     /// Does what may block on the service, unless a signal came before. It has the time of a job,
     /// and is cut off behind that, or half a second after a signal.
@@ -103,8 +107,7 @@ private:
 
     enum State { Idle, InJob, InCall };
 
-    JobResult resultOf(Job& job);
-    bool wasStopped() const;
+    void setLoop(QEventLoop* loop, const std::function<void()>& cancel);
     void setState(State state, bool clockRuns);
     State state();
     bool hasNextTurn();
@@ -113,11 +116,12 @@ private:
     SignalPipe::Byte nextByte(int milliseconds);
     void watch();
     bool stop();
-    void quitLoop();
+    void stopJob(Clock::duration elapsed);
     [[noreturn]] void cutOff();
 
     const QSharedPointer<TerminalAuthenticator> m_authenticator;
     const int m_timeoutSeconds;
+    const std::vector<pid_t> m_otherChildren; ///< That no job has started.
     SignalPipe m_pipe;
     std::atomic<bool> m_interrupted{false}; ///< Whether the thread has seen the signal.
     std::atomic<bool> m_timedOut{false};
@@ -129,8 +133,8 @@ private:
     bool m_clockRuns = false;
     bool m_isNew = false; ///< Its time begins when the thread takes note.
     QEventLoop* m_loop = nullptr;
+    std::function<void()> m_cancel;
     QString m_what;
-    std::function<void()> m_cleanUp;
 
     // Of the thread alone.
     Clock::duration m_lost{0}; ///< The time that the program was stopped.
