@@ -38,6 +38,7 @@ private:
             "mount sftp://",
             "mount --no-input smb://host/share",
             "mounts",
+            "unmount /nowhere",
             "update Network/x",
             "status",
             "monitor /nowhere",
