@@ -100,7 +100,7 @@ void ToolMountLoginTest::passwordOfDescriptor()
     MountScene scene("sshfs");
     scene.tool.expect(Said::sshPassword() + Said::success());
     const ToolResult result = scene.runShell(line.constData(), text);
-    QCOMPARE(result.exitCode, 0);
+    QVERIFY2(result.exitCode == 0, result.err.constData());
     QCOMPARE(result.out, scene.line(QStringLiteral("sftp/me@host")));
     QCOMPARE(scene.tool.input(1), typed);
 }

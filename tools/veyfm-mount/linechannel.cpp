@@ -63,7 +63,10 @@ bool LineChannel::isTooLong() const
 
 void LineChannel::send(const char* bytes, size_t size)
 {
-    m_unsent.emplace_back(bytes, bytes + size);
+    // An empty password has no bytes, nor a place for them.
+    if (size > 0) {
+        m_unsent.emplace_back(bytes, bytes + size);
+    }
 }
 
 bool LineChannel::hasUnsent() const
