@@ -52,6 +52,17 @@ std::vector<pid_t> children()
     return all;
 }
 
+/// A question takes them in the order in which one thread gets them; see Prompt.
+void leaveSignalsToQuestions()
+{
+    sigset_t set;
+    ::sigemptyset(&set);
+    for (const int number : {SIGTSTP, SIGQUIT, SIGCONT}) {
+        ::sigaddset(&set, number);
+    }
+    ::pthread_sigmask(SIG_BLOCK, &set, nullptr);
+}
+
 } // namespace
 
 Option jobTimeoutOption()
@@ -100,7 +111,10 @@ JobWatch::JobWatch(QSharedPointer<TerminalAuthenticator> authenticator, int time
     if (!m_pipe.isOpen()) {
         qFatal("no pipe for the watch of a job");
     }
-    m_thread = std::thread([this] { watch(); });
+    m_thread = std::thread([this] {
+        leaveSignalsToQuestions();
+        watch();
+    });
     m_pipe.catchSignals({SIGINT, SIGTERM, SIGHUP}, SA_RESTART);
 }
 
