@@ -175,10 +175,8 @@ void ExampleMountTest::staysAlive()
     example->type("\n");
     QVERIFY(example->waitFor("Password: "));
     example->type("not-in-arguments\n");
-    for (const char* text : {"Waiting for 1 s", "Waiting for 2 s"}) {
-        const int before = example->output().count(text);
-        QVERIFY2(example->waitFor(text, before + 1), example->output().constData());
-    }
+    const int before = example->output().count("Waiting for ");
+    QVERIFY2(example->waitFor("Waiting for ", before + 2), example->output().constData());
     QCOMPARE(tool->input(1), QByteArray("not-in-arguments\n"));
     QVERIFY(!isAnywhereInArguments("not-in-arguments"));
     QVERIFY(isAnywhereInArguments("sftp://anna@host/"));

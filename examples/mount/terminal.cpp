@@ -45,7 +45,7 @@ Terminal::Terminal()
     connect(&m_input, &QSocketNotifier::activated, this, &Terminal::readLine);
     connect(&m_signalNotifier, &QSocketNotifier::activated, this, &Terminal::takeSignal);
     connect(&m_second, &QTimer::timeout, this, [this] {
-        show(QStringLiteral("\rWaiting for %1 s").arg(m_waited.elapsed() / 1000));
+        show(QStringLiteral("\rWaiting for %1 s").arg(qRound(m_waited.elapsed() / 1000.0)));
     });
     wait();
 }
