@@ -18,8 +18,8 @@ namespace VeyFM {
  * the service record it, and waits until the service has told everybody.
  *
  * Its URL is to be that of a root, as MountPaths::mountRootUrl() gives it: a server has one place
- * in the tree, which stands for whatever was mounted first, and the folder that a host wants to show
- * is below it. With the URL of a folder the next folder of the server would show the first.
+ * in the tree, which stands for whatever was mounted first, and the folder that a host wants to
+ * show is below it. With the URL of a folder the next folder of the server would show the first.
  *
  * There is no bound on that wait: a service that never announces the mount leaves the job
  * running, and so does a user who gives up an SFTP login at its first question.
