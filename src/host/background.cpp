@@ -40,5 +40,16 @@ Background::~Background()
     m_address->receiver = nullptr;
 }
 
+void Background::slotResult()
+{
+    std::function<void()> result;
+    {
+        const std::lock_guard<std::mutex> lock(m_address->lock);
+        result = std::move(m_address->results.front());
+        m_address->results.pop_front();
+    }
+    result();
+}
+
 } // namespace Host
 } // namespace VeyFM

@@ -6,6 +6,7 @@
 
 #include <QObject>
 
+#include <deque>
 #include <functional>
 #include <memory>
 #include <mutex>
@@ -40,19 +41,22 @@ public:
             auto result = work();
             const std::lock_guard<std::mutex> lock(address->lock);
             if (address->receiver) {
-                QMetaObject::invokeMethod(
-                    address->receiver,
-                    [done, result = std::move(result)] { done(std::move(result)); },
-                    Qt::QueuedConnection);
+                address->results.push_back(
+                    [done, result = std::move(result)] { done(std::move(result)); });
+                QMetaObject::invokeMethod(address->receiver, "slotResult", Qt::QueuedConnection);
             }
         });
     }
+
+private Q_SLOTS:
+    void slotResult();
 
 private:
     struct Address
     {
         std::mutex lock;
         Background* receiver = nullptr;
+        std::deque<std::function<void()>> results;
     };
 
     const std::shared_ptr<Address> m_address;
